@@ -1,0 +1,81 @@
+#pragma once
+// The spreadsheet application the Excel parser drives: the Application / Workbooks / Workbook /
+// Worksheets / Worksheet / Range members it calls, in-process. Failures surface as
+// AutomationError, the way automation errors reach a caller, so the parser's catching works alike.
+#include <memory>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+namespace sheet {
+
+class AutomationError : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
+
+// A cell value or a block of them, as Value2 and Text give it.
+struct Variant {
+    enum Type { Empty, Number, Text, Boolean, Error, Array };
+    Type type = Empty;
+    double number = 0.0;   // Number; also Boolean (0/1)
+    std::string text;      // Text; the error text ("#N/A", ...) for Error
+    // Array: rows x columns, row-major, indexed from 1 by At().
+    int rows = 0;
+    int columns = 0;
+    std::vector<Variant> cells;
+
+    const Variant& At(int row, int column) const { return cells[static_cast<size_t>((row - 1) * columns + (column - 1))]; }
+    bool IsEmpty() const { return type == Empty; }
+};
+
+class CellRange {
+public:
+    virtual ~CellRange() = default;
+    virtual Variant Text() const = 0;   // the displayed text of the first cell
+    virtual Variant Value2() const = 0; // raw values; an Array for more than one cell
+    virtual int Count() const = 0;      // number of cells
+    virtual int Column() const = 0;     // first column, from 1
+};
+
+class Worksheet {
+public:
+    virtual ~Worksheet() = default;
+    // The range of one cell ("B3") or of the block between two cells.
+    virtual std::shared_ptr<CellRange> Range(const std::string& cell, const std::string& otherCell = std::string()) = 0;
+    virtual std::shared_ptr<CellRange> UsedRange() = 0;
+};
+
+class Worksheets {
+public:
+    virtual ~Worksheets() = default;
+    virtual int Count() = 0;
+    virtual std::shared_ptr<Worksheet> Item(int number) = 0; // from 1
+};
+
+class Workbook {
+public:
+    virtual ~Workbook() = default;
+    virtual void Close(bool saveChanges) = 0;
+    virtual std::shared_ptr<sheet::Worksheets> Worksheets() = 0;
+};
+
+class Workbooks {
+public:
+    virtual ~Workbooks() = default;
+    virtual std::shared_ptr<Workbook> Open(const std::string& path) = 0;
+};
+
+class Application {
+public:
+    virtual ~Application() = default;
+    virtual void Visible(bool visible) = 0;
+    virtual std::shared_ptr<sheet::Workbooks> Workbooks() = 0;
+    virtual std::string Version() = 0; // such as "16.0"
+    virtual void Quit() = 0;
+};
+
+// Starts the application; null when it is absent (see VELMORA_SPREADSHEET in docs/spreadsheet.md).
+std::shared_ptr<Application> CreateApplication();
+
+} // namespace sheet

@@ -1,0 +1,48 @@
+#pragma once
+// The system services the plug-in asks for: temporary folder, file attributes, folder listing,
+// file titles, deletion and the locale's decimal separator.
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace sys {
+
+// Writes the temporary-files folder, ending in "/", into `folder` when it fits `bufferLength`
+// characters (the terminating zero included) and returns its length; returns the needed length
+// without filling `folder` when it does not fit, and 0 on failure. $TMPDIR, else /tmp.
+unsigned GetTempPath(unsigned bufferLength, std::string& folder);
+
+struct FileAttributes {
+    bool directory = false;
+    bool hidden = false;    // the name starts with a dot
+    bool temporary = false; // never set on Linux; kept so callers read like the Windows rules
+    bool readable = false;  // the current user may read it
+};
+// The attributes of `path`, or nothing when it cannot be examined.
+std::optional<FileAttributes> GetAttributes(const std::string& path);
+
+bool FileExists(const std::string& path);      // exists, of any kind
+bool IsRegularFile(const std::string& path);
+bool IsDirectory(const std::string& path);
+std::optional<std::int64_t> FileSize(const std::string& path);
+bool DeleteFile(const std::string& path);
+
+// The entries of a folder (names only, without "." and ".."), in the order the system gives them;
+// nothing when the folder cannot be read.
+std::optional<std::vector<std::string>> ListFolder(const std::string& folder);
+
+// The display title of a file: its name without the folder.
+std::string FileTitle(const std::string& path);
+// The folder part of a path, without the trailing "/"; empty for a bare name.
+std::string FolderOf(const std::string& path);
+// `folder` joined with `name`, with exactly one "/" between.
+std::string JoinPath(const std::string& folder, const std::string& name);
+
+// The decimal separator of the process locale (LC_NUMERIC), or empty when it cannot be asked.
+std::string LocaleDecimalSeparator();
+
+// The folder of the running executable or of the shared object containing `address`.
+std::string ModuleFolder(const void* address);
+
+} // namespace sys

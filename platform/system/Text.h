@@ -1,0 +1,25 @@
+#pragma once
+// Small text helpers shared by every layer. Strings are UTF-8 in std::string; "without regard to
+// case" means ASCII case folding.
+#include <string>
+#include <string_view>
+
+namespace text {
+
+char ToLowerAscii(char c);
+std::string ToLower(std::string_view s);
+bool EqualsNoCase(std::string_view a, std::string_view b);
+bool StartsWithNoCase(std::string_view s, std::string_view prefix);
+
+// printf-style formatting into a std::string.
+std::string Format(const char* format, ...) __attribute__((format(printf, 1, 2)));
+
+// Reads a leading decimal integer the way "%d" scanning does: optional blanks, a sign, digits.
+// Returns false when no digit follows; anything after the digits is ignored.
+bool ScanInt(std::string_view s, int& value);
+// atoi: the leading integer, 0 when there is none.
+int AtoI(std::string_view s);
+
+std::string Trim(std::string_view s);
+
+} // namespace text

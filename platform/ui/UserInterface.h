@@ -1,0 +1,118 @@
+#pragma once
+// The one way the plug-in talks to a person: message boxes, the preview dialog and file choosers.
+// Parsers, pages and the setup record call these functions; which implementation answers is chosen
+// at the edge (Qt in the wizard, console in the host program, scripted in tests, silent in the bridge).
+#include <deque>
+#include <string>
+#include <vector>
+
+namespace ui {
+
+// Message box styles and answers, with the values the toolbox uses.
+enum : unsigned {
+    MB_OK = 0x0,
+    MB_OKCANCEL = 0x1,
+    MB_YESNOCANCEL = 0x3,
+    MB_YESNO = 0x4,
+    MB_ICONSTOP = 0x10,
+    MB_ICONQUESTION = 0x20,
+    MB_ICONEXCLAMATION = 0x30,
+    MB_ICONINFORMATION = 0x40,
+};
+enum : int { IDOK = 1, IDCANCEL = 2, IDYES = 6, IDNO = 7 };
+
+using Row = std::vector<std::string>;
+using Rows = std::vector<Row>;
+
+// What the file preview dialog shows.
+struct PreviewContent {
+    std::string title;       // window title; empty keeps the dialog's own
+    Rows inputLines;         // "Input file" list; empty hides it
+    std::vector<std::string> headers; // column titles of "Import result"
+    Rows resultRows;         // "Import result" rows
+};
+
+struct FileDialogRequest {
+    bool open = true;                 // open dialog, else save dialog
+    std::string defaultExtension;     // without the dot
+    std::string initialName;
+    std::string filter;               // "Name (*.x)|*.x|...||"
+    unsigned flags = 0;
+};
+
+class UserInterface {
+public:
+    virtual ~UserInterface() = default;
+    // Shows a modal message box and returns the button pressed (IDOK, IDYES, ...).
+    virtual int MessageBox(const std::string& text, const std::string& caption, unsigned type) = 0;
+    // Shows the preview dialog modally; returns when it is closed.
+    virtual void ShowPreview(const PreviewContent& content) = 0;
+    // File and folder choosers: true with `path` set when the user chose one.
+    virtual bool ChooseFile(const FileDialogRequest& request, std::string& path) = 0;
+    virtual bool ChooseFolder(const std::string& prompt, std::string& path) = 0;
+};
+
+// The implementation in force on the calling thread: the one installed for this thread by a
+// ScopedUserInterface, else the process-wide one, else the console.
+UserInterface& Current();
+// Replaces the process-wide implementation (null restores the console); not owned.
+void SetProcessUserInterface(UserInterface* ui);
+
+// Installs an implementation for the calling thread for the lifetime of this object.
+class ScopedUserInterface {
+public:
+    explicit ScopedUserInterface(UserInterface& ui);
+    ~ScopedUserInterface();
+    ScopedUserInterface(const ScopedUserInterface&) = delete;
+    ScopedUserInterface& operator=(const ScopedUserInterface&) = delete;
+
+private:
+    UserInterface* m_previous;
+};
+
+// Shorthands through Current().
+int MessageBox(const std::string& text, const std::string& caption, unsigned type);
+// An OK box with the warning icon showing string-table text `stringId`, as parsers and pages show them.
+int ShowStringMessage(int stringId);
+
+// Prints boxes to stderr and answers the default button; used by the host program without a display.
+class ConsoleUserInterface : public UserInterface {
+public:
+    int MessageBox(const std::string& text, const std::string& caption, unsigned type) override;
+    void ShowPreview(const PreviewContent& content) override;
+    bool ChooseFile(const FileDialogRequest& request, std::string& path) override;
+    bool ChooseFolder(const std::string& prompt, std::string& path) override;
+};
+
+// Shows nothing and answers the default button: for readers that must run silently.
+class SilentUserInterface : public UserInterface {
+public:
+    int MessageBox(const std::string&, const std::string&, unsigned type) override;
+    void ShowPreview(const PreviewContent&) override {}
+    bool ChooseFile(const FileDialogRequest&, std::string&) override { return false; }
+    bool ChooseFolder(const std::string&, std::string&) override { return false; }
+};
+
+// Records everything shown and answers from queues: for tests and for `--json` reports.
+class ScriptedUserInterface : public UserInterface {
+public:
+    struct Box {
+        std::string text;
+        std::string caption;
+        unsigned type = 0;
+    };
+    std::vector<Box> boxes;
+    std::vector<PreviewContent> previews;
+    std::deque<int> answers;            // next message-box answers; default button when empty
+    std::deque<std::string> chosenPaths; // next file/folder choices; cancelled when empty
+
+    int MessageBox(const std::string& text, const std::string& caption, unsigned type) override;
+    void ShowPreview(const PreviewContent& content) override;
+    bool ChooseFile(const FileDialogRequest& request, std::string& path) override;
+    bool ChooseFolder(const std::string& prompt, std::string& path) override;
+};
+
+// The button a box answers with when nobody presses one: OK, or Yes for a yes/no box.
+int DefaultAnswer(unsigned type);
+
+} // namespace ui

@@ -1,0 +1,21 @@
+#!/usr/bin/env bash
+# Runs every fuzz target of build-fuzz for the given number of seconds each, from its seed corpus.
+set -euo pipefail
+cd "$(dirname "$0")/.."
+seconds="${1:-20}"
+status=0
+for target in build-fuzz/bin/*_fuzz build-fuzz/fuzz/*_fuzz; do
+  [ -x "$target" ] || continue
+  name=$(basename "$target")
+  corpus="fuzz/corpus/${name%_fuzz}"
+  work=$(mktemp -d)
+  [ -d "$corpus" ] && cp -r "$corpus"/. "$work"/ 2>/dev/null || true
+  echo "fuzz: $name for ${seconds}s"
+  if ! "$target" -max_total_time="$seconds" -max_len=65536 -rss_limit_mb=2048 -timeout=10 "$work" >"$work.log" 2>&1; then
+    echo "fuzz: $name FAILED"; tail -n 40 "$work.log"; status=1
+  else
+    tail -n 1 "$work.log"
+  fi
+  rm -rf "$work" "$work.log"
+done
+exit $status
