@@ -93,8 +93,8 @@ int wpxGetInt(WPXHANDLE param);
 CString wpxGetText(WPXHANDLE param);
 
 // The value of parameter `paramNum` of keyword number `keyNum` named `key` in `section`. Result 1
-// when found with the right kind; otherwise 0 and `*value` is left unchanged. wpxGetParam with a
-// CString accepts a text or a file name; wpxGetParamFilename only a file name.
+// when found with the right kind; otherwise 0 and `*value` is left unchanged. The CString forms
+// accept a text and a file name alike (a text is never resolved against the document's folder).
 int wpxGetParam(WPXHANDLE section, const CString& key, int* value, int keyNum, int paramNum);
 int wpxGetParam(WPXHANDLE section, const CString& key, CString* value, int keyNum, int paramNum);
 int wpxGetParamFilename(WPXHANDLE section, const CString& key, CString* value, int keyNum, int paramNum);

@@ -1,0 +1,131 @@
+#include "platform/harbor/HarborEngine.h"
+#include "platform/system/FileSystem.h"
+#include "platform/system/Text.h"
+
+#include <cerrno>
+#include <cstdlib>
+#include <signal.h>
+#include <spawn.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+extern char** environ;
+
+namespace {
+
+// Results of RunEngine when the program never ran, in the shell's tradition.
+constexpr int kProgramNotFound = 127;
+constexpr int kCannotStart = 126;
+constexpr size_t kMaxPathBytes = 4096;
+
+bool IsExecutableFile(const CString& path)
+{
+    struct stat st {};
+    return !path.empty() && ::stat(path.c_str(), &st) == 0 && S_ISREG(st.st_mode) && ::access(path.c_str(), X_OK) == 0;
+}
+
+// Tools name their program as on the toolbox's home system; here the executable has no ".exe".
+CString ExecutableName(const CString& program)
+{
+    if (program.size() > 4 && text::EqualsNoCase(program.substr(program.size() - 4), ".exe"))
+        return program.substr(0, program.size() - 4);
+    return program;
+}
+
+CString SearchPath(const CString& name)
+{
+    const char* path = std::getenv("PATH");
+    if (!path)
+        return CString();
+    CString folders = path;
+    size_t start = 0;
+    while (start <= folders.size()) {
+        size_t end = folders.find(':', start);
+        if (end == CString::npos)
+            end = folders.size();
+        CString folder = folders.substr(start, end - start);
+        CString candidate = sys::JoinPath(folder.empty() ? "." : folder, name);
+        if (IsExecutableFile(candidate))
+            return candidate;
+        start = end + 1;
+    }
+    return CString();
+}
+
+int WaitFor(pid_t child)
+{
+    int status = 0;
+    while (::waitpid(child, &status, 0) < 0) {
+        if (errno != EINTR)
+            return kCannotStart;
+    }
+    if (WIFEXITED(status))
+        return WEXITSTATUS(status);
+    if (WIFSIGNALED(status))
+        return 128 + WTERMSIG(status);
+    return kCannotStart;
+}
+
+} // namespace
+
+void CHarborEngine::SetDataDepDefaultValues() {}
+
+void CHarborEngine::GetOverviewText(CString& text) { text += "Name: " + m_strSetupName + "\r\n"; }
+
+void CHarborEngine::SetInputFileConstraints(COkaFileSelectorDlg*) {}
+
+int CHarborEngine::RunTool(int)
+{
+    CString message;
+    return _Verify(message);
+}
+
+int CHarborEngine::_Verify(CString& message)
+{
+    if (m_strLogFileDir.empty() || sys::IsDirectory(m_strLogFileDir) || IsValidFileName(m_strLogFileDir))
+        return 0;
+    message = "The log location \"" + m_strLogFileDir + "\" is neither a folder nor a file in an existing folder.";
+    return 1;
+}
+
+CString CHarborEngine::FindEngineProgram(const CString& program)
+{
+    if (const char* chosen = std::getenv("VELMORA_ENGINE"); chosen && *chosen)
+        return chosen;
+    CString name = ExecutableName(program);
+    if (name.empty())
+        return CString();
+    if (name.find('/') != CString::npos)
+        return IsExecutableFile(name) ? name : CString();
+    // Beside the module that holds this code: the plug-in, or a program linking it statically.
+    CString beside = sys::JoinPath(sys::ModuleFolder(reinterpret_cast<const void*>(&CHarborEngine::FindEngineProgram)),
+                                   name);
+    if (IsExecutableFile(beside))
+        return beside;
+    return SearchPath(name);
+}
+
+int CHarborEngine::RunEngine(CString program, CString setupFile, int flag)
+{
+    CString path = FindEngineProgram(program);
+    if (path.empty())
+        return kProgramNotFound;
+    CString flagText = std::to_string(flag);
+    char* argv[] = {path.data(), setupFile.data(), flagText.data(), nullptr};
+    pid_t child = 0;
+    if (::posix_spawn(&child, path.c_str(), nullptr, nullptr, argv, environ) != 0)
+        return kCannotStart;
+    return WaitFor(child);
+}
+
+int CHarborEngine::IsValidFileName(CString name)
+{
+    if (name.empty() || name.size() > kMaxPathBytes || name.find('\0') != CString::npos)
+        return 0;
+    CString last = sys::FileTitle(name);
+    if (last.empty() || last == "." || last == "..")
+        return 0;
+    CString folder = sys::FolderOf(name);
+    return sys::IsDirectory(folder.empty() ? CString(".") : folder) ? 1 : 0;
+}
