@@ -79,6 +79,8 @@ public:
     static int IsValidDateTimeFormat(const CString& format, CString& message);
     static int FormatSelItems(const CUIntArray& items, CString& text);
     static void ParseSelItems(const CString& text, CUIntArray& items);
+    // The number of non-empty pieces of `format` between occurrences of `separator`.
+    static int CountFormatTokens(const CString& format, const CString& separator);
 
     int m_bLoaded = 0;
     int m_bIgnoreConsecutiveDelimiters = 0;
@@ -93,5 +95,9 @@ public:
     CString m_strTemplateFile;
 
 protected:
+    // Copies stay within a kind: the loaders stage values in a copy and commit them on success.
+    CSpecification(const CSpecification&) = default;
+    CSpecification& operator=(const CSpecification&) = default;
+
     mutable CString m_strLastError;
 };

@@ -1,0 +1,427 @@
+#include "templates/TemplateXml.h"
+
+#include "platform/system/Text.h"
+
+#include <cerrno>
+#include <climits>
+#include <cstdio>
+#include <cstring>
+#include <memory>
+#include <sstream>
+
+namespace tmplfile {
+namespace {
+
+struct FileCloser {
+    void operator()(std::FILE* file) const { std::fclose(file); }
+};
+using File = std::unique_ptr<std::FILE, FileCloser>;
+
+void AppendUtf8(std::string& out, char32_t c)
+{
+    if (c < 0x80) {
+        out += static_cast<char>(c);
+    } else if (c < 0x800) {
+        out += static_cast<char>(0xC0 | (c >> 6));
+        out += static_cast<char>(0x80 | (c & 0x3F));
+    } else if (c < 0x10000) {
+        out += static_cast<char>(0xE0 | (c >> 12));
+        out += static_cast<char>(0x80 | ((c >> 6) & 0x3F));
+        out += static_cast<char>(0x80 | (c & 0x3F));
+    } else {
+        out += static_cast<char>(0xF0 | (c >> 18));
+        out += static_cast<char>(0x80 | ((c >> 12) & 0x3F));
+        out += static_cast<char>(0x80 | ((c >> 6) & 0x3F));
+        out += static_cast<char>(0x80 | (c & 0x3F));
+    }
+}
+
+bool DecodeUtf16(std::string_view bytes, bool bigEndian, std::string& utf8, CString& error)
+{
+    if (bytes.size() % 2 != 0) {
+        error = "the UTF-16 text has an odd number of bytes";
+        return false;
+    }
+    auto unit = [&](size_t i) -> char32_t {
+        auto hi = static_cast<unsigned char>(bytes[bigEndian ? i : i + 1]);
+        auto lo = static_cast<unsigned char>(bytes[bigEndian ? i + 1 : i]);
+        return static_cast<char32_t>((hi << 8) | lo);
+    };
+    utf8.clear();
+    utf8.reserve(bytes.size());
+    for (size_t i = 0; i < bytes.size(); i += 2) {
+        char32_t c = unit(i);
+        if (c >= 0xD800 && c <= 0xDBFF && i + 2 < bytes.size()) {
+            char32_t low = unit(i + 2);
+            if (low >= 0xDC00 && low <= 0xDFFF) {
+                AppendUtf8(utf8, 0x10000 + ((c - 0xD800) << 10) + (low - 0xDC00));
+                i += 2;
+                continue;
+            }
+        }
+        if (c >= 0xD800 && c <= 0xDFFF) {
+            error = text::Format("the UTF-16 text has an unpaired surrogate at byte %zu", i);
+            return false;
+        }
+        AppendUtf8(utf8, c);
+    }
+    return true;
+}
+
+bool StartsWith(std::string_view bytes, std::string_view prefix)
+{
+    return bytes.size() >= prefix.size() && bytes.substr(0, prefix.size()) == prefix;
+}
+
+// Where a byte offset lies, as "line L, column C" counted from 1.
+CString Position(std::string_view text, size_t offset)
+{
+    offset = std::min(offset, text.size());
+    size_t line = 1, lineStart = 0;
+    for (size_t i = 0; i < offset; ++i) {
+        if (text[i] == '\n') {
+            ++line;
+            lineStart = i + 1;
+        }
+    }
+    return text::Format("line %zu, column %zu", line, offset - lineStart + 1);
+}
+
+// The deepest element nesting, walking without recursion; stops counting past `limit`.
+int ElementDepth(const pugi::xml_node& top, int limit)
+{
+    int depth = 0, deepest = 0;
+    pugi::xml_node node = top.first_child();
+    while (node) {
+        if (node.type() == pugi::node_element) {
+            deepest = std::max(deepest, depth + 1);
+            if (deepest > limit)
+                return deepest;
+        }
+        if (node.first_child()) {
+            node = node.first_child();
+            ++depth;
+            continue;
+        }
+        while (node && !node.next_sibling() && node != top) {
+            node = node.parent();
+            --depth;
+        }
+        if (!node || node == top)
+            break;
+        node = node.next_sibling();
+    }
+    return deepest;
+}
+
+bool ParseWholeNumber(std::string_view textValue, int& value)
+{
+    CString trimmed = text::Trim(textValue);
+    size_t i = 0;
+    bool negative = false;
+    if (i < trimmed.size() && (trimmed[i] == '+' || trimmed[i] == '-'))
+        negative = trimmed[i++] == '-';
+    if (i == trimmed.size())
+        return false;
+    long long magnitude = 0;
+    for (; i < trimmed.size(); ++i) {
+        if (trimmed[i] < '0' || trimmed[i] > '9')
+            return false;
+        magnitude = magnitude * 10 + (trimmed[i] - '0');
+        if (magnitude > static_cast<long long>(INT_MAX) + 1)
+            return false;
+    }
+    long long signedValue = negative ? -magnitude : magnitude;
+    if (signedValue > INT_MAX || signedValue < INT_MIN)
+        return false;
+    value = static_cast<int>(signedValue);
+    return true;
+}
+
+bool IsTrue(std::string_view value, bool ignoreCase)
+{
+    return ignoreCase ? text::EqualsNoCase(value, "true") : value == "true";
+}
+
+bool ReadAttribute(const pugi::xml_attribute& attribute, const AttributeRule& rule, bool flagIgnoresCase,
+                   const CString& name, CSpecification& spec, CString& error)
+{
+    std::string_view value = attribute.value();
+    if (value.size() > kMaxValueBytes) {
+        error = text::Format("%s: the attribute %s is longer than %zu bytes", name.c_str(), rule.name, kMaxValueBytes);
+        return false;
+    }
+    switch (rule.form) {
+    case ValueForm::Number:
+    case ValueForm::NumberLine:
+        if (!ParseWholeNumber(value, *rule.number(spec))) {
+            error = text::Format("%s: the attribute %s must be a whole number from %d to %d, not \"%.40s\"",
+                                 name.c_str(), rule.name, INT_MIN, INT_MAX, attribute.value());
+            return false;
+        }
+        return true;
+    case ValueForm::Flag:
+    case ValueForm::FlagWhenOne:
+        *rule.number(spec) = IsTrue(value, flagIgnoresCase) ? 1 : 0;
+        return true;
+    case ValueForm::Text:
+        rule.text(spec)->assign(value);
+        return true;
+    case ValueForm::SelItems:
+        CSpecification::ParseSelItems(CString(value), spec.m_arrSelItems);
+        return true;
+    }
+    return true;
+}
+
+// The text of a node and everything below it, as a DOM's text property gives it.
+CString NodeText(const pugi::xml_node& node)
+{
+    if (node.type() == pugi::node_pcdata || node.type() == pugi::node_cdata)
+        return node.value();
+    CString result;
+    pugi::xml_node current = node.first_child();
+    while (current) {
+        if (current.type() == pugi::node_pcdata || current.type() == pugi::node_cdata)
+            result += current.value();
+        if (current.first_child()) {
+            current = current.first_child();
+            continue;
+        }
+        while (current && !current.next_sibling() && current != node)
+            current = current.parent();
+        if (!current || current == node)
+            break;
+        current = current.next_sibling();
+    }
+    return result;
+}
+
+std::vector<pugi::xml_node> Children(const pugi::xml_node& list)
+{
+    std::vector<pugi::xml_node> children;
+    for (pugi::xml_node child : list.children())
+        children.push_back(child);
+    return children;
+}
+
+bool ReadItemDefinitions(const pugi::xml_document& document, const FileLayout& layout, const CString& name,
+                         std::vector<CItemDefinition>& items, CString& error)
+{
+    static const char* const kLists[] = {"ItemTitles", "ItemTypes", "ItemUnits", "ValueTypes"};
+    std::vector<pugi::xml_node> lists[4];
+    size_t count = 0;
+    for (int i = 0; i < 4; ++i) {
+        CString query = CString("//") + layout.extension + "//" + kLists[i];
+        pugi::xml_node list = document.select_node(query.c_str()).node();
+        lists[i] = Children(list);
+        count = std::max(count, lists[i].size());
+    }
+    if (count > kMaxItemDefinitions) {
+        error = text::Format("%s: more than %zu item definitions", name.c_str(), kMaxItemDefinitions);
+        return false;
+    }
+    items.clear();
+    items.reserve(count);
+    for (size_t index = 0; index < count; ++index) {
+        CString fields[4];
+        for (int i = 0; i < 4; ++i) {
+            if (index < lists[i].size() && lists[i][index].type() == pugi::node_element)
+                fields[i] = NodeText(lists[i][index]);
+            if (fields[i].size() > kMaxValueBytes) {
+                error = text::Format("%s: an entry of %s is longer than %zu bytes", name.c_str(), kLists[i],
+                                     kMaxValueBytes);
+                return false;
+            }
+        }
+        items.push_back({fields[0], fields[1], fields[2], fields[3]});
+    }
+    return true;
+}
+
+CString AttributeText(const AttributeRule& rule, CSpecification& spec)
+{
+    switch (rule.form) {
+    case ValueForm::Number: return text::Format("%d", *rule.number(spec));
+    case ValueForm::NumberLine: return text::Format("%d\n", *rule.number(spec));
+    case ValueForm::Flag: return *rule.number(spec) != 0 ? "true" : "false";
+    case ValueForm::FlagWhenOne: return *rule.number(spec) == 1 ? "true" : "false";
+    case ValueForm::Text: return *rule.text(spec);
+    case ValueForm::SelItems: {
+        CString items;
+        CSpecification::FormatSelItems(spec.m_arrSelItems, items);
+        return items;
+    }
+    }
+    return CString();
+}
+
+void AppendList(pugi::xml_node& extension, const char* listName, const char* entryName,
+                const std::vector<CItemDefinition>& items, CString CItemDefinition::*field)
+{
+    pugi::xml_node list = extension.append_child(listName);
+    for (const CItemDefinition& item : items)
+        list.append_child(entryName).text().set((item.*field).c_str());
+}
+
+void BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_document& document)
+{
+    pugi::xml_node declaration = document.append_child(pugi::node_pi);
+    declaration.set_name("xml");
+    declaration.set_value(kDeclarationData);
+    pugi::xml_node root = document.append_child(layout.root);
+    root.append_attribute("xmlns:xsi").set_value(kSchemaInstanceNamespace);
+    for (const AttributeRule& rule : layout.attributes)
+        root.append_attribute(rule.name).set_value(AttributeText(rule, spec).c_str());
+    pugi::xml_node extension = root.append_child(layout.extension);
+    const auto& items = spec.m_DataDesc.m_vecItemDefs;
+    if (items.empty())
+        return;
+    AppendList(extension, "ItemTitles", "ItemTitle", items, &CItemDefinition::m_strTitle);
+    AppendList(extension, "ItemTypes", "ItemType", items, &CItemDefinition::m_strType);
+    AppendList(extension, "ItemUnits", "ItemUnit", items, &CItemDefinition::m_strUnit);
+    AppendList(extension, "ValueTypes", "ValueType", items, &CItemDefinition::m_strValueType);
+}
+
+} // namespace
+
+bool ReadFileBytes(const CString& path, std::string& bytes, CString& error)
+{
+    File file(std::fopen(path.c_str(), "rb"));
+    if (!file) {
+        error = path + ": cannot be opened: " + std::strerror(errno);
+        return false;
+    }
+    bytes.clear();
+    char buffer[65536];
+    size_t got = 0;
+    while ((got = std::fread(buffer, 1, sizeof(buffer), file.get())) > 0) {
+        if (bytes.size() + got > kMaxFileBytes) {
+            error = text::Format("%s: larger than %zu bytes, which no template file is", path.c_str(), kMaxFileBytes);
+            return false;
+        }
+        bytes.append(buffer, got);
+    }
+    if (std::ferror(file.get())) {
+        error = path + ": cannot be read: " + std::strerror(errno);
+        return false;
+    }
+    return true;
+}
+
+bool DecodeToUtf8(std::string_view bytes, std::string& utf8, CString& error)
+{
+    using namespace std::string_view_literals;
+    if (StartsWith(bytes, "\xFF\xFE\0\0"sv) || StartsWith(bytes, "\0\0\xFE\xFF"sv)) {
+        error = "UTF-32 text is not accepted; save the file as UTF-16 or UTF-8";
+        return false;
+    }
+    if (StartsWith(bytes, "\xFF\xFE"sv))
+        return DecodeUtf16(bytes.substr(2), false, utf8, error);
+    if (StartsWith(bytes, "\xFE\xFF"sv))
+        return DecodeUtf16(bytes.substr(2), true, utf8, error);
+    if (StartsWith(bytes, "<\0"sv))
+        return DecodeUtf16(bytes, false, utf8, error);
+    if (StartsWith(bytes, "\0<"sv))
+        return DecodeUtf16(bytes, true, utf8, error);
+    if (StartsWith(bytes, "\xEF\xBB\xBF"sv))
+        bytes.remove_prefix(3);
+    utf8.assign(bytes);
+    return true;
+}
+
+bool ParseDocument(std::string_view bytes, const CString& name, pugi::xml_document& document, CString& error)
+{
+    std::string utf8;
+    if (!DecodeToUtf8(bytes, utf8, error)) {
+        error = name + ": " + error;
+        return false;
+    }
+    // Comments and processing instructions are kept because they count as entries of the item
+    // lists; literal tabs and line feeds in attribute values are kept as written.
+    const unsigned flags = (pugi::parse_default & ~pugi::parse_wconv_attribute) | pugi::parse_comments |
+                           pugi::parse_pi | pugi::parse_doctype;
+    pugi::xml_parse_result result = document.load_buffer(utf8.data(), utf8.size(), flags, pugi::encoding_utf8);
+    if (!result) {
+        error = name + ": not a well-formed XML document (" + result.description() + " at " +
+                Position(utf8, static_cast<size_t>(result.offset)) + ")";
+        return false;
+    }
+    for (pugi::xml_node child : document.children()) {
+        if (child.type() == pugi::node_doctype) {
+            error = name + ": a document type declaration is not accepted in a template file";
+            return false;
+        }
+    }
+    if (ElementDepth(document, kMaxElementDepth) > kMaxElementDepth) {
+        error = text::Format("%s: elements nested deeper than %d levels", name.c_str(), kMaxElementDepth);
+        return false;
+    }
+    return true;
+}
+
+pugi::xml_node FindElement(const pugi::xml_document& document, const char* name)
+{
+    CString query = CString("//") + name;
+    return document.select_node(query.c_str()).node();
+}
+
+bool ReadTemplate(const pugi::xml_document& document, const FileLayout& layout, const CString& name,
+                  CSpecification& spec, CString& error)
+{
+    pugi::xml_node root = FindElement(document, layout.root);
+    if (!root) {
+        error = name + ": no element " + layout.root + " in the document";
+        return false;
+    }
+    for (bool overridesPass : {false, true}) {
+        for (const AttributeRule& rule : layout.attributes) {
+            if (rule.overrides != overridesPass)
+                continue;
+            pugi::xml_attribute attribute = root.attribute(rule.name);
+            if (attribute && !ReadAttribute(attribute, rule, layout.flagTrueIgnoresCase, name, spec, error))
+                return false;
+        }
+    }
+    return ReadItemDefinitions(document, layout, name, spec.m_DataDesc.m_vecItemDefs, error);
+}
+
+std::string RenderTemplate(CSpecification& spec, const FileLayout& layout)
+{
+    pugi::xml_document document;
+    BuildDocument(spec, layout, document);
+    std::ostringstream out;
+    document.save(out, "\t", pugi::format_indent | pugi::format_write_bom | pugi::format_no_declaration,
+                  pugi::encoding_utf16_le);
+    return out.str();
+}
+
+bool WriteTemplate(CSpecification& spec, const FileLayout& layout, const CString& path, CString& error)
+{
+    if (path.empty()) {
+        error = "no file name to save the template to";
+        return false;
+    }
+    std::string contents;
+    try {
+        contents = RenderTemplate(spec, layout);
+    } catch (const std::exception& e) {
+        error = path + ": the template cannot be built: " + e.what();
+        return false;
+    }
+    File file(std::fopen(path.c_str(), "wb"));
+    if (!file) {
+        error = path + ": cannot be written: " + std::strerror(errno);
+        return false;
+    }
+    bool written = std::fwrite(contents.data(), 1, contents.size(), file.get()) == contents.size();
+    written = std::fflush(file.get()) == 0 && written;
+    int closed = std::fclose(file.release());
+    if (!written || closed != 0) {
+        error = path + ": cannot be written: " + std::strerror(errno);
+        return false;
+    }
+    return true;
+}
+
+} // namespace tmplfile
