@@ -53,7 +53,7 @@ inline constexpr char kMagic[4] = {'R', 'B', 'X', '0'};
 inline constexpr std::uint16_t kFormatVersion = 1;
 inline constexpr std::size_t kFixedHeaderSize = 96;
 // Bounds a reader enforces before it allocates anything.
-inline constexpr std::uint32_t kMaxHeaderSize = 64u << 20;
+inline constexpr std::uint32_t kMaxHeaderSize = 16u << 20;
 inline constexpr std::uint32_t kMaxElementsPerItem = 1u << 20;
 inline constexpr std::uint32_t kMaxRecordSize = 1u << 28;
 inline constexpr std::size_t kMaxTextLength = 65535;

@@ -4,6 +4,7 @@
 // anything is allocated; the data checksum is verified at Open for small files and when the last
 // step has been read for large ones (or as the caller asks).
 #include "platform/rbx/RbxFormat.h"
+#include "platform/rbx/RbxValueCodec.h"
 
 #include <cstdio>
 #include <memory>
@@ -53,8 +54,5 @@ private:
     std::unique_ptr<State> m_state;
     CString m_strError;
 };
-
-// Converts the value stored at `bytes` (little-endian, of `dataType`) to double.
-double DecodeValue(int dataType, const unsigned char* bytes);
 
 } // namespace rbx
