@@ -1,0 +1,62 @@
+#pragma once
+// Reads a delimited text file through an ASCII template, over the whole file: the header rows give
+// the items, every data line one row. The lines are split, the header rows read and the data lines
+// checked exactly as the preview parser does it; in addition the date/time texts are read with the
+// template's formats and the values as numbers with its decimal separator.
+#include "converter/FieldSplitter.h"
+#include "converter/LineSource.h"
+#include "converter/NumberText.h"
+#include "converter/SeriesReader.h"
+#include "converter/StampText.h"
+
+#include <memory>
+#include <optional>
+
+class CSpecification;
+
+namespace converter {
+
+class AsciiSeriesReader : public SeriesReader {
+public:
+    // `spec` must outlive the reader.
+    explicit AsciiSeriesReader(const CSpecification& spec);
+
+    Status Open(const std::string& path) override;
+    bool Next(Row& row) override;
+    void Select(const std::vector<size_t>& items) override;
+    std::uint64_t BytesConsumed() const override { return m_lines.BytesConsumed(); }
+    long Location() const override { return m_lines.LineNumber(); }
+
+private:
+    struct HeaderLines; // the lines the header rows name, read before the data
+    Status ReadHeaderLines(HeaderLines& lines);
+    Status CountItems(const HeaderLines& lines);
+    Status ReadNames(const HeaderLines& lines);
+    Status ReadTypesUnitsValueTypes(const HeaderLines& lines);
+    Status PrepareStamps();
+    bool IsDeleted(std::string_view field) const;
+    // One data line into `row`; false with m_status set when the line does not fit the template.
+    bool ReadDataLine(std::string_view line, Row& row);
+    bool ReadStamp(size_t firstCall, Stamp& stamp);
+
+    const CSpecification& m_spec;
+    std::string m_path;
+    FieldSplitter m_splitter;
+    NumberReader m_numbers;
+    LineSource m_lines;
+
+    std::string m_delimiter;
+    int m_formatColumns = 1; // W: fields the date/time spans
+    int m_stampColumn = 1;   // K: field where it starts
+    int m_columns = 0;       // N: logical columns of a data line, the date/time counting as one
+    size_t m_itemCount = 0;
+    bool m_deleteInUse = false;
+    std::string m_deleteValue;
+
+    std::unique_ptr<DateFormat> m_format;
+    StampFields m_start;           // starting fields: the global date or time where one applies
+    std::string m_stampBuffer;     // the date/time fields joined by blanks
+    std::vector<int> m_slotOfItem; // item position -> place in the row, -1 when not selected
+};
+
+} // namespace converter

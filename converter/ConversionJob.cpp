@@ -1,0 +1,295 @@
+#include "converter/ConversionJob.h"
+
+#include "platform/system/FileSystem.h"
+#include "platform/system/OleDateTime.h"
+#include "platform/wpx/Wpx.h"
+#include "resources/StringTable.h"
+#include "templates/Specification.h"
+
+#include <algorithm>
+#include <atomic>
+#include <cerrno>
+#include <chrono>
+#include <cstring>
+#include <thread>
+
+namespace converter {
+
+namespace {
+
+constexpr const char* kLogFileName = "Velmora.log";
+
+std::string Join(const CUIntArray& items)
+{
+    std::string text;
+    for (unsigned item : items)
+        text += (text.empty() ? "" : ",") + std::to_string(item);
+    return text.empty() ? "all" : text;
+}
+
+std::string BaseName(const std::string& path)
+{
+    const std::string title = sys::FileTitle(path);
+    const size_t dot = title.rfind('.');
+    return dot == std::string::npos || dot == 0 ? title : title.substr(0, dot);
+}
+
+// Paces progress lines: at most one a second over all files.
+class Progress {
+public:
+    explicit Progress(std::FILE* out) : m_out(out), m_last(std::chrono::steady_clock::now()) {}
+    void Report(const std::string& file, std::uint64_t rows, std::uint64_t bytes)
+    {
+        if (!m_out)
+            return;
+        std::lock_guard<std::mutex> lock(m_mutex);
+        const auto now = std::chrono::steady_clock::now();
+        if (now - m_last < std::chrono::seconds(1))
+            return;
+        m_last = now;
+        std::fprintf(m_out, "Velmora: %s: %llu rows, %.1f MB read\n", sys::FileTitle(file).c_str(),
+                     static_cast<unsigned long long>(rows), static_cast<double>(bytes) / 1e6);
+        std::fflush(m_out);
+    }
+
+private:
+    std::FILE* m_out;
+    std::mutex m_mutex;
+    std::chrono::steady_clock::time_point m_last;
+};
+
+struct PlannedFile {
+    std::string input;
+    std::string output;
+    std::string refusal; // why it is not even tried
+};
+
+std::vector<PlannedFile> PlanFolder(const JobSetup& setup, Format in, Format out)
+{
+    std::vector<PlannedFile> plan;
+    std::optional<std::vector<std::string>> names = sys::ListFolder(setup.inputFolder);
+    if (!names)
+        return plan;
+    std::sort(names->begin(), names->end());
+    std::vector<std::string> outputs;
+    for (const std::string& name : *names) {
+        const std::string path = sys::JoinPath(setup.inputFolder, name);
+        std::optional<sys::FileAttributes> attributes = sys::GetAttributes(path);
+        if (!attributes || attributes->directory || attributes->hidden || attributes->temporary)
+            continue;
+        PlannedFile file;
+        file.input = path;
+        file.output = sys::JoinPath(setup.outputFolder, BaseName(path) + OutputExtension(out));
+        if (!attributes->readable)
+            file.refusal = "the file cannot be read (permission)";
+        else if (!AcceptsExtension(in, path))
+            continue; // not a file of the input format: not part of the conversion
+        else if (std::find(outputs.begin(), outputs.end(), file.output) != outputs.end())
+            file.refusal = "its output " + file.output + " is the output of an earlier file of the folder";
+        else if (file.output == file.input)
+            file.refusal = "its output would replace the input file itself";
+        outputs.push_back(file.output);
+        plan.push_back(file);
+    }
+    return plan;
+}
+
+} // namespace
+
+bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
+{
+    WPXHANDLE doc = nullptr;
+    CString readError;
+    if (!wpxRead(path, &doc, &readError)) {
+        error = readError.empty() ? path + ": cannot read the setup file" : readError;
+        return false;
+    }
+    WPXHANDLE target = wpxTargetByNum(doc, 1);
+    if (!target || wpxGetName(target) != "VELMORA") {
+        error = path + ": the setup file has no target \"VELMORA\"";
+        wpxClose(&doc);
+        return false;
+    }
+    WPXHANDLE input = wpxSectionByNameNum(target, "INPUT", 1);
+    wpxGetParam(input, "Type", &setup.inputType, 1, 1);
+    wpxGetParam(input, "File_format", &setup.inputFormat, 1, 1);
+    wpxGetParam(input, "File_name", &setup.inputFile, 1, 1);
+    wpxGetParam(input, "Folder_name", &setup.inputFolder, 1, 1);
+
+    WPXHANDLE templ = wpxSectionByNameNum(target, "TEMPLATE", 1);
+    wpxGetParam(templ, "Template_option", &setup.templateOption, 1, 1);
+    wpxGetParam(templ, "Template_name", &setup.templateName, 1, 1);
+    setup.items.clear();
+    WPXHANDLE items = wpxKeywordByNameNum(templ, "Items", 1);
+    for (int n = 1; n <= wpxGetNoParams(items); ++n) {
+        const int item = wpxGetInt(wpxParamByNum(items, n));
+        if (item >= 0)
+            setup.items.push_back(static_cast<unsigned>(item));
+    }
+
+    WPXHANDLE output = wpxSectionByNameNum(target, "OUTPUT", 1);
+    wpxGetParam(output, "File_format", &setup.outputFormat, 1, 1);
+    wpxGetParam(output, "File_name", &setup.outputFile, 1, 1);
+    wpxGetParam(output, "Folder_name", &setup.outputFolder, 1, 1);
+    wpxGetParam(output, "File_title", &setup.title, 1, 1);
+    wpxGetParam(output, "Log_file", &setup.logFile, 1, 1);
+    wpxClose(&doc);
+    return true;
+}
+
+std::string CheckJobSetup(const JobSetup& setup)
+{
+    if (!IsFormat(setup.inputFormat))
+        return "the input format " + std::to_string(setup.inputFormat) + " is not 1 (rbx0), 2 (ASCII) or 3 (Excel)";
+    if (!IsFormat(setup.outputFormat))
+        return "the output format " + std::to_string(setup.outputFormat) + " is not 1 (rbx0), 2 (ASCII) or 3 (Excel)";
+    if (setup.inputType == 1) {
+        if (setup.inputFile.empty())
+            return "no input file is named (INPUT File_name)";
+        if (setup.outputFile.empty())
+            return "no output file is named (OUTPUT File_name)";
+        return {};
+    }
+    if (setup.inputType == 2) {
+        if (!sys::IsDirectory(setup.inputFolder))
+            return "the input folder '" + setup.inputFolder + "' does not exist (INPUT Folder_name)";
+        if (!sys::IsDirectory(setup.outputFolder))
+            return "the output folder '" + setup.outputFolder + "' does not exist (OUTPUT Folder_name)";
+        return {};
+    }
+    return "the input type " + std::to_string(setup.inputType) + " is not 1 (a file) or 2 (a folder)";
+}
+
+std::string LogPathFor(const std::string& logSetting)
+{
+    if (logSetting.empty())
+        return {};
+    if (logSetting.back() == '/' || sys::IsDirectory(logSetting))
+        return sys::JoinPath(logSetting, kLogFileName);
+    return logSetting;
+}
+
+ConversionLog::ConversionLog(const std::string& path, std::FILE* echo) : m_echo(echo)
+{
+    if (path.empty())
+        return;
+    m_file = std::fopen(path.c_str(), "a");
+    if (!m_file)
+        m_openError = path + ": cannot open the log file: " + std::strerror(errno);
+}
+
+ConversionLog::~ConversionLog()
+{
+    if (m_file)
+        std::fclose(m_file);
+}
+
+void ConversionLog::Write(const std::string& entry)
+{
+    std::lock_guard<std::mutex> lock(m_mutex);
+    for (std::FILE* out : {m_file, m_echo}) {
+        if (!out)
+            continue;
+        std::fputs(entry.c_str(), out);
+        if (entry.empty() || entry.back() != '\n')
+            std::fputc('\n', out);
+        std::fflush(out);
+    }
+}
+
+std::string DescribeReport(const FileReport& report)
+{
+    std::string entry;
+    if (report.converted) {
+        entry = "converted " + report.input + " -> " + report.output + ": " + std::to_string(report.rows) +
+                " time steps, " + std::to_string(report.itemsWritten) + " of " + std::to_string(report.itemsInFile) +
+                " items";
+        if (report.rows > 0)
+            entry += ", " + report.firstStamp + " to " + report.lastStamp;
+        entry += "\n";
+    } else {
+        entry = std::string(report.templateFits ? "FAILED " : "SKIPPED ") + report.input + ": " +
+                (report.templateFits ? "" : "the template does not fit: ") + report.problem.Describe() + "\n";
+        entry += "  no output written; " + (report.output.empty() ? std::string("-") : report.output) +
+                 " left as it was\n";
+    }
+    for (const std::string& note : report.notes)
+        entry += "  note: " + note + "\n";
+    return entry;
+}
+
+int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
+{
+    const std::string problem = CheckJobSetup(setup);
+    const Format in = static_cast<Format>(setup.inputFormat);
+    const Format out = static_cast<Format>(setup.outputFormat);
+    log.Write("run " + COleDateTime::GetCurrentTime().Format("%Y-%m-%d %H:%M:%S") + ": " + FormatName(in) + " " +
+              (setup.inputType == 2 ? "folder " + setup.inputFolder : "file " + setup.inputFile) + " -> " +
+              FormatName(out) + " " + (setup.inputType == 2 ? "folder " + setup.outputFolder : "file " + setup.outputFile) +
+              "; template " + (setup.templateName.empty() ? "(defaults)" : setup.templateName) + "; items " +
+              Join(setup.items));
+    if (!problem.empty()) {
+        log.Write("setup error: " + problem + "\nresult: nothing converted; exit status 3");
+        return kExitSetup;
+    }
+
+    Status loaded;
+    std::unique_ptr<CSpecification> spec = LoadTemplate(in, setup.templateName, loaded);
+    if (!loaded) {
+        log.Write("setup error: " + loaded.problem().Describe() + "\nresult: nothing converted; exit status 3");
+        return kExitSetup;
+    }
+
+    std::vector<PlannedFile> plan;
+    if (setup.inputType == 1)
+        plan.push_back({setup.inputFile, setup.outputFile, {}});
+    else
+        plan = PlanFolder(setup, in, out);
+
+    std::vector<FileReport> reports(plan.size());
+    Progress progress(options.progress);
+    std::atomic<size_t> next{0};
+    auto work = [&]() {
+        while (true) {
+            const size_t index = next.fetch_add(1);
+            if (index >= plan.size())
+                return;
+            const PlannedFile& file = plan[index];
+            FileReport& report = reports[index];
+            if (!file.refusal.empty()) {
+                report.input = file.input;
+                report.problem = Problem{file.input, 0, 0, file.refusal};
+            } else {
+                FileJob job{in, file.input, spec.get(), setup.items, out, file.output, setup.title};
+                report = ConvertFile(job, [&](std::uint64_t rows, std::uint64_t bytes) {
+                    progress.Report(file.input, rows, bytes);
+                });
+            }
+            log.Write(DescribeReport(report));
+        }
+    };
+    unsigned threads = options.threads ? options.threads : std::max(1u, std::thread::hardware_concurrency());
+    threads = static_cast<unsigned>(std::min<size_t>(threads, std::max<size_t>(1, plan.size())));
+    std::vector<std::thread> workers;
+    for (unsigned t = 1; t < threads; ++t)
+        workers.emplace_back(work);
+    work();
+    for (std::thread& worker : workers)
+        worker.join();
+
+    size_t converted = 0;
+    for (const FileReport& report : reports)
+        converted += report.converted ? 1 : 0;
+    const size_t failed = reports.size() - converted;
+    const int exitCode = (failed == 0 && !reports.empty()) ? kExitOk : kExitSomeFailed;
+    std::string summary = "result: " + std::to_string(converted) + " converted, " + std::to_string(failed) +
+                          " skipped or failed";
+    if (reports.empty())
+        summary += "; the folder holds no " + std::string(FormatName(in)) + " file";
+    if (setup.inputType == 2 && failed > 0)
+        summary += "; " + res::LoadString(res::IDS_FOLDER_FILES_SKIPPED);
+    log.Write(summary + "; exit status " + std::to_string(exitCode));
+    return exitCode;
+}
+
+} // namespace converter

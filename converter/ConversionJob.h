@@ -1,0 +1,75 @@
+#pragma once
+// A whole run of the engine program: the setup read from its parameter file, every input file
+// converted (a folder's files in parallel), each outcome written to the log, and the exit status.
+#include "converter/Converter.h"
+
+#include <cstdio>
+#include <mutex>
+#include <string>
+
+namespace converter {
+
+// Exit statuses of the engine program.
+enum ExitCode : int {
+    kExitOk = 0,         // every file converted
+    kExitSomeFailed = 1, // a file was skipped or failed (or a folder had nothing to convert)
+    kExitUsage = 2,      // wrong arguments
+    kExitSetup = 3,      // the setup file cannot be read or describes no possible run
+};
+
+// What the engine program takes from the setup file (target "VELMORA").
+struct JobSetup {
+    int inputType = 1; // 1 a single file, 2 every file of a folder
+    int inputFormat = 1;
+    std::string inputFile;
+    std::string inputFolder;
+    int templateOption = 1;
+    std::string templateName;
+    CUIntArray items;
+    int outputFormat = 1;
+    std::string outputFile;
+    std::string outputFolder;
+    std::string title;
+    std::string logFile;
+};
+
+// Reads the setup file; false with `error` ("file:line: ...") when it cannot be read.
+bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error);
+// Why the setup cannot run, or empty when it can.
+std::string CheckJobSetup(const JobSetup& setup);
+
+// Where the log goes: "Log_file" as a file; inside it as "Velmora.log" when it names a folder (an
+// existing one, or a path ending in "/"); nowhere but standard error when it is empty.
+std::string LogPathFor(const std::string& logSetting);
+
+// The log: appended to its file, each file's entry written whole; also echoed to `echo` if given.
+class ConversionLog {
+public:
+    ConversionLog(const std::string& path, std::FILE* echo);
+    ~ConversionLog();
+    ConversionLog(const ConversionLog&) = delete;
+    ConversionLog& operator=(const ConversionLog&) = delete;
+
+    bool IsOpen() const { return m_file != nullptr; }
+    const std::string& OpenError() const { return m_openError; }
+    void Write(const std::string& entry);
+
+private:
+    std::mutex m_mutex;
+    std::FILE* m_file = nullptr;
+    std::FILE* m_echo = nullptr;
+    std::string m_openError;
+};
+
+struct JobOptions {
+    unsigned threads = 0;     // 0: one per core
+    std::FILE* progress = nullptr; // progress lines for long runs; null for none
+};
+
+// Runs the whole setup and returns the exit status.
+int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options = {});
+
+// The log entry of one file.
+std::string DescribeReport(const FileReport& report);
+
+} // namespace converter

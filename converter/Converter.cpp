@@ -1,0 +1,255 @@
+#include "converter/Converter.h"
+
+#include "converter/AsciiSeriesReader.h"
+#include "converter/AsciiSeriesWriter.h"
+#include "converter/OutputFile.h"
+#include "converter/RbxSeriesReader.h"
+#include "converter/RbxSeriesWriter.h"
+#include "converter/StampText.h"
+#include "converter/XlsxSeriesWriter.h"
+#include "platform/system/FileSystem.h"
+#include "platform/system/Text.h"
+#include "templates/AsciiSpecification.h"
+#include "templates/ExcelSpecification.h"
+
+#include <cstdio>
+#include <exception>
+
+namespace converter {
+
+namespace {
+
+constexpr std::uint64_t kProgressEvery = 1u << 16;
+constexpr size_t kTextProbeBytes = 40960;
+
+std::string ExtensionOf(const std::string& path)
+{
+    const std::string name = sys::FileTitle(path);
+    const size_t dot = name.rfind('.');
+    return dot == std::string::npos ? std::string() : text::ToLower(name.substr(dot));
+}
+
+// A file without extension counts as text when its first bytes hold no zero byte.
+bool LooksLikeText(const std::string& path)
+{
+    std::FILE* file = std::fopen(path.c_str(), "rb");
+    if (!file)
+        return false;
+    char buffer[4096];
+    size_t total = 0;
+    bool text = true;
+    while (total < kTextProbeBytes && text) {
+        const size_t got = std::fread(buffer, 1, std::min(sizeof buffer, kTextProbeBytes - total), file);
+        if (got == 0)
+            break;
+        for (size_t i = 0; i < got; ++i)
+            if (buffer[i] == '\0')
+                text = false;
+        total += got;
+    }
+    std::fclose(file);
+    return text && total > 0;
+}
+
+FileReport Refuse(FileReport report, Status status, bool templateFits)
+{
+    report.converted = false;
+    report.templateFits = templateFits;
+    report.problem = status.problem();
+    return report;
+}
+
+} // namespace
+
+bool IsFormat(int number) { return number >= 1 && number <= 3; }
+
+const char* FormatName(Format format)
+{
+    switch (format) {
+    case Format::Rbx0: return "rbx0";
+    case Format::Ascii: return "ASCII";
+    case Format::Excel: return "Excel";
+    }
+    return "?";
+}
+
+const char* OutputExtension(Format format)
+{
+    switch (format) {
+    case Format::Rbx0: return ".rbx0";
+    case Format::Ascii: return ".txt";
+    case Format::Excel: return ".xlsx";
+    }
+    return "";
+}
+
+bool AcceptsExtension(Format format, const std::string& path)
+{
+    const std::string extension = ExtensionOf(path);
+    switch (format) {
+    case Format::Rbx0: return extension == ".rbx0";
+    case Format::Ascii:
+        if (extension == ".txt" || extension == ".tab" || extension == ".csv")
+            return true;
+        return extension.empty() && LooksLikeText(path);
+    case Format::Excel: return extension == ".xls" || extension == ".xlsx";
+    }
+    return false;
+}
+
+std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& path, Status& status)
+{
+    std::unique_ptr<CSpecification> spec;
+    if (format == Format::Ascii)
+        spec = std::make_unique<CAsciiSpecification>();
+    else if (format == Format::Excel)
+        spec = std::make_unique<CExcelSpecification>();
+    else
+        return nullptr;
+    if (!path.empty() && !spec->Load(path)) {
+        const std::string why = spec->LastError().empty() ? "it is not a template file" : spec->LastError();
+        status = Status::Fail(path, 0, "cannot load the template: " + why);
+        return nullptr;
+    }
+    status = Status::Ok();
+    return spec;
+}
+
+std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* spec)
+{
+    switch (format) {
+    case Format::Rbx0: return std::make_unique<RbxSeriesReader>();
+    case Format::Ascii: return spec ? std::make_unique<AsciiSeriesReader>(*spec) : nullptr;
+    case Format::Excel: return nullptr;
+    }
+    return nullptr;
+}
+
+std::unique_ptr<SeriesWriter> MakeWriter(Format format)
+{
+    switch (format) {
+    case Format::Rbx0: return std::make_unique<RbxSeriesWriter>();
+    case Format::Ascii: return std::make_unique<AsciiSeriesWriter>();
+    case Format::Excel: return std::make_unique<XlsxSeriesWriter>();
+    }
+    return nullptr;
+}
+
+bool CanConvert(Format format, const std::string& file, const std::string& templatePath, std::string* reason)
+{
+    auto refuse = [&](const std::string& why) {
+        if (reason)
+            *reason = why;
+        return false;
+    };
+    try {
+        if (!sys::IsRegularFile(file))
+            return refuse(file + ": no such file");
+        if (!AcceptsExtension(format, file))
+            return refuse(file + ": the extension does not suit " + FormatName(format) + " input");
+        Status status;
+        std::unique_ptr<CSpecification> spec = LoadTemplate(format, templatePath, status);
+        if (!status)
+            return refuse(status.problem().Describe());
+        std::unique_ptr<SeriesReader> reader = MakeReader(format, spec.get());
+        if (!reader)
+            return refuse(std::string(FormatName(format)) + " input cannot be read by this build");
+        if (Status opened = reader->Open(file); !opened)
+            return refuse(opened.problem().Describe());
+        Row row;
+        if (!reader->Next(row) && !reader->status())
+            return refuse(reader->status().problem().Describe());
+        return true;
+    } catch (const std::exception& e) {
+        return refuse(file + ": " + e.what());
+    }
+}
+
+namespace {
+
+// The header of the selected items, and notes on selected positions the file does not have.
+std::vector<size_t> ResolveSelection(const CUIntArray& items, size_t count, std::vector<std::string>& notes)
+{
+    std::vector<size_t> selection;
+    if (items.empty()) {
+        for (size_t i = 0; i < count; ++i)
+            selection.push_back(i);
+        return selection;
+    }
+    for (unsigned item : items) {
+        if (item < count)
+            selection.push_back(item);
+        else
+            notes.push_back("selected item " + std::to_string(item) + " passed over: the file has " +
+                            std::to_string(count) + " items (numbered from 0)");
+    }
+    return selection;
+}
+
+FileReport Convert(const FileJob& job, const ProgressFn& progress)
+{
+    FileReport report;
+    report.input = job.input;
+    report.output = job.output;
+    std::unique_ptr<SeriesReader> reader = MakeReader(job.inputFormat, job.spec);
+    if (!reader)
+        return Refuse(report, Status::Fail(job.input, 0, std::string(FormatName(job.inputFormat)) + " input needs a template"), false);
+    if (Status opened = reader->Open(job.input); !opened)
+        return Refuse(report, opened, false);
+    report.itemsInFile = reader->Header().items.size();
+    const std::vector<size_t> selection = ResolveSelection(job.items, report.itemsInFile, report.notes);
+    if (selection.empty())
+        return Refuse(report, Status::Fail(job.input, 0, "none of the selected items is in the file"), false);
+    reader->Select(selection);
+    SeriesHeader header;
+    header.timeTitle = reader->Header().timeTitle;
+    for (size_t item : selection)
+        header.items.push_back(reader->Header().items[item]);
+    report.itemsWritten = header.items.size();
+
+    OutputFile output(job.output);
+    std::unique_ptr<SeriesWriter> writer = MakeWriter(job.outputFormat);
+    if (Status begun = writer->Begin(output.TemporaryPath(), header, job.title); !begun)
+        return Refuse(report, Status::Fail(job.output, 0, begun.problem().message), true);
+
+    Row row;
+    while (reader->Next(row)) {
+        if (report.rows == 0)
+            report.firstStamp = FormatStamp(row.stamp);
+        if (Status written = writer->Write(row); !written)
+            return Refuse(report,
+                          Status::Fail(job.input, reader->Location(), "cannot write " + job.output + ": " + written.problem().message),
+                          true);
+        ++report.rows;
+        if (progress && report.rows % kProgressEvery == 0)
+            progress(report.rows, reader->BytesConsumed());
+    }
+    if (!reader->status())
+        return Refuse(report, reader->status(), report.rows > 0);
+    if (report.rows > 0)
+        report.lastStamp = FormatStamp(row.stamp);
+    if (Status finished = writer->Finish(); !finished)
+        return Refuse(report, Status::Fail(job.output, 0, finished.problem().message), true);
+    writer.reset();
+    if (Status committed = output.Commit(); !committed)
+        return Refuse(report, committed, true);
+    report.converted = true;
+    return report;
+}
+
+} // namespace
+
+FileReport ConvertFile(const FileJob& job, const ProgressFn& progress)
+{
+    try {
+        return Convert(job, progress);
+    } catch (const std::exception& e) {
+        FileReport report;
+        report.input = job.input;
+        report.output = job.output;
+        report.problem = Problem{job.input, 0, 0, std::string("conversion stopped: ") + e.what()};
+        return report;
+    }
+}
+
+} // namespace converter

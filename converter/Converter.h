@@ -1,0 +1,72 @@
+#pragma once
+// The conversion of one file, shared by the engine program and the bridge: choose the reader of the
+// input format (through its template for ASCII and Excel), the writer of the output format, and
+// stream the selected items from one to the other into a temporary file renamed when complete.
+#include "converter/Problem.h"
+#include "converter/SeriesReader.h"
+#include "converter/SeriesWriter.h"
+#include "platform/system/Types.h"
+
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <string>
+#include <vector>
+
+class CSpecification;
+
+namespace converter {
+
+// The setup's format numbers.
+enum class Format : int { Rbx0 = 1, Ascii = 2, Excel = 3 };
+
+bool IsFormat(int number);
+const char* FormatName(Format format); // "rbx0", "ASCII", "Excel"
+// ".rbx0", ".txt", ".xlsx": the extension of an output in this format.
+const char* OutputExtension(Format format);
+// The input rule of each format: ".rbx0"; ".txt", ".tab", ".csv" or a text file without extension;
+// ".xls", ".xlsx". Letter case does not matter.
+bool AcceptsExtension(Format format, const std::string& path);
+
+// The template of an ASCII or Excel input: loaded from `path`, or a new template's defaults when
+// `path` is empty; null with `status` set when the file cannot be loaded. Null for rbx0.
+std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& path, Status& status);
+
+// A reader of `format`; `spec` (ASCII and Excel) must outlive it.
+std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* spec);
+std::unique_ptr<SeriesWriter> MakeWriter(Format format);
+
+// True when the engine would convert `file` with this template: its extension suits the format and
+// the reader accepts its header and its first data row. `reason` (may be null) says why not.
+bool CanConvert(Format format, const std::string& file, const std::string& templatePath, std::string* reason);
+
+struct FileJob {
+    Format inputFormat = Format::Ascii;
+    std::string input;
+    const CSpecification* spec = nullptr; // the template, for ASCII and Excel input
+    CUIntArray items;                     // item positions from 0; empty converts all
+    Format outputFormat = Format::Rbx0;
+    std::string output;
+    std::string title;
+};
+
+struct FileReport {
+    std::string input;
+    std::string output;
+    bool converted = false;
+    bool templateFits = true;     // false when the reader refused the file before any row
+    std::uint64_t rows = 0;
+    size_t itemsInFile = 0;
+    size_t itemsWritten = 0;
+    std::string firstStamp, lastStamp;
+    std::vector<std::string> notes; // things the log should mention on a converted file
+    Problem problem;                // why not, when not converted
+};
+
+// Called now and then while a file converts: rows so far and input bytes consumed.
+using ProgressFn = std::function<void(std::uint64_t rows, std::uint64_t bytes)>;
+
+// Converts one file; never throws. The output exists afterwards only when `converted` is true.
+FileReport ConvertFile(const FileJob& job, const ProgressFn& progress = {});
+
+} // namespace converter

@@ -1,0 +1,89 @@
+#include "converter/LineSource.h"
+
+#include <cerrno>
+#include <cstring>
+
+namespace converter {
+
+LineSource::~LineSource()
+{
+    if (m_file)
+        std::fclose(m_file);
+}
+
+Status LineSource::Open(const std::string& path)
+{
+    m_path = path;
+    m_file = std::fopen(path.c_str(), "rb");
+    if (!m_file)
+        return m_status = Status::Fail(path, 0, std::string("cannot open the file: ") + std::strerror(errno));
+    m_buffer.resize(kDefaultBuffer);
+    return m_status;
+}
+
+bool LineSource::Refill()
+{
+    if (m_eof)
+        return false;
+    if (m_begin > 0) {
+        std::memmove(m_buffer.data(), m_buffer.data() + m_begin, m_end - m_begin);
+        m_end -= m_begin;
+        m_begin = 0;
+    }
+    if (m_end == m_buffer.size()) {
+        if (m_buffer.size() >= kMaxLineLength) {
+            m_status = Status::Fail(m_path, m_lineNumber + 1,
+                                    "the line is longer than " + std::to_string(kMaxLineLength) +
+                                        " bytes; this is not a delimited text file");
+            return false;
+        }
+        m_buffer.resize(m_buffer.size() * 2);
+    }
+    const size_t got = std::fread(m_buffer.data() + m_end, 1, m_buffer.size() - m_end, m_file);
+    if (got == 0) {
+        if (std::ferror(m_file))
+            m_status = Status::Fail(m_path, m_lineNumber + 1, std::string("read error: ") + std::strerror(errno));
+        m_eof = true;
+        return false;
+    }
+    m_end += got;
+    return true;
+}
+
+bool LineSource::Next(std::string_view& line)
+{
+    if (!m_file || !m_status)
+        return false;
+    size_t searched = m_begin;
+    while (true) {
+        const void* found = std::memchr(m_buffer.data() + searched, '\n', m_end - searched);
+        if (found) {
+            const size_t newline = static_cast<size_t>(static_cast<const char*>(found) - m_buffer.data());
+            size_t end = newline;
+            if (end > m_begin && m_buffer[end - 1] == '\r')
+                --end;
+            line = std::string_view(m_buffer.data() + m_begin, end - m_begin);
+            m_consumed += newline + 1 - m_begin;
+            m_begin = newline + 1;
+            ++m_lineNumber;
+            return true;
+        }
+        const size_t pending = m_end - m_begin;
+        if (!Refill()) {
+            if (!m_status || pending == 0 || m_end == m_begin)
+                return false;
+            // The last line has no line end.
+            size_t end = m_end;
+            if (end > m_begin && m_buffer[end - 1] == '\r')
+                --end;
+            line = std::string_view(m_buffer.data() + m_begin, end - m_begin);
+            m_consumed += m_end - m_begin;
+            m_begin = m_end;
+            ++m_lineNumber;
+            return true;
+        }
+        searched = m_begin + pending;
+    }
+}
+
+} // namespace converter

@@ -1,0 +1,47 @@
+#pragma once
+// Reading a text file line by line through one fixed buffer, counting lines from 1. A line longer
+// than the limit fails the read instead of growing memory without bound.
+#include "converter/Problem.h"
+
+#include <cstdint>
+#include <cstdio>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace converter {
+
+class LineSource {
+public:
+    static constexpr size_t kDefaultBuffer = 256 * 1024;
+    static constexpr size_t kMaxLineLength = 4 * 1024 * 1024;
+
+    LineSource() = default;
+    ~LineSource();
+    LineSource(const LineSource&) = delete;
+    LineSource& operator=(const LineSource&) = delete;
+
+    Status Open(const std::string& path);
+    // The next line without its end ("\n" or "\r\n"); valid until the next call. False at the end
+    // of the file or on an error (then status() says which).
+    bool Next(std::string_view& line);
+
+    long LineNumber() const { return m_lineNumber; }
+    const Status& status() const { return m_status; }
+    std::uint64_t BytesConsumed() const { return m_consumed; }
+
+private:
+    bool Refill();
+
+    std::FILE* m_file = nullptr;
+    std::string m_path;
+    std::vector<char> m_buffer;
+    size_t m_begin = 0; // first unread byte
+    size_t m_end = 0;   // one past the last byte read
+    bool m_eof = false;
+    long m_lineNumber = 0;
+    std::uint64_t m_consumed = 0;
+    Status m_status;
+};
+
+} // namespace converter

@@ -1,0 +1,29 @@
+#pragma once
+// An output file is written under a temporary name beside its final place and renamed over it only
+// when complete, so a failed conversion neither leaves a half-written file nor destroys an old one.
+#include "converter/Problem.h"
+
+#include <string>
+
+namespace converter {
+
+class OutputFile {
+public:
+    explicit OutputFile(std::string finalPath);
+    ~OutputFile(); // removes the temporary file unless committed
+    OutputFile(const OutputFile&) = delete;
+    OutputFile& operator=(const OutputFile&) = delete;
+
+    // Where the writer writes: a hidden name in the final file's folder, unique to this object.
+    const std::string& TemporaryPath() const { return m_temporary; }
+    const std::string& FinalPath() const { return m_final; }
+    // Renames the temporary file to the final path, replacing what was there.
+    Status Commit();
+
+private:
+    std::string m_final;
+    std::string m_temporary;
+    bool m_committed = false;
+};
+
+} // namespace converter

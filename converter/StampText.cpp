@@ -1,0 +1,186 @@
+#include "converter/StampText.h"
+
+#include "platform/system/OleDateTime.h"
+
+#include <climits>
+#include <cmath>
+
+namespace converter {
+
+namespace {
+
+constexpr std::string_view kDateTimeSeparators = "/ T:-.|";
+constexpr long long kSecondsPerDay = 86400;
+// DaysFromCivil counts from 1899-12-30; stamps count from 1970-01-01.
+const long long kEpochDays = DaysFromCivil(1970, 1, 1);
+
+bool IsScanSpace(char c) { return c == ' ' || c == '\t' || c == '\n' || c == '\r' || c == '\v' || c == '\f'; }
+
+// "%d" scanning of one token: blanks, a sign, digits; saturates instead of overflowing.
+bool ScanToken(std::string_view token, int& value)
+{
+    size_t i = 0;
+    while (i < token.size() && IsScanSpace(token[i]))
+        ++i;
+    bool negative = false;
+    if (i < token.size() && (token[i] == '+' || token[i] == '-')) {
+        negative = token[i] == '-';
+        ++i;
+    }
+    if (i >= token.size() || token[i] < '0' || token[i] > '9')
+        return false;
+    long long v = 0;
+    const long long limit = static_cast<long long>(INT_MAX) + 1;
+    for (; i < token.size() && token[i] >= '0' && token[i] <= '9'; ++i) {
+        v = v * 10 + (token[i] - '0');
+        if (v > limit)
+            v = limit;
+    }
+    if (negative)
+        v = -v;
+    value = v > INT_MAX ? INT_MAX : static_cast<int>(v);
+    return true;
+}
+
+} // namespace
+
+DateFormat::DateFormat(std::string_view format, Reads reads, std::string_view extraSeparators)
+{
+    for (char c : kDateTimeSeparators)
+        m_separator[static_cast<unsigned char>(c)] = true;
+    for (char c : extraSeparators)
+        m_separator[static_cast<unsigned char>(c)] = true;
+
+    size_t i = 0;
+    while (true) {
+        while (i < format.size() && m_separator[static_cast<unsigned char>(format[i])])
+            ++i;
+        if (i >= format.size())
+            break;
+        Field field = Field::None;
+        switch (format[i]) {
+        case 'Y': case 'y': field = Field::Year; break;
+        case 'M': field = Field::Month; break;
+        case 'D': case 'd': field = Field::Day; break;
+        case 'H': case 'h': field = Field::Hour; break;
+        case 'm': field = Field::Minute; break;
+        case 'S': case 's': field = Field::Second; break;
+        default: break;
+        }
+        const bool isDate = field == Field::Year || field == Field::Month || field == Field::Day;
+        const bool isTime = field == Field::Hour || field == Field::Minute || field == Field::Second;
+        if ((reads == Reads::Date && !isDate) || (reads == Reads::Time && !isTime))
+            field = Field::None;
+        if (m_count < kMaxTokens) {
+            m_fields[m_count] = field;
+            if (field != Field::None)
+                m_lastUsed = m_count + 1;
+        }
+        ++m_count;
+        while (i < format.size() && !m_separator[static_cast<unsigned char>(format[i])])
+            ++i;
+    }
+}
+
+bool DateFormat::Read(std::string_view text, StampFields& fields) const
+{
+    size_t i = 0;
+    for (size_t k = 0; k < m_lastUsed; ++k) {
+        while (i < text.size() && m_separator[static_cast<unsigned char>(text[i])])
+            ++i;
+        const size_t start = i;
+        while (i < text.size() && !m_separator[static_cast<unsigned char>(text[i])])
+            ++i;
+        const bool present = i > start;
+        int* slot = nullptr;
+        int low = 0, high = 0;
+        switch (m_fields[k]) {
+        case Field::None: continue;
+        case Field::Year: slot = &fields.year; low = 100; high = 9999; break;
+        case Field::Month: slot = &fields.month; low = 1; high = 12; break;
+        case Field::Day: slot = &fields.day; low = 1; high = 31; break;
+        case Field::Hour: slot = &fields.hour; low = 0; high = 23; break;
+        case Field::Minute: slot = &fields.minute; low = 0; high = 59; break;
+        case Field::Second: slot = &fields.second; low = 0; high = 59; break;
+        }
+        if (present && !ScanToken(text.substr(start, i - start), *slot))
+            return false;
+        if (*slot < low || *slot > high)
+            return false;
+    }
+    return true;
+}
+
+std::optional<Stamp> StampFromFields(const StampFields& f)
+{
+    if (!IsValidCalendarDate(f.year, f.month, f.day) || f.hour < 0 || f.hour > 23 || f.minute < 0 ||
+        f.minute > 59 || f.second < 0 || f.second > 59)
+        return std::nullopt;
+    const long long days = DaysFromCivil(f.year, f.month, f.day) - kEpochDays;
+    return days * kSecondsPerDay + f.hour * 3600LL + f.minute * 60LL + f.second;
+}
+
+StampFields FieldsFromStamp(Stamp stamp)
+{
+    long long days = stamp / kSecondsPerDay;
+    long long rest = stamp % kSecondsPerDay;
+    if (rest < 0) {
+        rest += kSecondsPerDay;
+        --days;
+    }
+    StampFields f;
+    CivilFromDays(days + kEpochDays, f.year, f.month, f.day);
+    f.hour = static_cast<int>(rest / 3600);
+    f.minute = static_cast<int>(rest / 60 % 60);
+    f.second = static_cast<int>(rest % 60);
+    return f;
+}
+
+double StampToSerialDays(Stamp stamp)
+{
+    return static_cast<double>(stamp) / kSecondsPerDay + static_cast<double>(kEpochDays);
+}
+
+std::optional<Stamp> StampFromSerialDays(double days)
+{
+    // Years 100 to 9999 in serial days, as the date type allows.
+    if (!std::isfinite(days) || days < -657434.0 || days >= 2958466.0)
+        return std::nullopt;
+    return static_cast<Stamp>(std::llround((days - static_cast<double>(kEpochDays)) * kSecondsPerDay));
+}
+
+namespace {
+char* TwoDigits(int v, char* out)
+{
+    out[0] = static_cast<char>('0' + v / 10);
+    out[1] = static_cast<char>('0' + v % 10);
+    return out + 2;
+}
+} // namespace
+
+char* FormatStamp(Stamp stamp, char* out)
+{
+    const StampFields f = FieldsFromStamp(stamp);
+    const int year = f.year < 0 ? 0 : (f.year > 9999 ? 9999 : f.year);
+    out = TwoDigits(year / 100, out);
+    out = TwoDigits(year % 100, out);
+    *out++ = '/';
+    out = TwoDigits(f.month, out);
+    *out++ = '/';
+    out = TwoDigits(f.day, out);
+    *out++ = ' ';
+    out = TwoDigits(f.hour, out);
+    *out++ = ':';
+    out = TwoDigits(f.minute, out);
+    *out++ = ':';
+    return TwoDigits(f.second, out);
+}
+
+std::string FormatStamp(Stamp stamp)
+{
+    char buffer[20];
+    char* end = FormatStamp(stamp, buffer);
+    return std::string(buffer, end);
+}
+
+} // namespace converter

@@ -1,0 +1,57 @@
+#pragma once
+// Time stamps as text, on the hot path of every conversion: a date/time format compiled once and
+// applied to millions of texts without allocating, and the fixed output form "YYYY/MM/DD HH:mm:ss".
+// Reading gives the same fields as ParseDateTimeText / ParseDateText / ParseTimeText for the same
+// texts (tests/converter compares them).
+#include "converter/TimeSeries.h"
+
+#include <array>
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace converter {
+
+// The six calendar fields of a stamp.
+struct StampFields {
+    int year = 1900, month = 1, day = 1, hour = 0, minute = 0, second = 0;
+};
+
+class DateFormat {
+public:
+    enum class Reads { DateTime, Date, Time };
+
+    // `format` such as "YYYY/MM/DD HH:mm:ss"; `extraSeparators` also split it (the ASCII field
+    // delimiter, when a stamp spans several fields that are joined by blanks before reading).
+    explicit DateFormat(std::string_view format, Reads reads = Reads::DateTime,
+                        std::string_view extraSeparators = {});
+
+    // Reads `text` into `fields`, which hold the starting values on entry. False when a token the
+    // format names is not a number or a field is out of its range.
+    bool Read(std::string_view text, StampFields& fields) const;
+
+    // How many tokens the format has.
+    size_t TokenCount() const { return m_count; }
+
+private:
+    enum class Field : unsigned char { None, Year, Month, Day, Hour, Minute, Second };
+    static constexpr size_t kMaxTokens = 32; // tokens past this read nothing, as "other" tokens do
+    std::array<Field, kMaxTokens> m_fields{};
+    size_t m_count = 0;
+    size_t m_lastUsed = 0; // one past the last token that reads a field
+    std::array<bool, 256> m_separator{};
+};
+
+// The stamp of calendar fields; nothing when the calendar has no such day (30 February).
+std::optional<Stamp> StampFromFields(const StampFields& fields);
+StampFields FieldsFromStamp(Stamp stamp);
+
+// Days since 30 December 1899 (the spreadsheet's and OLE's date serial) and back, to the second.
+double StampToSerialDays(Stamp stamp);
+std::optional<Stamp> StampFromSerialDays(double days);
+
+// Writes "YYYY/MM/DD HH:mm:ss" (19 characters) at `out`; returns the position after it.
+char* FormatStamp(Stamp stamp, char* out);
+std::string FormatStamp(Stamp stamp);
+
+} // namespace converter
