@@ -1,0 +1,561 @@
+#include "parsers/AsciiFilePreviewParser.h"
+
+#include "parsers/FieldCursor.h"
+#include "parsers/HeaderCells.h"
+#include "parsers/TextLineReader.h"
+#include "platform/system/FileSystem.h"
+#include "platform/system/Text.h"
+#include "platform/units/Units.h"
+#include "resources/StringTable.h"
+#include "templates/Specification.h"
+
+namespace {
+
+void Show(int stringId) { ui::ShowStringMessage(stringId); }
+
+// Raw lines are shown with tabs opened up, as a list control cannot show them.
+ui::Row RawRow(const CString& line)
+{
+    CString shown;
+    shown.reserve(line.size());
+    for (char c : line) {
+        if (c == '\t')
+            shown += "    ";
+        else
+            shown += c;
+    }
+    return ui::Row{std::move(shown)};
+}
+
+bool Contains(const CString& line, const CString& part) { return line.find(part) != CString::npos; }
+
+bool IsKnownValueType(const CString& name)
+{
+    int code = 0;
+    return text::EqualsNoCase(name, "Instantaneous") || CSpecification::GetValueTypeCode(name, code);
+}
+
+// The date/time text of a data line: from `start` up to the delimiter in front of `end`, or to the
+// end of the line when the fields ran to it.
+CString DateTimeTextOf(const CString& line, int start, int end)
+{
+    if (end < 0 || end >= static_cast<int>(line.size()))
+        return line.substr(static_cast<size_t>(start));
+    if (end - 1 <= start)
+        return CString();
+    return line.substr(static_cast<size_t>(start), static_cast<size_t>(end - 1 - start));
+}
+
+} // namespace
+
+bool CAsciiFilePreviewParser::DeleteValue::Matches(const CString& field) const
+{
+    return active && text::EqualsNoCase(field, text);
+}
+
+bool CAsciiFilePreviewParser::HasTemplateAndFile() const
+{
+    return m_pSpecification && sys::FileExists(m_strFile);
+}
+
+int CAsciiFilePreviewParser::ReadLine(int n, CString& text)
+{
+    if (n < 0 || !sys::FileExists(m_strFile))
+        return 0;
+    CTextLineReader reader(m_strFile);
+    CString line;
+    int read = 0;
+    while (read < n && reader.ReadLine(line))
+        ++read;
+    text = read == n && n > 0 ? std::move(line) : CString();
+    return 1;
+}
+
+CString CAsciiFilePreviewParser::ReadLineOrEmpty(int n)
+{
+    CString line;
+    if (n < 1 || !ReadLine(n, line))
+        return CString();
+    return line;
+}
+
+CAsciiFilePreviewParser::DeleteValue CAsciiFilePreviewParser::DetermineDeleteValue()
+{
+    const CDataDescription& data = m_pSpecification->m_DataDesc;
+    DeleteValue value;
+    if (data.m_nDeleteValueCheck != 1)
+        return value;
+    value.active = true;
+    value.text = data.m_nDeleteValueRadio == 1 ? ReadLineOrEmpty(data.m_nDeleteValueRow) : data.m_strDeleteValue;
+    return value;
+}
+
+bool CAsciiFilePreviewParser::CountItemFields(const CString& line, bool isDataLine, int& items)
+{
+    const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
+    CFieldCursor cursor(*m_pSpecification, line);
+    const CString first = cursor.Next();
+    const bool noDelimiter = first == cursor.Line() || (isDataLine && cursor.AtEnd());
+    if (noDelimiter) {
+        Show(isDataLine ? res::IDS_START_ROW_NO_DELIMITER : res::IDS_ITEM_NAME_LINE_NO_DELIMITER);
+        return false;
+    }
+    items = 0;
+    for (int i = 1; !cursor.AtEnd(); ++i) {
+        if (i >= dateTimeFields + 1)
+            ++items;
+        cursor.Next();
+    }
+    return true;
+}
+
+int CAsciiFilePreviewParser::GetItemCount(int& count)
+{
+    count = 0;
+    if (!HasTemplateAndFile())
+        return 0;
+    const CDataDescription& data = m_pSpecification->m_DataDesc;
+    CString startLine;
+    if (data.m_nStartRow < 1 || !ReadLine(data.m_nStartRow, startLine))
+        return 0;
+    if (!CountItemFields(startLine, true, count))
+        return 0;
+    if (count < 1) {
+        Show(res::IDS_ITEM_COUNT_WRONG);
+        return 0;
+    }
+    if (data.m_nItemTitleOption == 0) {
+        const CString nameLine = ReadLineOrEmpty(data.m_nItemDescriptionRow);
+        if (nameLine.empty()) {
+            Show(res::IDS_ITEM_NAME_LINE_EMPTY);
+            return 0;
+        }
+        int names = 0;
+        if (!CountItemFields(nameLine, false, names))
+            return 0;
+        if (count > names) {
+            Show(res::IDS_NAME_COLUMNS_MISMATCH);
+            return 0;
+        }
+    }
+    return 1;
+}
+
+int CAsciiFilePreviewParser::GetItemNames(CStringList& names)
+{
+    names.clear();
+    int count = 0;
+    if (!GetItemCount(count))
+        return 0;
+    const CDataDescription& data = m_pSpecification->m_DataDesc;
+    const size_t wanted = static_cast<size_t>(count);
+    if (data.m_nItemTitleOption == 1) {
+        if (wanted > data.m_vecItemDefs.size()) {
+            for (int i = 1; i <= count; ++i)
+                names.push_back(text::Format("Item%d", i));
+        } else {
+            for (size_t i = 0; i < wanted; ++i)
+                names.push_back(data.m_vecItemDefs[i].m_strTitle);
+        }
+        return 1;
+    }
+    if (data.m_nItemTitleOption != 0 || data.m_nItemDescriptionRow < 1)
+        return 0;
+    const CString line = ReadLineOrEmpty(data.m_nItemDescriptionRow);
+    if (line.empty()) {
+        Show(res::IDS_ITEM_NAME_LINE_EMPTY);
+        return 0;
+    }
+    const int firstDateTimeField = m_pSpecification->GetDateTimeColumn();
+    const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
+    CFieldCursor cursor(*m_pSpecification, line);
+    for (int field = 1; field < firstDateTimeField && !cursor.AtEnd() && names.size() < wanted; ++field)
+        names.push_back(cursor.Next());
+    for (int i = 0; i < dateTimeFields && !cursor.AtEnd(); ++i)
+        cursor.Next();
+    while (!cursor.AtEnd() && names.size() < wanted)
+        names.push_back(cursor.Next());
+    return 1;
+}
+
+int CAsciiFilePreviewParser::TakeHeaderFields(const CString& line, int count, CStringList& fields)
+{
+    CFieldCursor cursor(*m_pSpecification, line);
+    for (int i = 0; i < count && !cursor.AtEnd(); ++i) {
+        CString field = cursor.Next();
+        if (!cursor.AtEnd())
+            fields.push_back(std::move(field));
+    }
+    return static_cast<int>(fields.size());
+}
+
+bool CAsciiFilePreviewParser::IsKnownItemType(const CString& name) const
+{
+    int number = 0;
+    const bool numeric = name.empty() || text::ScanInt(name, number);
+    for (int s = 1; s <= ruqGetItemTypeCount(); ++s) {
+        int key = 0;
+        CString typeName;
+        if (!ruqGetItemTypeSeq(s, &key, &typeName))
+            continue;
+        if (numeric ? number == key : text::EqualsNoCase(name, typeName))
+            return true;
+    }
+    return false;
+}
+
+int CAsciiFilePreviewParser::GetItemTypes(CStringList& types)
+{
+    int count = 0;
+    if (!GetItemCount(count))
+        return 0;
+    const CDataDescription& data = m_pSpecification->m_DataDesc;
+    switch (data.m_nUnitTypeOption) {
+    case 0:
+        types.insert(types.end(), static_cast<size_t>(count), data.m_strGlobalUnitType);
+        return 1;
+    case 1: {
+        const CString line = ReadLineOrEmpty(data.m_nUnitTypeRow);
+        if (line.empty()) {
+            Show(res::IDS_ITEM_TYPE_LINE_EMPTY);
+            return 0;
+        }
+        CStringList fields;
+        TakeHeaderFields(line, count, fields);
+        for (const CString& field : fields) {
+            CString type = TextBeforeBracket(field);
+            if (IsKnownItemType(type))
+                types.push_back(std::move(type));
+        }
+        return 1;
+    }
+    case 2:
+        for (const CItemDefinition& definition : data.m_vecItemDefs)
+            types.push_back(definition.m_strType);
+        return 1;
+    default:
+        return 0;
+    }
+}
+
+int CAsciiFilePreviewParser::GetUnits(CStringList& units)
+{
+    int count = 0;
+    if (!GetItemCount(count))
+        count = 0;
+    if (!HasTemplateAndFile())
+        return 0;
+    const CDataDescription& data = m_pSpecification->m_DataDesc;
+    switch (data.m_nUnitOption) {
+    case 0:
+        units.insert(units.end(), static_cast<size_t>(count), data.m_strGlobalUnit);
+        return 1;
+    case 1: {
+        const CString line = ReadLineOrEmpty(data.m_nUnitRow);
+        if (line.empty()) {
+            Show(res::IDS_UNIT_LINE_EMPTY);
+            return 0;
+        }
+        CStringList fields;
+        TakeHeaderFields(line, count, fields);
+        for (const CString& field : fields)
+            units.push_back(TextInBrackets(field));
+        return 1;
+    }
+    case 2:
+        for (const CItemDefinition& definition : data.m_vecItemDefs)
+            units.push_back(definition.m_strUnit);
+        return 1;
+    default:
+        return 0;
+    }
+}
+
+int CAsciiFilePreviewParser::GetValueTypes(CStringList& valueTypes)
+{
+    int count = 0;
+    if (!GetItemCount(count))
+        return 0;
+    const CDataDescription& data = m_pSpecification->m_DataDesc;
+    switch (data.m_nValueTypeOption) {
+    case 0:
+        if (!IsKnownValueType(data.m_strGlobalValueType)) {
+            Show(res::IDS_VALUE_TYPE_INVALID);
+            return 0;
+        }
+        valueTypes.insert(valueTypes.end(), static_cast<size_t>(count), data.m_strGlobalValueType);
+        return 1;
+    case 1: {
+        const CString line = ReadLineOrEmpty(data.m_nValueTypeRow);
+        if (line.empty()) {
+            Show(res::IDS_VALUE_TYPE_LINE_EMPTY);
+            return 0;
+        }
+        CFieldCursor cursor(*m_pSpecification, line);
+        for (int i = 0; i < count; ++i) {
+            if (cursor.AtEnd()) {
+                Show(res::IDS_VALUE_TYPE_LINE_SHORT);
+                return 0;
+            }
+            CString valueType = TextAfterColon(cursor.Next());
+            if (!cursor.AtEnd() && !IsKnownValueType(valueType)) {
+                Show(res::IDS_VALUE_TYPE_INVALID);
+                return 0;
+            }
+            valueTypes.push_back(std::move(valueType));
+        }
+        return 1;
+    }
+    case 2:
+        for (const CItemDefinition& definition : data.m_vecItemDefs)
+            valueTypes.push_back(definition.m_strValueType);
+        return 1;
+    default:
+        return 0;
+    }
+}
+
+bool CAsciiFilePreviewParser::AppendMetadataRow(int (CAsciiFilePreviewParser::*get)(CStringList&))
+{
+    CStringList values;
+    if (!(this->*get)(values) || values.empty())
+        return false;
+    values.insert(values.begin(), CString());
+    m_vecRows.push_back(std::move(values));
+    return true;
+}
+
+int CAsciiFilePreviewParser::Parse(const CString& /*path*/)
+{
+    if (!m_pSpecification)
+        return 0;
+    m_vecItemNames.clear();
+    m_vecRows.clear();
+    m_vecRawLines.clear();
+    if (!AppendMetadataRow(&CAsciiFilePreviewParser::GetItemTypes) ||
+        !AppendMetadataRow(&CAsciiFilePreviewParser::GetUnits) ||
+        !AppendMetadataRow(&CAsciiFilePreviewParser::GetValueTypes))
+        return 0;
+    if (!sys::FileExists(m_strFile))
+        return 0;
+    // Only options 0 to 2 say where the date/time stands; with any other no data line could have one.
+    const int option = m_pSpecification->m_TimeDesc.m_nDateTimeOption;
+    if (option < 0 || option > 2) {
+        Show(res::IDS_NO_DATETIME_COLUMN);
+        return 0;
+    }
+    const DeleteValue deleteValue = DetermineDeleteValue();
+    int columns = 0;
+    if (!ReadColumnCountAndNames(deleteValue, columns))
+        return 0;
+    return ReadHeaderAndDataLines(columns, deleteValue) ? 1 : 0;
+}
+
+bool CAsciiFilePreviewParser::ReadColumnCountAndNames(const DeleteValue& deleteValue, int& columns)
+{
+    const CDataDescription& data = m_pSpecification->m_DataDesc;
+    columns = 0;
+    if (data.m_nItemTitleOption == 1) {
+        GetItemNames(m_vecItemNames);
+        if (!m_vecItemNames.empty()) {
+            columns = static_cast<int>(m_vecItemNames.size()) + 1;
+            return true;
+        }
+        int count = 0;
+        if (!GetItemCount(count))
+            return false;
+        columns = count + 1;
+        return true;
+    }
+    if (data.m_nItemTitleOption != 0)
+        return true;
+
+    // Lines beyond the end of the file read as empty, so the reading stops there.
+    CTextLineReader reader(m_strFile);
+    CString line, nameLine, startLine;
+    for (long long n = 1; n <= data.m_nStartRow && reader.ReadLine(line); ++n) {
+        if (n == data.m_nItemDescriptionRow)
+            nameLine = line;
+        if (n == data.m_nStartRow)
+            startLine = std::move(line);
+    }
+    if (!Contains(startLine, m_pSpecification->GetDelimiterString())) {
+        Show(res::IDS_NO_DELIMITERS);
+        return false;
+    }
+    columns = CountFieldCalls(*m_pSpecification, startLine) - m_pSpecification->CountFormatColumns(1);
+    if (columns < 1) {
+        Show(res::IDS_NO_ITEM_COLUMN);
+        return false;
+    }
+    if (nameLine.empty()) {
+        Show(res::IDS_ITEM_NAME_LINE_EMPTY);
+        return false;
+    }
+    return ReadNamesFromLine(nameLine, columns, deleteValue);
+}
+
+bool CAsciiFilePreviewParser::ReadNamesFromLine(const CString& nameLine, int columns, const DeleteValue& deleteValue)
+{
+    const int firstDateTimeField = m_pSpecification->GetDateTimeColumn();
+    const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
+    CFieldCursor cursor(*m_pSpecification, nameLine);
+    for (int column = 1; column <= columns; ++column) {
+        if (column != firstDateTimeField) {
+            if (cursor.AtEnd() || cursor.Pos() >= cursor.Length()) {
+                Show(res::IDS_NAME_COLUMNS_MISMATCH);
+                return false;
+            }
+            CString name = cursor.Next();
+            if (cursor.AtEnd()) {
+                Show(res::IDS_NAME_COLUMNS_MISMATCH);
+                return false;
+            }
+            m_vecItemNames.push_back(deleteValue.Matches(name) ? CString() : std::move(name));
+            continue;
+        }
+        // The date/time title: its first field names the column; the others are passed over.
+        cursor.Restart();
+        for (int i = 1; i < firstDateTimeField; ++i) {
+            if (cursor.AtEnd()) {
+                Show(res::IDS_DATETIME_UNPARSABLE);
+                return false;
+            }
+            cursor.Next();
+        }
+        const int titleStart = cursor.Pos();
+        for (int i = 0; i < dateTimeFields; ++i) {
+            if (!cursor.AtEnd() && cursor.Pos() >= cursor.Length()) {
+                Show(res::IDS_ITEM_COUNT_WRONG);
+                return false;
+            }
+            if (!cursor.AtEnd())
+                cursor.Next();
+        }
+        if (!cursor.AtEnd()) {
+            CString line = cursor.Line();
+            int titlePos = titleStart;
+            CString title = m_pSpecification->NextField(line, titlePos);
+            m_vecItemNames.insert(m_vecItemNames.begin(), deleteValue.Matches(title) ? CString() : title);
+        }
+    }
+    return true;
+}
+
+bool CAsciiFilePreviewParser::ReadHeaderAndDataLines(int columns, const DeleteValue& deleteValue)
+{
+    const int startRow = m_pSpecification->m_DataDesc.m_nStartRow;
+    const CString delimiter = m_pSpecification->GetDelimiterString();
+    CTextLineReader reader(m_strFile);
+    CString line;
+    for (long long n = 1; n < startRow && reader.ReadLine(line); ++n)
+        m_vecRawLines.push_back(RawRow(line));
+    for (int i = 0; i < kPreviewLines && reader.ReadLine(line); ++i) {
+        m_vecRawLines.push_back(RawRow(line));
+        if (line.empty())
+            continue;
+        if (!Contains(line, delimiter)) {
+            Show(res::IDS_NO_DELIMITERS);
+            return false;
+        }
+        if (!ParseDataLine(line, columns, deleteValue))
+            return false;
+    }
+    return true;
+}
+
+bool CAsciiFilePreviewParser::ParseDataLine(const CString& line, int columns, const DeleteValue& deleteValue)
+{
+    const int firstDateTimeField = m_pSpecification->GetDateTimeColumn();
+    const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
+    CFieldCursor cursor(*m_pSpecification, line);
+    ui::Row row;
+    bool hasDateTime = false;
+    int column = 0;
+    while (!cursor.AtEnd()) {
+        if (column + 1 == firstDateTimeField) {
+            if (!TakeDateTime(cursor, row, column))
+                return false;
+            hasDateTime = true;
+        } else {
+            CString field = cursor.Next();
+            if (!cursor.AtEnd()) {
+                if (!CheckDecimalSeparator(field))
+                    return false;
+                row.push_back(deleteValue.Matches(field) ? CString() : std::move(field));
+            }
+        }
+        ++column;
+    }
+    if (columns != column - dateTimeFields) {
+        Show(res::IDS_ITEM_COUNT_WRONG);
+        return false;
+    }
+    if (!hasDateTime) {
+        Show(res::IDS_NO_DATETIME_COLUMN);
+        return false;
+    }
+    m_vecRows.push_back(std::move(row));
+    return true;
+}
+
+bool CAsciiFilePreviewParser::TakeDateTime(CFieldCursor& cursor, ui::Row& row, int& column)
+{
+    const CTimeDescription& time = m_pSpecification->m_TimeDesc;
+    const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
+    // A format that spans no field would leave the line where it is.
+    if (dateTimeFields < 1) {
+        Show(res::IDS_DATETIME_UNPARSABLE);
+        return false;
+    }
+    const int start = cursor.Pos();
+    for (int i = 0; i < dateTimeFields; ++i) {
+        if (cursor.AtEnd()) {
+            Show(res::IDS_DATETIME_UNPARSABLE);
+            return false;
+        }
+        cursor.Next();
+    }
+    const CString text = DateTimeTextOf(cursor.Line(), start, cursor.Pos());
+    CString stamp;
+    if (time.m_nDateTimeOption == 1)
+        stamp = time.m_strGlobalDate + "  " + text;
+    else if (time.m_nDateTimeOption == 2)
+        stamp = text + "  " + time.m_strGlobalTime;
+    else
+        stamp = text;
+    row.insert(row.begin(), std::move(stamp));
+    column += dateTimeFields - 1;
+    if (cursor.Pos() == cursor.Length()) {
+        cursor.Finish();
+        ++column;
+    }
+    return true;
+}
+
+bool CAsciiFilePreviewParser::CheckDecimalSeparator(const CString& field) const
+{
+    const CString separator = m_pSpecification->GetDecimalSeparatorString();
+    if (field.empty() || Contains(field, separator) || (separator != "." && separator != ","))
+        return true;
+    const char* other = separator == "." ? "," : ".";
+    if (!Contains(field, other))
+        return true;
+    Show(res::IDS_DECIMAL_SEPARATOR_MISMATCH);
+    return false;
+}
+
+int CAsciiFilePreviewParser::ReadRawLines(const CString& path)
+{
+    const CString file = path.empty() ? m_strFile : path;
+    if (!sys::FileExists(file))
+        return 0;
+    CTextLineReader reader(file);
+    m_vecItemNames.clear();
+    m_vecRows.clear();
+    m_vecRawLines.clear();
+    CString line;
+    for (int i = 0; i < kPreviewLines && reader.ReadLine(line); ++i)
+        m_vecRawLines.push_back(RawRow(line));
+    return 1;
+}

@@ -1,0 +1,49 @@
+#pragma once
+// Reads a delimited text file through an ASCII template: item names, types, units and value types
+// from the header rows or the template, and the stamps and values of the first data lines.
+#include "parsers/FilePreviewParser.h"
+
+class CFieldCursor;
+
+class CAsciiFilePreviewParser : public CGeneralFileParser {
+public:
+    // Data lines a parse reads after the header lines; raw lines ReadRawLines gives.
+    static constexpr int kPreviewLines = 20;
+
+    // Reads the bound file; `path` is not used.
+    int Parse(const CString& path) override;
+    int GetItemNames(CStringList& names) override;
+    int GetItemTypes(CStringList& types) override;
+    int GetUnits(CStringList& units) override;
+    int GetValueTypes(CStringList& valueTypes) override;
+    int GetItemCount(int& count) override;
+    int ReadRawLines(const CString& path) override;
+
+    // Line `n` (from 1) of the bound file, the empty text beyond its end. 0 when the file does not
+    // exist or `n` is negative. Throws CFileException when the file exists but cannot be read.
+    int ReadLine(int n, CString& text);
+
+private:
+    // The text a field is compared with to be stored empty; `active` is false when none applies.
+    struct DeleteValue {
+        bool active = false;
+        CString text;
+        bool Matches(const CString& field) const;
+    };
+
+    bool HasTemplateAndFile() const;
+    CString ReadLineOrEmpty(int n);
+    DeleteValue DetermineDeleteValue();
+    // The item fields of the data start line or the item name line (its fields minus the date/time
+    // fields); false with a message when the line has no delimiter.
+    bool CountItemFields(const CString& line, bool isDataLine, int& items);
+    int TakeHeaderFields(const CString& line, int count, CStringList& fields);
+    bool IsKnownItemType(const CString& text) const;
+    bool AppendMetadataRow(int (CAsciiFilePreviewParser::*get)(CStringList&));
+    bool ReadColumnCountAndNames(const DeleteValue& deleteValue, int& columns);
+    bool ReadNamesFromLine(const CString& nameLine, int columns, const DeleteValue& deleteValue);
+    bool ReadHeaderAndDataLines(int columns, const DeleteValue& deleteValue);
+    bool ParseDataLine(const CString& line, int columns, const DeleteValue& deleteValue);
+    bool TakeDateTime(CFieldCursor& cursor, ui::Row& row, int& column);
+    bool CheckDecimalSeparator(const CString& field) const;
+};

@@ -1,0 +1,296 @@
+#include "parsers/RbxPreviewFileParser.h"
+
+#include "platform/rbx/OkaRbxItem.h"
+#include "platform/rbx/Rbx.h"
+#include "platform/rbx/RbxFormat.h"
+#include "platform/system/FileSystem.h"
+#include "platform/system/OleDateTime.h"
+#include "platform/units/Units.h"
+
+#include <cmath>
+#include <cstdint>
+#include <cstdio>
+#include <cstring>
+#include <exception>
+
+namespace {
+
+// A file opened through the library, closed and released however the reading ends.
+class COpenRbxFile {
+public:
+    explicit COpenRbxFile(const CString& path) { m_bOpen = rbxFileRead(path.c_str(), &m_pHeader, &m_pFile) == 0; }
+    ~COpenRbxFile()
+    {
+        if (m_bOpen) {
+            rbxFileClose(m_pHeader, m_pFile);
+            rbxHeaderDestroy(m_pHeader);
+        }
+    }
+    COpenRbxFile(const COpenRbxFile&) = delete;
+    COpenRbxFile& operator=(const COpenRbxFile&) = delete;
+
+    bool IsOpen() const { return m_bOpen; }
+    rbxHeader* Header() const { return m_pHeader; }
+    rbxFile* File() const { return m_pFile; }
+
+private:
+    rbxHeader* m_pHeader = nullptr;
+    rbxFile* m_pFile = nullptr;
+    bool m_bOpen = false;
+};
+
+struct AxisValues {
+    int type = 0;
+    int unitKey = 0;
+    CString unitText;
+    CString startDate;
+    CString startTime;
+    double start = 0.0;
+    double step = 0.0; // the span for non-equidistant axes
+    int steps = 0;
+    int index = 0;
+};
+
+bool ReadAxis(const rbxHeader* header, AxisValues& axis)
+{
+    axis.type = rbxGetTimeAxisType(header);
+    switch (axis.type) {
+    case rbx::kEquidistantRelative:
+        return rbxGetEqTimeAxis(header, &axis.unitKey, &axis.unitText, &axis.start, &axis.step, &axis.steps,
+                                &axis.index) == 0;
+    case rbx::kNonEquidistantRelative:
+        return rbxGetNeqTimeAxis(header, &axis.unitKey, &axis.unitText, &axis.start, &axis.step, &axis.steps,
+                                 &axis.index) == 0;
+    case rbx::kEquidistantCalendar:
+        return rbxGetEqCalendarAxis(header, &axis.startDate, &axis.startTime, &axis.unitKey, &axis.unitText,
+                                    &axis.start, &axis.step, &axis.steps, &axis.index) == 0;
+    case rbx::kNonEquidistantCalendar:
+        return rbxGetNeqCalendarAxis(header, &axis.startDate, &axis.startTime, &axis.unitKey, &axis.unitText,
+                                     &axis.start, &axis.step, &axis.steps, &axis.index) == 0;
+    default:
+        return false;
+    }
+}
+
+// The stamp of the first step before any step offset. Calendar axes start at their start date and
+// time plus the start offset; relative axes count from the OLE epoch, 30 December 1899.
+COleDateTime BaseStamp(const AxisValues& axis, double daysPerUnit)
+{
+    COleDateTime base;
+    if (rbx::IsCalendarAxis(axis.type)) {
+        int year = 0, month = 0, day = 0, hour = 0, minute = 0, second = 0;
+        std::sscanf(axis.startDate.c_str(), "%d-%d-%d", &year, &month, &day);
+        std::sscanf(axis.startTime.c_str(), "%d:%d:%d", &hour, &minute, &second);
+        base.SetDateTime(year, month, day, hour, minute, second);
+    }
+    return base.AddDays(axis.start * daysPerUnit);
+}
+
+// Offset of step `t` from the base stamp, in days.
+double StepOffsetDays(const AxisValues& axis, int t, double stepTime, double daysPerUnit)
+{
+    if (rbx::IsEquidistantAxis(axis.type))
+        return t * axis.step * daysPerUnit;
+    return stepTime * daysPerUnit;
+}
+
+// Writes "%Y-%m-%d %H:%M:%S" of `stamp`; the calendar arithmetic is done here because it runs once
+// per time step of the file.
+CString FormatStamp(const COleDateTime& stamp)
+{
+    int year, month, day, hour, minute, second;
+    if (!stamp.GetFields(year, month, day, hour, minute, second))
+        return "Invalid DateTime";
+    char text[32];
+    int length = std::snprintf(text, sizeof(text), "%04d-%02d-%02d %02d:%02d:%02d", year, month, day, hour, minute,
+                               second);
+    return CString(text, static_cast<size_t>(length));
+}
+
+// Reads the next value of an item and writes it as text; unknown data types read nothing.
+bool ReadValueText(const COpenRbxFile& rbxFile, int dataType, double& time, CString& text)
+{
+    alignas(8) unsigned char value[16] = {};
+    if (!rbx::IsValidDataType(dataType)) {
+        text.clear();
+        return true;
+    }
+    if (rbxReadItemTimeStep(rbxFile.Header(), rbxFile.File(), &time, value) != 0)
+        return false;
+    char buffer[512];
+    int length = 0;
+    switch (dataType) {
+    case rbx::kFloat32: {
+        float v;
+        std::memcpy(&v, value, sizeof(v));
+        length = std::snprintf(buffer, sizeof(buffer), "%f", static_cast<double>(v));
+        break;
+    }
+    case rbx::kFloat64: {
+        double v;
+        std::memcpy(&v, value, sizeof(v));
+        length = std::snprintf(buffer, sizeof(buffer), "%f", v);
+        break;
+    }
+    case rbx::kChar:
+        length = std::snprintf(buffer, sizeof(buffer), "%c", static_cast<char>(value[0]));
+        break;
+    case rbx::kInt32: {
+        std::int32_t v;
+        std::memcpy(&v, value, sizeof(v));
+        length = std::snprintf(buffer, sizeof(buffer), "%d", static_cast<int>(v));
+        break;
+    }
+    case rbx::kUInt32: {
+        std::uint32_t v;
+        std::memcpy(&v, value, sizeof(v));
+        length = std::snprintf(buffer, sizeof(buffer), "%u", static_cast<unsigned>(v));
+        break;
+    }
+    case rbx::kInt16: {
+        std::int16_t v;
+        std::memcpy(&v, value, sizeof(v));
+        length = std::snprintf(buffer, sizeof(buffer), "%d", static_cast<int>(v));
+        break;
+    }
+    case rbx::kInteger: {
+        std::int64_t v;
+        std::memcpy(&v, value, sizeof(v));
+        length = std::snprintf(buffer, sizeof(buffer), "%lld", static_cast<long long>(v));
+        break;
+    }
+    default:
+        break;
+    }
+    // "%f" of a huge float needs more than the buffer: snprintf then reports the full length.
+    text.assign(buffer, static_cast<size_t>(std::min<int>(std::max(length, 0), sizeof(buffer) - 1)));
+    return true;
+}
+
+} // namespace
+
+CRbxPreviewFileParser::CRbxPreviewFileParser() { rbxInitSystem(); }
+
+int CRbxPreviewFileParser::Parse(const CString& path)
+{
+    m_vecItemNames.clear();
+    m_vecRawLines.clear();
+    m_vecRows.clear();
+    rbxInitSystem();
+    COpenRbxFile rbxFile(path);
+    if (!rbxFile.IsOpen())
+        return 0;
+    rbxHeader* header = rbxFile.Header();
+    const int fileType = rbxGetFileType(header);
+    if (fileType != rbx::kSharedDeleteValue && fileType != rbx::kPerItemDeleteValue)
+        return 0;
+    rbxGetDataType(header);
+    AxisValues axis;
+    if (!ReadAxis(header, axis) || axis.steps < 0)
+        return 0;
+    double daysPerUnit = 1.0;
+    ruqConvertUnit(axis.unitKey, 1.0, units::kUnitDay, &daysPerUnit);
+    const COleDateTime base = BaseStamp(axis, daysPerUnit);
+
+    const int itemCount = rbxGetNoOfItems(header);
+    std::vector<int> dataTypes;
+    m_vecItemNames.push_back("Date/time");
+    for (int i = 1; i <= itemCount; ++i) {
+        rbxItem* item = rbxItemD(header, i);
+        if (!item || rbxGetItemAxisType(item) != rbx::kScalarItem)
+            return 0;
+        CString name;
+        int dataType = 0, valueType = 0;
+        rbxGetItemInfo(item, nullptr, nullptr, &name, nullptr, nullptr, &dataType);
+        rbxGetItemValueType(item, &valueType);
+        m_vecItemNames.push_back(std::move(name));
+        dataTypes.push_back(dataType);
+    }
+
+    // The library has checked the step count against the file's size, so the table can be sized once.
+    m_vecRows.reserve(static_cast<size_t>(axis.steps));
+    for (int t = 0; t < axis.steps; ++t) {
+        ui::Row row;
+        row.reserve(dataTypes.size() + 1);
+        row.emplace_back();
+        double stepTime = 0.0;
+        for (int dataType : dataTypes) {
+            row.emplace_back();
+            if (!ReadValueText(rbxFile, dataType, stepTime, row.back()))
+                return 0;
+        }
+        row.front() = FormatStamp(base.AddDays(StepOffsetDays(axis, t, stepTime, daysPerUnit)));
+        m_vecRows.push_back(std::move(row));
+    }
+    SetFile(path);
+    return 1;
+}
+
+int CRbxPreviewFileParser::GetItemNames(CStringList& names)
+{
+    names.clear();
+    if (!sys::FileExists(m_strFile))
+        return 0;
+    COpenRbxFile rbxFile(m_strFile);
+    if (!rbxFile.IsOpen())
+        return 0;
+    try {
+        const int fileDataType = rbxGetDataType(rbxFile.Header());
+        const int itemCount = rbxGetNoOfItems(rbxFile.Header());
+        for (int i = 1; i <= itemCount; ++i) {
+            COkaRbxItem description;
+            if (rbxItem* item = rbxItemD(rbxFile.Header(), i)) {
+                int typeKey = 0, unitKey = 0, dataType = 0;
+                CString name;
+                rbxGetItemInfo(item, &typeKey, nullptr, &name, &unitKey, nullptr, &dataType);
+                description.SetDataType(dataType);
+                description.SetDescrip(name);
+                description.SetRuqType(typeKey);
+                description.SetRuqUnit(unitKey);
+                description.SetValueType(fileDataType);
+            }
+            names.push_back(description.GetDescrip());
+        }
+    } catch (const std::exception&) {
+        // What was collected stands; the caller still gets the names read so far.
+    }
+    return 1;
+}
+
+int CRbxPreviewFileParser::ReadItemTexts(ItemText which, CStringList& texts)
+{
+    texts.clear();
+    if (!sys::FileExists(m_strFile))
+        return 0;
+    COpenRbxFile rbxFile(m_strFile);
+    if (!rbxFile.IsOpen())
+        return 0;
+    try {
+        const int itemCount = rbxGetNoOfItems(rbxFile.Header());
+        for (int i = 1; i <= itemCount; ++i) {
+            rbxItem* item = rbxItemD(rbxFile.Header(), i);
+            if (!item || rbxGetItemAxisType(item) != rbx::kScalarItem)
+                return 0;
+            CString typeText, unitText;
+            rbxGetItemInfo(item, nullptr, &typeText, nullptr, nullptr, &unitText, nullptr);
+            if (which == ItemText::Type)
+                texts.push_back(std::move(typeText));
+            else if (which == ItemText::Unit)
+                texts.push_back(std::move(unitText));
+        }
+    } catch (const std::exception&) {
+        // As for the names: the entries collected so far are the answer.
+    }
+    return 1;
+}
+
+int CRbxPreviewFileParser::GetItemTypes(CStringList& types) { return ReadItemTexts(ItemText::Type, types); }
+
+int CRbxPreviewFileParser::GetUnits(CStringList& units) { return ReadItemTexts(ItemText::Unit, units); }
+
+int CRbxPreviewFileParser::GetValueTypes(CStringList& valueTypes)
+{
+    return ReadItemTexts(ItemText::None, valueTypes);
+}
+
+int CRbxPreviewFileParser::GetItemCount(int& /*count*/) { return 1; }
