@@ -340,7 +340,7 @@ bool ParseDocument(std::string_view bytes, const CString& name, pugi::xml_docume
     // Comments and processing instructions are kept because they count as entries of the item
     // lists; literal tabs and line feeds in attribute values are kept as written.
     const unsigned flags = (pugi::parse_default & ~pugi::parse_wconv_attribute) | pugi::parse_comments |
-                           pugi::parse_pi | pugi::parse_doctype;
+                           pugi::parse_pi | pugi::parse_doctype | pugi::parse_declaration;
     pugi::xml_parse_result result = document.load_buffer(utf8.data(), utf8.size(), flags, pugi::encoding_utf8);
     if (!result) {
         error = name + ": not a well-formed XML document (" + result.description() + " at " +
@@ -350,6 +350,10 @@ bool ParseDocument(std::string_view bytes, const CString& name, pugi::xml_docume
     for (pugi::xml_node child : document.children()) {
         if (child.type() == pugi::node_doctype) {
             error = name + ": a document type declaration is not accepted in a template file";
+            return false;
+        }
+        if (child.type() == pugi::node_declaration && child != document.first_child()) {
+            error = name + ": the XML declaration must be at the start of the document";
             return false;
         }
     }
