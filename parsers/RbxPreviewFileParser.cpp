@@ -11,7 +11,9 @@
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
+#include <algorithm>
 #include <exception>
+#include <vector>
 
 namespace {
 
@@ -107,16 +109,18 @@ CString FormatStamp(const COleDateTime& stamp)
     return CString(text, static_cast<size_t>(length));
 }
 
-// Reads the next value of an item and writes it as text; unknown data types read nothing.
-bool ReadValueText(const COpenRbxFile& rbxFile, int dataType, double& time, CString& text)
+// Reads the next value of an item into `value` (large enough for all the item's values) and writes
+// the first as text; unknown data types read nothing.
+bool ReadValueText(const COpenRbxFile& rbxFile, int dataType, std::vector<unsigned char>& valueBuffer, double& time,
+                   CString& text)
 {
-    alignas(8) unsigned char value[16] = {};
     if (!rbx::IsValidDataType(dataType)) {
         text.clear();
         return true;
     }
-    if (rbxReadItemTimeStep(rbxFile.Header(), rbxFile.File(), &time, value) != 0)
+    if (rbxReadItemTimeStep(rbxFile.Header(), rbxFile.File(), &time, valueBuffer.data()) != 0)
         return false;
+    const unsigned char* value = valueBuffer.data();
     char buffer[512];
     int length = 0;
     switch (dataType) {
@@ -194,6 +198,7 @@ int CRbxPreviewFileParser::Parse(const CString& path)
 
     const int itemCount = rbxGetNoOfItems(header);
     std::vector<int> dataTypes;
+    size_t largestValue = 16;
     m_vecItemNames.push_back("Date/time");
     for (int i = 1; i <= itemCount; ++i) {
         rbxItem* item = rbxItemD(header, i);
@@ -205,7 +210,10 @@ int CRbxPreviewFileParser::Parse(const CString& path)
         rbxGetItemValueType(item, &valueType);
         m_vecItemNames.push_back(std::move(name));
         dataTypes.push_back(dataType);
+        const size_t valueBytes = rbx::DataTypeSize(dataType) * static_cast<size_t>(std::max(1, rbxGetItemElementCount(item)));
+        largestValue = std::max(largestValue, valueBytes);
     }
+    std::vector<unsigned char> valueBuffer(largestValue);
 
     // The library has checked the step count against the file's size, so the table can be sized once.
     m_vecRows.reserve(static_cast<size_t>(axis.steps));
@@ -216,7 +224,7 @@ int CRbxPreviewFileParser::Parse(const CString& path)
         double stepTime = 0.0;
         for (int dataType : dataTypes) {
             row.emplace_back();
-            if (!ReadValueText(rbxFile, dataType, stepTime, row.back()))
+            if (!ReadValueText(rbxFile, dataType, valueBuffer, stepTime, row.back()))
                 return 0;
         }
         row.front() = FormatStamp(base.AddDays(StepOffsetDays(axis, t, stepTime, daysPerUnit)));
