@@ -1,0 +1,82 @@
+#pragma once
+// Small rbx0 files for the tests: a temporary folder per test, a writer call that fills a file from
+// tables, and raw byte access for damaging files.
+#include "platform/rbx/RbxWriter.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <unistd.h>
+#include <vector>
+
+namespace rbxtest {
+
+class TempFolder {
+public:
+    TempFolder()
+    {
+        const auto* info = ::testing::UnitTest::GetInstance()->current_test_info();
+        m_path = std::filesystem::temp_directory_path()
+            / (std::string("velmora_rbx_") + info->test_suite_name() + "_" + info->name() + "_" + std::to_string(::getpid()));
+        std::filesystem::remove_all(m_path);
+        std::filesystem::create_directories(m_path);
+    }
+    ~TempFolder() { std::filesystem::remove_all(m_path); }
+    std::string File(const std::string& name) const { return (m_path / name).string(); }
+
+private:
+    std::filesystem::path m_path;
+};
+
+inline rbx::ItemInfo Item(const std::string& name, int dataType, double deleteValue = -999.0)
+{
+    rbx::ItemInfo item;
+    item.name = name;
+    item.itemTypeKey = 100;
+    item.itemTypeText = "Water Level";
+    item.unitKey = 1000;
+    item.unitText = "meter";
+    item.dataType = dataType;
+    item.deleteValue = deleteValue;
+    return item;
+}
+
+// Writes `times` with `values` (one row of ValueCount() per step); fails the test on a writer error.
+inline void WriteFile(const std::string& path, const rbx::FileDefinition& definition, const std::vector<double>& times,
+                      const std::vector<std::vector<double>>& values)
+{
+    rbx::CRbxWriter writer;
+    ASSERT_TRUE(writer.Open(path, definition)) << writer.Error();
+    for (std::size_t s = 0; s < times.size(); ++s)
+        ASSERT_TRUE(writer.WriteStep(times[s], values[s].data())) << writer.Error();
+    ASSERT_TRUE(writer.Close()) << writer.Error();
+}
+
+inline rbx::FileDefinition Definition(std::vector<rbx::ItemInfo> items, bool calendar = true)
+{
+    rbx::FileDefinition definition;
+    definition.title = "Test file";
+    definition.calendar = calendar;
+    definition.timeUnitKey = 1400;
+    definition.timeUnitText = "second";
+    if (calendar)
+        definition.calendarStart = COleDateTime(2020, 1, 1, 0, 0, 0);
+    definition.items = std::move(items);
+    return definition;
+}
+
+inline std::vector<unsigned char> ReadBytes(const std::string& path)
+{
+    std::ifstream in(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+}
+
+inline void WriteBytes(const std::string& path, const std::vector<unsigned char>& bytes)
+{
+    std::ofstream out(path, std::ios::binary | std::ios::trunc);
+    out.write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
+}
+
+} // namespace rbxtest
