@@ -1,0 +1,215 @@
+#include "templates/TemplateReport.h"
+
+#include "templates/AsciiSpecification.h"
+#include "templates/ExcelSpecification.h"
+#include "templates/TemplateXml.h"
+
+#include "platform/system/Text.h"
+
+#include <cstring>
+#include <vector>
+
+namespace tmplfile {
+namespace {
+
+const char* const kExcelOnlyKeys[] = {"ExcelSheet", "UseDTFormat", "UseTFormat", "UseDFormat"};
+
+// The rules that name every template value once: all ASCII keys, then the Excel-only ones.
+std::vector<const AttributeRule*> ReportedValues()
+{
+    std::vector<const AttributeRule*> rules;
+    for (const AttributeRule& rule : AsciiFileLayout().attributes)
+        rules.push_back(&rule);
+    for (const char* key : kExcelOnlyKeys)
+        for (const AttributeRule& rule : ExcelFileLayout().attributes)
+            if (std::strcmp(rule.name, key) == 0)
+                rules.push_back(&rule);
+    return rules;
+}
+
+// Length of the well-formed UTF-8 sequence at `i` (no overlong forms, surrogates or values past
+// U+10FFFF), or 0 when there is none.
+size_t Utf8SequenceLength(const CString& s, size_t i)
+{
+    auto byte = [&](size_t k) { return static_cast<unsigned char>(s[k]); };
+    unsigned char lead = byte(i);
+    size_t length = lead < 0x80 ? 1 : (lead >> 5) == 0x6 ? 2 : (lead >> 4) == 0xE ? 3 : (lead >> 3) == 0x1E ? 4 : 0;
+    if (length == 0 || i + length > s.size())
+        return 0;
+    char32_t code = length == 1 ? lead : lead & (0x7F >> length);
+    for (size_t k = 1; k < length; ++k) {
+        if ((byte(i + k) & 0xC0) != 0x80)
+            return 0;
+        code = (code << 6) | (byte(i + k) & 0x3F);
+    }
+    static const char32_t kSmallest[] = {0, 0, 0x80, 0x800, 0x10000};
+    if (code < kSmallest[length] || code > 0x10FFFF || (code >= 0xD800 && code <= 0xDFFF))
+        return 0;
+    return length;
+}
+
+// A JSON string literal; bytes that are not UTF-8 become U+FFFD so the output stays valid JSON.
+CString JsonString(const CString& value)
+{
+    CString out = "\"";
+    for (size_t i = 0; i < value.size();) {
+        unsigned char c = static_cast<unsigned char>(value[i]);
+        if (c == '"' || c == '\\') {
+            out += '\\';
+            out += static_cast<char>(c);
+        } else if (c == '\n') {
+            out += "\\n";
+        } else if (c == '\t') {
+            out += "\\t";
+        } else if (c == '\r') {
+            out += "\\r";
+        } else if (c < 0x20) {
+            out += text::Format("\\u%04x", c);
+        } else if (c >= 0x80) {
+            size_t length = Utf8SequenceLength(value, i);
+            if (length == 0) {
+                out += "\xEF\xBF\xBD";
+                ++i;
+                continue;
+            }
+            out.append(value, i, length);
+            i += length;
+            continue;
+        } else {
+            out += static_cast<char>(c);
+        }
+        ++i;
+    }
+    return out + "\"";
+}
+
+// Text shown to a person: control characters written as C escapes, so a tab delimiter is visible.
+CString QuotedText(const CString& value)
+{
+    CString out = "\"";
+    for (char ch : value) {
+        unsigned char c = static_cast<unsigned char>(ch);
+        if (c == '\t')
+            out += "\\t";
+        else if (c == '\n')
+            out += "\\n";
+        else if (c == '\r')
+            out += "\\r";
+        else if (c < 0x20)
+            out += text::Format("\\x%02x", c);
+        else
+            out += ch;
+    }
+    return out + "\"";
+}
+
+CString SelectedItemsJson(const CUIntArray& items)
+{
+    CString out = "[";
+    for (size_t i = 0; i < items.size(); ++i)
+        out += text::Format(i ? ",%d" : "%d", static_cast<int>(items[i]));
+    return out + "]";
+}
+
+template <class Spec>
+OpenedTemplate Make(const FileLayout& layout)
+{
+    OpenedTemplate opened;
+    opened.spec = std::make_unique<Spec>();
+    opened.layout = &layout;
+    return opened;
+}
+
+template <class Spec>
+bool LoadKind(OpenedTemplate& opened, std::string_view bytes, const CString& path, CString& error)
+{
+    auto& spec = static_cast<Spec&>(*opened.spec);
+    if (spec.LoadFromMemory(bytes, path))
+        return true;
+    error = spec.LastError();
+    return false;
+}
+
+} // namespace
+
+OpenedTemplate NewTemplate(const CString& kind)
+{
+    if (kind == AsciiFileLayout().kind)
+        return Make<CAsciiSpecification>(AsciiFileLayout());
+    if (kind == ExcelFileLayout().kind)
+        return Make<CExcelSpecification>(ExcelFileLayout());
+    return {};
+}
+
+OpenedTemplate OpenTemplateFile(const CString& path, CString& error)
+{
+    std::string bytes;
+    if (!ReadFileBytes(path, bytes, error))
+        return {};
+    pugi::xml_document document;
+    if (!ParseDocument(bytes, path, document, error))
+        return {};
+    CString query = CString("//") + AsciiFileLayout().root + " | //" + ExcelFileLayout().root;
+    pugi::xml_node root = document.select_node(query.c_str()).node();
+    if (!root) {
+        error = path + ": not a template file: no element " + AsciiFileLayout().root + " or " +
+                ExcelFileLayout().root;
+        return {};
+    }
+    bool ascii = std::strcmp(root.name(), AsciiFileLayout().root) == 0;
+    OpenedTemplate opened = NewTemplate(ascii ? AsciiFileLayout().kind : ExcelFileLayout().kind);
+    bool loaded = ascii ? LoadKind<CAsciiSpecification>(opened, bytes, path, error)
+                        : LoadKind<CExcelSpecification>(opened, bytes, path, error);
+    if (!loaded)
+        return {};
+    return opened;
+}
+
+void WriteTemplateText(CSpecification& spec, const FileLayout& layout, std::ostream& out)
+{
+    out << "Kind: " << layout.kind << "\n";
+    for (const AttributeRule* rule : ReportedValues()) {
+        out << rule->name << ": ";
+        switch (rule->form) {
+        case ValueForm::Text: out << QuotedText(*rule->text(spec)); break;
+        case ValueForm::SelItems: {
+            CString items;
+            CSpecification::FormatSelItems(spec.m_arrSelItems, items);
+            out << items;
+            break;
+        }
+        default: out << *rule->number(spec); break;
+        }
+        out << "\n";
+    }
+    const auto& items = spec.m_DataDesc.m_vecItemDefs;
+    out << "Items: " << items.size() << "\n";
+    for (size_t i = 0; i < items.size(); ++i)
+        out << "  " << i + 1 << ": title " << QuotedText(items[i].m_strTitle) << ", type "
+            << QuotedText(items[i].m_strType) << ", unit " << QuotedText(items[i].m_strUnit) << ", value type "
+            << QuotedText(items[i].m_strValueType) << "\n";
+}
+
+void WriteTemplateJson(CSpecification& spec, const FileLayout& layout, std::ostream& out)
+{
+    out << "{\"kind\":" << JsonString(layout.kind) << ",\"values\":{";
+    bool first = true;
+    for (const AttributeRule* rule : ReportedValues()) {
+        out << (first ? "" : ",") << JsonString(rule->name) << ":";
+        first = false;
+        switch (rule->form) {
+        case ValueForm::Text: out << JsonString(*rule->text(spec)); break;
+        case ValueForm::SelItems: out << SelectedItemsJson(spec.m_arrSelItems); break;
+        default: out << *rule->number(spec); break;
+        }
+    }
+    out << "},\"items\":[";
+    const auto& items = spec.m_DataDesc.m_vecItemDefs;
+    for (size_t i = 0; i < items.size(); ++i)
+        out << (i ? "," : "") << "{\"title\":" << JsonString(items[i].m_strTitle)
+            << ",\"type\":" << JsonString(items[i].m_strType) << ",\"unit\":" << JsonString(items[i].m_strUnit)
+            << ",\"valueType\":" << JsonString(items[i].m_strValueType) << "}";
+    out << "]}\n";
+}
+
+} // namespace tmplfile
