@@ -1,0 +1,80 @@
+#pragma once
+// Reading workbook files into a stream of cells: .xlsx through liborcus, .xls through FreeXL,
+// chosen by the file's content. Every failure is an AutomationError naming the file and why.
+#include "platform/spreadsheet/NumberFormat.h"
+#include "platform/spreadsheet/Spreadsheet.h"
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace sheet {
+
+// Bounds that keep a damaged or hostile file from costing unbounded memory or time.
+struct ImportLimits {
+    std::uint64_t maxFileBytes = 512ull << 20;
+    std::uint64_t maxEntryBytes = 512ull << 20;       // one uncompressed part of an .xlsx
+    std::uint64_t maxUncompressedBytes = 1024ull << 20; // all parts together
+    std::uint64_t maxCompressionRatio = 400;          // beyond this a large part is a zip bomb
+    std::uint64_t maxXlsSheetCells = 4u << 20;        // rows x columns of one .xls sheet
+    int maxColumns = 16384;                           // XFD
+    int maxRows = 1048576;
+};
+
+struct ImportedCell {
+    int row = 0;    // from 1
+    int column = 0; // from 1
+    Variant::Type type = Variant::Empty; // Empty: a blank cell that only carries formatting
+    double number = 0.0;
+    std::string text;
+    unsigned style = 0; // index into the StyleTable
+};
+
+// The number format of every cell style of a workbook.
+class StyleTable {
+public:
+    StyleTable();
+    const NumberFormat& Format(unsigned style) const;
+    unsigned Add(NumberFormat format);
+    // Sets style `index`, growing the table with General styles as needed.
+    void Set(unsigned index, NumberFormat format);
+    void Clear();
+    size_t Size() const { return m_formats.size(); }
+
+private:
+    std::vector<NumberFormat> m_formats; // style 0 is always General
+};
+
+class ImportSink {
+public:
+    virtual ~ImportSink() = default;
+    virtual void AddSheet(const std::string& name) = 0;
+    // Cells of one sheet arrive in file order (rows ascending in well-formed files).
+    virtual void AddCell(int sheet, const ImportedCell& cell) = 0; // sheet from 0
+    // No more cells of `sheet` follow.
+    virtual void EndSheet(int sheet) = 0;
+};
+
+enum class WorkbookKind { Xlsx, Xls };
+
+// Tells the format by the first bytes; throws AutomationError when it is neither.
+WorkbookKind DetectWorkbookKind(const std::string& path);
+
+// Reads the whole workbook into `sink` and its cell styles into `styles`. For .xlsx the styles
+// are complete only when the reading ends (cells arrive first); for .xls before the first cell.
+// A sink may stop the reading early by throwing StopImport.
+void ImportWorkbook(const std::string& path, ImportSink& sink, StyleTable& styles,
+                    const ImportLimits& limits = ImportLimits());
+
+struct StopImport {};
+
+// Internal entry points of ImportWorkbook, one per format.
+void ImportXlsx(const std::string& path, ImportSink& sink, StyleTable& styles, const ImportLimits& limits);
+void ImportXls(const std::string& path, ImportSink& sink, StyleTable& styles, const ImportLimits& limits);
+// Throws when the zip's directory declares parts beyond the limits (zip bombs, huge sheets).
+void CheckZipDirectory(const std::string& path, const ImportLimits& limits);
+
+// "Cannot open <path>: <why>"
+AutomationError OpenError(const std::string& path, const std::string& why);
+
+} // namespace sheet

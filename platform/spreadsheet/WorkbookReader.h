@@ -1,0 +1,48 @@
+#pragma once
+// Reads whole sheets of a workbook row by row, for conversions: each row's cells come with their
+// raw value and the text the sheet displays. Memory stays bounded by one row plus what the file
+// library needs for the sheet (.xlsx: the unpacked sheet part; .xls: FreeXL's cell table).
+#include "platform/spreadsheet/Spreadsheet.h"
+#include "platform/spreadsheet/WorkbookImport.h"
+
+#include <functional>
+#include <string>
+#include <vector>
+
+namespace sheet {
+
+struct RowCell {
+    int column = 0; // from 1
+    Variant value;  // Number (dates as serial numbers), Text, Boolean or Error
+    std::string text;
+};
+
+class WorkbookReader {
+public:
+    // Receives the row number (from 1) and the row's non-blank cells in column order; returns
+    // false to stop reading. Rows without cells are not reported.
+    using RowCallback = std::function<bool(int row, const std::vector<RowCell>& cells)>;
+
+    explicit WorkbookReader(ImportLimits limits = ImportLimits()) : m_limits(limits) {}
+
+    // Opens `path` (the content tells .xlsx from .xls) and reads its sheet names and cell
+    // styles. This reads the whole file once, holding no cells.
+    bool Open(const std::string& path);
+    int SheetCount() const { return static_cast<int>(m_sheetNames.size()); }
+    const std::vector<std::string>& SheetNames() const { return m_sheetNames; }
+
+    // Reads sheet `sheet` (from 1) from its first row to its last, or until `onRow` says stop.
+    bool ReadRows(int sheet, const RowCallback& onRow);
+
+    // Why the last Open or ReadRows failed: names the file and the cause.
+    const std::string& Error() const { return m_error; }
+
+private:
+    ImportLimits m_limits;
+    std::string m_path;
+    std::vector<std::string> m_sheetNames;
+    StyleTable m_styles;
+    std::string m_error;
+};
+
+} // namespace sheet
