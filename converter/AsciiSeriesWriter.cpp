@@ -54,7 +54,9 @@ Status AsciiSeriesWriter::Begin(const std::string& path, const SeriesHeader& hea
         };
         if (i > 0)
             head += '\t';
-        head += part(type, "[]:") + "[" + part(item.unit, "[]:") + "]:" + part(valueType, "[]:");
+        // "[]" would read back as the text after it, so an empty unit is written as "Undefined".
+        const std::string unit = item.unit.empty() ? "Undefined" : item.unit;
+        head += part(type, "[]:") + "[" + part(unit, "[]:") + "]:" + part(valueType, "[]:");
     }
     head += '\n';
     head += CleanField(header.timeTitle.empty() ? "Date/time" : header.timeTitle);

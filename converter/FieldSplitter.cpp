@@ -113,7 +113,7 @@ std::string_view FieldSplitter::TakeField(int& pos, bool& skipAfter)
     const size_t close = m_line.find('"', open);
     const size_t fieldEnd = close == std::string_view::npos ? m_line.size() : close;
     std::string_view field = m_line.substr(open, fieldEnd - open);
-    pos = static_cast<int>(close == std::string_view::npos ? m_line.size() : close + 1);
+    pos = static_cast<int>(close == std::string_view::npos ? m_line.size() + 1 : close + 1);
     if (close != std::string_view::npos && DelimiterAt(pos)) {
         ++pos;
         skipAfter = true;

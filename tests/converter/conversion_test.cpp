@@ -1,0 +1,201 @@
+// Whole conversions through the library: round trips between formats, item selection, the folder
+// job with a misfit file, and outputs that are never left half-written.
+#include "TestFiles.h"
+#include "converter/ConversionJob.h"
+#include "converter/Converter.h"
+#include "converter/StampText.h"
+#include "templates/AsciiSpecification.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+
+using namespace converter;
+namespace fs = std::filesystem;
+
+namespace {
+
+const std::string kSample = "Rainfall[mm]:Accumulated\tWater Level[m]:Instantaneous\tUndefined[Undefined]:Instantaneous\n"
+                            "Date/time\tRain\tLevel\tOther\n"
+                            "2020/01/01 00:00:00\t0.1\t1.25\t7\n"
+                            "2020/01/01 00:15:00\t\t1.5\t8\n"
+                            "2020/01/01 00:30:00\t0.3\t\t9\n";
+
+FileReport Convert(Format in, const std::string& input, Format out, const std::string& output, CUIntArray items = {})
+{
+    Status status;
+    std::unique_ptr<CSpecification> spec = LoadTemplate(in, "", status);
+    FileJob job{in, input, spec.get(), std::move(items), out, output, "Title"};
+    return ConvertFile(job);
+}
+
+std::vector<std::string> LeftoverTemporaries(const std::string& folder)
+{
+    std::vector<std::string> names;
+    for (const auto& entry : fs::directory_iterator(folder))
+        if (entry.path().filename().string().find(".part-") != std::string::npos)
+            names.push_back(entry.path().string());
+    return names;
+}
+
+TEST(Conversion, TextThroughRbx0AndBackKeepsEverything)
+{
+    convtest::ScratchFolder folder;
+    convtest::WriteFile(folder.Path("in.txt"), kSample);
+    FileReport there = Convert(Format::Ascii, folder.Path("in.txt"), Format::Rbx0, folder.Path("mid.rbx0"));
+    ASSERT_TRUE(there.converted) << there.problem.Describe();
+    EXPECT_EQ(there.rows, 3u);
+    FileReport back = Convert(Format::Rbx0, folder.Path("mid.rbx0"), Format::Ascii, folder.Path("out.txt"));
+    ASSERT_TRUE(back.converted) << back.problem.Describe();
+    std::string expected = kSample;
+    expected.replace(expected.find("Date/time"), 9, "Date/time"); // the rbx0 file names its time column so too
+    EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")), expected);
+    EXPECT_TRUE(LeftoverTemporaries(folder.Root()).empty());
+}
+
+TEST(Conversion, TextToTextWithSelectionReordersAndNotesMissingItems)
+{
+    convtest::ScratchFolder folder;
+    convtest::WriteFile(folder.Path("in.txt"), kSample);
+    FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt"), {2, 0, 9});
+    ASSERT_TRUE(report.converted) << report.problem.Describe();
+    EXPECT_EQ(report.itemsWritten, 2u);
+    ASSERT_EQ(report.notes.size(), 1u);
+    EXPECT_NE(report.notes[0].find("selected item 9"), std::string::npos);
+    EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")),
+              "Undefined[Undefined]:Instantaneous\tRainfall[mm]:Accumulated\n"
+              "Date/time\tOther\tRain\n"
+              "2020/01/01 00:00:00\t7\t0.1\n"
+              "2020/01/01 00:15:00\t8\t\n"
+              "2020/01/01 00:30:00\t9\t0.3\n");
+}
+
+TEST(Conversion, XlsxOutputIsAWorkbook)
+{
+    convtest::ScratchFolder folder;
+    convtest::WriteFile(folder.Path("in.txt"), kSample);
+    FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Excel, folder.Path("out.xlsx"));
+    ASSERT_TRUE(report.converted) << report.problem.Describe();
+    EXPECT_EQ(convtest::ReadFile(folder.Path("out.xlsx")).substr(0, 2), "PK");
+}
+
+TEST(Conversion, FailureLeavesTheOldOutputAndNoTemporary)
+{
+    convtest::ScratchFolder folder;
+    std::string broken = kSample + "2020/01/01 00:45:00\t1\n"; // one field short
+    convtest::WriteFile(folder.Path("in.txt"), broken);
+    for (Format out : {Format::Ascii, Format::Rbx0, Format::Excel}) {
+        const std::string output = folder.Path(std::string("out") + OutputExtension(out));
+        convtest::WriteFile(output, "old content");
+        FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), out, output);
+        ASSERT_FALSE(report.converted) << FormatName(out);
+        EXPECT_EQ(report.problem.line, 6);
+        EXPECT_EQ(convtest::ReadFile(output), "old content") << FormatName(out);
+    }
+    EXPECT_TRUE(LeftoverTemporaries(folder.Root()).empty());
+}
+
+TEST(Conversion, DecreasingStampsCannotGoToRbx0)
+{
+    convtest::ScratchFolder folder;
+    convtest::WriteFile(folder.Path("in.txt"), "Undefined[Undefined]:Instantaneous\nT\tA\n2020/01/01 00:00:01\t1\n2020/01/01 00:00:00\t2\n");
+    FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Rbx0, folder.Path("out.rbx0"));
+    ASSERT_FALSE(report.converted);
+    EXPECT_EQ(report.problem.line, 4);
+    EXPECT_FALSE(fs::exists(folder.Path("out.rbx0")));
+}
+
+TEST(Conversion, TruncatedRbx0FailsWithoutOutput)
+{
+    convtest::ScratchFolder folder;
+    convtest::WriteFile(folder.Path("in.txt"), kSample);
+    ASSERT_TRUE(Convert(Format::Ascii, folder.Path("in.txt"), Format::Rbx0, folder.Path("good.rbx0")).converted);
+    const std::string bytes = convtest::ReadFile(folder.Path("good.rbx0"));
+    for (size_t keep : {size_t{0}, size_t{10}, bytes.size() / 2, bytes.size() - 3}) {
+        convtest::WriteFile(folder.Path("cut.rbx0"), bytes.substr(0, keep));
+        FileReport report = Convert(Format::Rbx0, folder.Path("cut.rbx0"), Format::Ascii, folder.Path("out.txt"));
+        EXPECT_FALSE(report.converted) << keep;
+        EXPECT_FALSE(report.problem.message.empty());
+        EXPECT_FALSE(fs::exists(folder.Path("out.txt"))) << keep;
+    }
+}
+
+TEST(Conversion, CanConvertJudgesExtensionTemplateAndContent)
+{
+    convtest::ScratchFolder folder;
+    convtest::WriteFile(folder.Path("good.txt"), kSample);
+    convtest::WriteFile(folder.Path("good.dat"), kSample);
+    convtest::WriteFile(folder.Path("noext"), kSample);
+    convtest::WriteFile(folder.Path("binary"), std::string("a\0b", 3));
+    convtest::WriteFile(folder.Path("misfit.txt"), "just words\n");
+    std::string reason;
+    EXPECT_TRUE(CanConvert(Format::Ascii, folder.Path("good.txt"), "", &reason)) << reason;
+    EXPECT_TRUE(CanConvert(Format::Ascii, folder.Path("noext"), "", &reason)) << reason;
+    EXPECT_FALSE(CanConvert(Format::Ascii, folder.Path("good.dat"), "", &reason));
+    EXPECT_FALSE(CanConvert(Format::Ascii, folder.Path("binary"), "", &reason));
+    EXPECT_FALSE(CanConvert(Format::Ascii, folder.Path("misfit.txt"), "", &reason));
+    EXPECT_NE(reason.find("misfit.txt"), std::string::npos);
+    EXPECT_FALSE(CanConvert(Format::Ascii, folder.Path("good.txt"), folder.Path("no-template.xml"), &reason));
+}
+
+TEST(ConversionJob, FolderConvertsTheRestAndReportsTheMisfit)
+{
+    convtest::ScratchFolder folder;
+    fs::create_directories(folder.Path("in"));
+    fs::create_directories(folder.Path("out"));
+    for (const char* name : {"a.txt", "b.csv", "c.tab"})
+        convtest::WriteFile(folder.Path(std::string("in/") + name), kSample);
+    convtest::WriteFile(folder.Path("in/misfit.txt"), "Undefined[Undefined]:Instantaneous\nT\tA\n2020/01/01\n");
+    convtest::WriteFile(folder.Path("in/ignored.dat"), "whatever");
+    JobSetup setup;
+    setup.inputType = 2;
+    setup.inputFormat = 2;
+    setup.inputFolder = folder.Path("in");
+    setup.outputFormat = 1;
+    setup.outputFolder = folder.Path("out");
+    ConversionLog log(folder.Path("run.log"), nullptr);
+    EXPECT_EQ(RunJob(setup, log, {2, nullptr}), kExitSomeFailed);
+    for (const char* name : {"a.rbx0", "b.rbx0", "c.rbx0"})
+        EXPECT_TRUE(fs::exists(folder.Path(std::string("out/") + name))) << name;
+    EXPECT_FALSE(fs::exists(folder.Path("out/misfit.rbx0")));
+    const std::string text = convtest::ReadFile(folder.Path("run.log"));
+    EXPECT_NE(text.find("SKIPPED " + folder.Path("in/misfit.txt") + ": the template does not fit: " +
+                        folder.Path("in/misfit.txt") + ":3:"),
+              std::string::npos)
+        << text;
+    EXPECT_NE(text.find("3 converted, 1 skipped or failed"), std::string::npos) << text;
+    EXPECT_EQ(text.find("ignored.dat"), std::string::npos) << text;
+}
+
+TEST(ConversionJob, SetupProblemsAndLogPlaces)
+{
+    JobSetup setup;
+    setup.inputFormat = 7;
+    EXPECT_NE(CheckJobSetup(setup).find("input format 7"), std::string::npos);
+    setup.inputFormat = 2;
+    EXPECT_NE(CheckJobSetup(setup).find("no input file"), std::string::npos);
+    ConversionLog quiet({}, nullptr);
+    EXPECT_EQ(RunJob(setup, quiet), kExitSetup);
+
+    convtest::ScratchFolder folder;
+    EXPECT_EQ(LogPathFor(""), "");
+    EXPECT_EQ(LogPathFor(folder.Root()), folder.Path("Velmora.log"));
+    EXPECT_EQ(LogPathFor(folder.Root() + "/new/"), folder.Path("new/Velmora.log"));
+    EXPECT_EQ(LogPathFor(folder.Path("my.log")), folder.Path("my.log"));
+}
+
+TEST(ConversionJob, SingleFileFailureExitsNonzero)
+{
+    convtest::ScratchFolder folder;
+    convtest::WriteFile(folder.Path("in.txt"), "nothing useful");
+    JobSetup setup;
+    setup.inputFormat = 2;
+    setup.inputFile = folder.Path("in.txt");
+    setup.outputFormat = 2;
+    setup.outputFile = folder.Path("out.txt");
+    ConversionLog log(folder.Path("log.txt"), nullptr);
+    EXPECT_EQ(RunJob(setup, log), kExitSomeFailed);
+    EXPECT_FALSE(fs::exists(folder.Path("out.txt")));
+}
+
+} // namespace

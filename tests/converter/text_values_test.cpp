@@ -1,0 +1,147 @@
+// Stamps and numbers as text: the compiled date format against the reference readers, the output
+// form of stamps, and values read with each decimal separator.
+#include "converter/NumberText.h"
+#include "converter/StampText.h"
+#include "parsers/DateTimeText.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <random>
+
+using namespace converter;
+
+namespace {
+
+void ExpectSameAsReference(const std::string& text, const std::string& format)
+{
+    COleDateTime reference;
+    const bool referenceOk = ParseDateTimeText(text, format, reference);
+    StampFields fields;
+    const bool ok = DateFormat(format).Read(text, fields);
+    ASSERT_EQ(ok, referenceOk) << "[" << text << "] with [" << format << "]";
+    if (!ok)
+        return;
+    const std::optional<Stamp> stamp = StampFromFields(fields);
+    ASSERT_EQ(stamp.has_value(), reference.IsValid()) << "[" << text << "] with [" << format << "]";
+    if (stamp) {
+        EXPECT_EQ(*stamp, reference.ToUnixSeconds()) << "[" << text << "] with [" << format << "]";
+    }
+
+    CDateFields date;
+    StampFields dateFields;
+    dateFields.year = 100;
+    ASSERT_EQ(DateFormat(format, DateFormat::Reads::Date).Read(text, dateFields), ParseDateText(text, format, date));
+    CTimeFields time{1, 2, 3};
+    StampFields timeFields;
+    timeFields.hour = 1, timeFields.minute = 2, timeFields.second = 3;
+    const bool timeOk = ParseTimeText(text, format, time);
+    ASSERT_EQ(DateFormat(format, DateFormat::Reads::Time).Read(text, timeFields), timeOk);
+    if (timeOk) {
+        EXPECT_EQ(timeFields.hour * 3600 + timeFields.minute * 60 + timeFields.second,
+                  time.hour * 3600 + time.minute * 60 + time.second);
+    }
+}
+
+TEST(DateFormat, AgreesWithTheReferenceReaders)
+{
+    const std::pair<const char*, const char*> cases[] = {
+        {"2021-03-04T05:06:07", "YYYY-MM-DDTHH:mm:ss"},
+        {"2021/02/30", "YYYY/MM/DD"},
+        {"2021/13/01", "YYYY/MM/DD"},
+        {"21/02/03", "YY/MM/DD"},
+        {"2021/03", "YYYY/MM/DD HH:mm"},
+        {"10:20", "HH:MM"},
+        {"2020/01/01 12:00:00", "YYYY/MM/DD HH:mm:ss"},
+        {"08h:30", "HH:mm"},
+        {"x/01/01", "YYYY/MM/DD"},
+        {"2020/01/01 24:00:00", "YYYY/MM/DD HH:mm:ss"},
+        {"-5/1/1", "YYYY/MM/DD"},
+        {"99999999999/1/1", "YYYY/MM/DD"},
+        {"01.02.2020 1:2:3", "DD.MM.YYYY H:m:s"},
+        {"", "YYYY"},
+        {"2020 x 5", "YYYY q DD"},
+    };
+    for (const auto& [text, format] : cases)
+        ExpectSameAsReference(text, format);
+}
+
+TEST(DateFormat, AgreesWithTheReferenceOnRandomTexts)
+{
+    std::mt19937 random(7);
+    const std::string alphabet = "0123456789/ :-.T|x+";
+    const char* formats[] = {"YYYY/MM/DD HH:mm:ss", "DD.MM.YYYY", "HH:mm", "YYYY-MM-DDTHH:mm:ss", "y m d h M s q"};
+    for (int n = 0; n < 5000; ++n) {
+        std::string text;
+        const size_t length = random() % 22;
+        for (size_t i = 0; i < length; ++i)
+            text += alphabet[random() % alphabet.size()];
+        ExpectSameAsReference(text, formats[random() % std::size(formats)]);
+    }
+}
+
+TEST(DateFormat, ExtraSeparatorsSplitJoinedFields)
+{
+    StampFields fields;
+    ASSERT_TRUE(DateFormat("YYYY/MM/DD,HH:mm:ss", DateFormat::Reads::DateTime, ",").Read("2020/05/06 07:08:09", fields));
+    EXPECT_EQ(FormatStamp(*StampFromFields(fields)), "2020/05/06 07:08:09");
+}
+
+TEST(StampText, FormatsAndConvertsSerialDays)
+{
+    StampFields f{1999, 12, 31, 23, 59, 58};
+    const Stamp stamp = *StampFromFields(f);
+    EXPECT_EQ(FormatStamp(stamp), "1999/12/31 23:59:58");
+    EXPECT_EQ(*StampFromSerialDays(StampToSerialDays(stamp)), stamp);
+    EXPECT_DOUBLE_EQ(StampToSerialDays(*StampFromFields({1899, 12, 30, 12, 0, 0})), 0.5);
+    EXPECT_EQ(FormatStamp(*StampFromFields({1800, 1, 1, 0, 0, 0})), "1800/01/01 00:00:00");
+    EXPECT_FALSE(StampFromFields({2021, 2, 29, 0, 0, 0}).has_value());
+    EXPECT_TRUE(StampFromFields({2020, 2, 29, 0, 0, 0}).has_value());
+    EXPECT_FALSE(StampFromSerialDays(std::nan("")).has_value());
+}
+
+TEST(NumberReader, ReadsWithTheTemplateSeparator)
+{
+    struct Case {
+        const char* separator;
+        const char* field;
+        ValueText expected;
+        double value;
+    } cases[] = {
+        {".", "3.5", ValueText::Number, 3.5},
+        {".", " -2.25e3 ", ValueText::Number, -2250},
+        {".", "+7", ValueText::Number, 7},
+        {".", "3,5", ValueText::WrongSeparator, 0},
+        {".", "", ValueText::Empty, 0},
+        {".", "   ", ValueText::Empty, 0},
+        {".", "abc", ValueText::NotANumber, 0},
+        {".", "1.5x", ValueText::NotANumber, 0},
+        {".", "1e999", ValueText::NotANumber, 0},
+        {",", "3,5", ValueText::Number, 3.5},
+        {",", "3.5", ValueText::WrongSeparator, 0},
+        {",", "-0,125", ValueText::Number, -0.125},
+        {"", "4", ValueText::Number, 4},
+    };
+    for (const Case& c : cases) {
+        double value = 0;
+        EXPECT_EQ(NumberReader(c.separator).Read(c.field, value), c.expected) << c.separator << " [" << c.field << "]";
+        if (c.expected == ValueText::Number) {
+            EXPECT_DOUBLE_EQ(value, c.value) << c.field;
+        }
+    }
+}
+
+TEST(FormatValue, ShortestTextReadsBackExactly)
+{
+    for (double value : {0.1, 1.0 / 3.0, -2.5e-300, 123456789.125, 1e21, -0.0}) {
+        char buffer[40];
+        const std::string text(buffer, FormatValue(value, buffer));
+        double back = 0;
+        ASSERT_EQ(NumberReader(".").Read(text, back), ValueText::Number) << text;
+        EXPECT_EQ(back, value) << text;
+    }
+    char buffer[40];
+    EXPECT_EQ(FormatValue(kMissing, buffer), buffer);
+}
+
+} // namespace
