@@ -1,0 +1,55 @@
+#include "parsers/ParserFactory.h"
+
+#include "parsers/AsciiFilePreviewParser.h"
+#include "parsers/RbxPreviewFileParser.h"
+#include "platform/system/Text.h"
+#include "templates/AsciiSpecification.h"
+
+#include <exception>
+
+int FormatFromName(const CString& name)
+{
+    if (text::EqualsNoCase(name, "rbx0"))
+        return kFormatRbx0;
+    if (text::EqualsNoCase(name, "ascii"))
+        return kFormatAscii;
+    if (text::EqualsNoCase(name, "excel"))
+        return kFormatExcel;
+    return 0;
+}
+
+std::unique_ptr<CSpecification> MakeSpecification(int format)
+{
+    switch (format) {
+    case kFormatAscii:
+        return std::make_unique<CAsciiSpecification>();
+    default:
+        return nullptr;
+    }
+}
+
+std::unique_ptr<CFilePreviewParser> MakeParser(int format)
+{
+    switch (format) {
+    case kFormatRbx0:
+        return std::make_unique<CRbxPreviewFileParser>();
+    case kFormatAscii:
+        return std::make_unique<CAsciiFilePreviewParser>();
+    default:
+        return nullptr;
+    }
+}
+
+int ParseGuarded(CFilePreviewParser& parser, const CString& path, CString* error)
+{
+    try {
+        return parser.Parse(path);
+    } catch (const std::exception& exception) {
+        if (error)
+            *error = exception.what();
+    } catch (...) {
+        if (error)
+            *error = "the parser stopped with an unknown error";
+    }
+    return 0;
+}
