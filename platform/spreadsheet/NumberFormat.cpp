@@ -396,7 +396,7 @@ NumberLayout LayoutOf(const Section& section)
             layout.exponentToken = static_cast<int>(i);
             break;
         case Kind::Comma:
-            if (region == Integer)
+            if (region != Exponent)
                 commas.push_back(i);
             break;
         case Kind::Percent:
@@ -406,12 +406,14 @@ NumberLayout LayoutOf(const Section& section)
             break;
         }
     }
-    // A comma between digit placeholders groups thousands; one after the last scales by 1000.
+    // A comma between integer placeholders groups thousands; one after the last placeholder
+    // (before any exponent) divides by 1000.
     size_t lastInteger = layout.integerDigits.empty() ? 0 : layout.integerDigits.back();
+    size_t lastDigit = layout.fractionDigits.empty() ? lastInteger : layout.fractionDigits.back();
     for (size_t comma : commas) {
         if (!layout.integerDigits.empty() && comma < lastInteger && comma > layout.integerDigits.front())
             layout.grouping = true;
-        else if (!layout.integerDigits.empty() && comma > lastInteger)
+        else if ((!layout.integerDigits.empty() || !layout.fractionDigits.empty()) && comma > lastDigit)
             ++layout.thousandsScale;
     }
     return layout;
@@ -575,7 +577,7 @@ bool RenderFraction(const Section& section, double value, std::string& out)
     const auto& t = section.tokens;
     size_t slash = t.size();
     for (size_t i = 0; i < t.size(); ++i)
-        if (t[i].kind == Kind::Literal && t[i].text.find('/') != std::string::npos) {
+        if (t[i].kind == Kind::Literal && t[i].text[0] == '/') {
             slash = i;
             break;
         }
@@ -746,7 +748,14 @@ std::string DateTimePiece(const Token& token, const Moment& m, bool twelveHour)
     case Kind::ElapsedSeconds:
         return Padded(((m.days * 24 + m.hour) * 60 + m.minute) * 60 + m.second, token.width);
     case Kind::Literal:
+    case Kind::Digit:
         return token.text;
+    case Kind::Comma:
+        return ",";
+    case Kind::Point:
+        return ".";
+    case Kind::Percent:
+        return "%";
     default:
         return std::string();
     }
