@@ -1,0 +1,94 @@
+// Runs `velmora preview` on the example files and on bad arguments, as a user would.
+#include "ParserTestSupport.h"
+#include "templates/AsciiSpecification.h"
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <cstdio>
+#include <string>
+#include <sys/wait.h>
+
+namespace {
+
+struct CommandRun {
+    int status = -1;
+    std::string out;
+};
+
+CommandRun Velmora(const std::string& arguments)
+{
+    const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora preview " + arguments + " 2>/dev/null";
+    CommandRun run;
+    FILE* pipe = ::popen(command.c_str(), "r");
+    if (!pipe)
+        return run;
+    std::array<char, 4096> buffer;
+    size_t got;
+    while ((got = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0)
+        run.out.append(buffer.data(), got);
+    const int status = ::pclose(pipe);
+    run.status = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    return run;
+}
+
+std::string Example(const std::string& relative) { return std::string(VELMORA_SOURCE_DIR) + "/examples/" + relative; }
+
+TEST(PreviewCommand, AsciiExampleAsJson)
+{
+    const CommandRun run = Velmora(Example("data/river_gauge.txt") + " --format ascii --template " +
+                            Example("templates/river_gauge.xml") + " --items 1 --json");
+    ASSERT_EQ(run.status, 0) << run.out;
+    EXPECT_NE(run.out.find("{\"ok\":true,"), std::string::npos);
+    EXPECT_NE(run.out.find("\"itemNames\":[\"Time\",\"Level\",\"Flow\"]"), std::string::npos);
+    EXPECT_NE(run.out.find("\"previewTitles\":[\"Time\",\"Flow\"]"), std::string::npos);
+    EXPECT_NE(run.out.find("[\"2024/03/01 15:00:00\",\"\"]"), std::string::npos); // -999 is the delete value
+    EXPECT_NE(run.out.find("\"Time    Level    Flow\""), std::string::npos);       // raw line, tabs opened up
+}
+
+TEST(PreviewCommand, FailedParseReportsItsMessages)
+{
+    parsertest::ScratchFolder folder;
+    const std::string file = folder.Write("bad.txt", "h\nTime\tA\n2020/01/01 00:00:00\t3,5\n");
+    CAsciiSpecification spec;
+    spec.m_DataDesc.m_nUnitTypeOption = 0;
+    spec.m_DataDesc.m_nUnitOption = 0;
+    spec.m_DataDesc.m_nValueTypeOption = 0;
+    ASSERT_EQ(spec.Save(folder.Path("t.xml")), 1);
+    const CommandRun run = Velmora(file + " --format ascii --json --template " + folder.Path("t.xml"));
+    EXPECT_EQ(run.status, 1);
+    EXPECT_NE(run.out.find("{\"ok\":false,"), std::string::npos) << run.out;
+    const std::string message = "{\"text\":\"" + res::LoadString(res::IDS_DECIMAL_SEPARATOR_MISMATCH) + "\",\"caption\":\"\"}";
+    EXPECT_NE(run.out.find("\"messages\":[" + message + "]"), std::string::npos) << run.out;
+    EXPECT_NE(run.out.find("[\"\",\"Undefined\"]"), std::string::npos); // the rows read before the failure stay
+}
+
+TEST(PreviewCommand, RbxExampleAsTable)
+{
+    const CommandRun run = Velmora(Example("data/river_gauge.rbx0") + " --format rbx0");
+    ASSERT_EQ(run.status, 0);
+    EXPECT_EQ(run.out.find("Input file"), std::string::npos); // rbx0 files have no raw lines
+    EXPECT_NE(run.out.find("Date/time"), std::string::npos);
+    EXPECT_NE(run.out.find("2024-03-03 23:00:00"), std::string::npos); // the last of 72 hourly steps
+}
+
+TEST(PreviewCommand, BadUsage)
+{
+    const std::string file = Example("data/river_gauge.txt");
+    for (const std::string& arguments :
+         {std::string("--format ascii"), file, file + " --format xls", file + " --format ascii --items 2,x",
+          file + " --format ascii --bogus", Example("data/river_gauge.rbx0") + " --format rbx0 --template t.xml",
+          file + " --format"}) {
+        EXPECT_EQ(Velmora(arguments).status, 2) << arguments;
+    }
+    EXPECT_EQ(Velmora("--help").status, 0);
+}
+
+TEST(PreviewCommand, UnloadableTemplateFails)
+{
+    parsertest::ScratchFolder folder;
+    const std::string tmpl = folder.Write("broken.xml", "<not a template");
+    EXPECT_EQ(Velmora(Example("data/river_gauge.txt") + " --format ascii --template " + tmpl).status, 1);
+}
+
+} // namespace
