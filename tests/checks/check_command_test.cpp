@@ -1,0 +1,194 @@
+// `velmora check DOC` run as a program on stored setups: one verdict line per check, exit status 0
+// only when every check passes.
+#include "tests/checks/CheckTestSupport.h"
+
+#include "converter/AsciiSeriesWriter.h"
+#include "converter/RbxSeriesWriter.h"
+#include "resources/StringTable.h"
+#include "templates/AsciiSpecification.h"
+
+#include <gtest/gtest.h>
+
+#include <sys/wait.h>
+
+using checktest::ScopedEnv;
+using checktest::TempFolder;
+
+namespace {
+
+struct Outcome {
+    int status = -1;
+    std::string output;
+};
+
+Outcome RunVelmora(const std::string& arguments)
+{
+    const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora " + arguments + " 2>/dev/null";
+    Outcome outcome;
+    FILE* pipe = ::popen(command.c_str(), "r");
+    if (!pipe)
+        return outcome;
+    char buffer[512];
+    while (size_t n = std::fread(buffer, 1, sizeof buffer, pipe))
+        outcome.output.append(buffer, n);
+    const int raw = ::pclose(pipe);
+    outcome.status = WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
+    return outcome;
+}
+
+void WriteGauge(converter::SeriesWriter& writer, const std::string& path)
+{
+    converter::SeriesHeader header;
+    header.items = {{"Level", "Water level", "m", "Instantaneous"}};
+    ASSERT_TRUE(writer.Begin(path, header, "Gauge").ok());
+    for (int step = 0; step < 2; ++step)
+        ASSERT_TRUE(writer.Write({1609459200 + 600 * step, {0.5 * step}}).ok());
+    ASSERT_TRUE(writer.Finish().ok());
+}
+
+struct StoredSetup {
+    int type = 1;
+    int format = 2;
+    std::string file, folder;
+    int option = 1;
+    std::string templateName;
+    int outputFormat = 1;
+    std::string outputFile, outputFolder;
+};
+
+std::string Document(const StoredSetup& s)
+{
+    auto quoted = [](const std::string& text) { return "\"" + text + "\""; };
+    return "wpx 1\ntarget \"OkaToolbox\"\n section \"Setup\"\n  Name = \"Gauge\"\n  section \"INPUT\"\n"
+           "   Type = " + std::to_string(s.type) + "\n   File_format = " + std::to_string(s.format) +
+           "\n   File_name = file " + quoted(s.file) + "\n   Folder_name = file " + quoted(s.folder) +
+           "\n  end\n  section \"TEMPLATE\"\n   Template_option = " + std::to_string(s.option) +
+           "\n   Template_name = file " + quoted(s.templateName) + "\n   Items =\n  end\n"
+           "  section \"OUTPUT\"\n   File_format = " + std::to_string(s.outputFormat) +
+           "\n   File_name = file " + quoted(s.outputFile) + "\n   Folder_name = file " + quoted(s.outputFolder) +
+           "\n   File_title = \"Gauge\"\n  end\n end\nend\nwpx end\n";
+}
+
+class CheckCommand : public testing::Test {
+protected:
+    void SetUp() override
+    {
+        converter::AsciiSeriesWriter ascii;
+        WriteGauge(ascii, gauge);
+        converter::RbxSeriesWriter rbx;
+        WriteGauge(rbx, gaugeRbx);
+        ASSERT_EQ(CAsciiSpecification().Save(fitting), 1);
+        CAsciiSpecification comma;
+        comma.m_strDelimiter = "Comma";
+        ASSERT_EQ(comma.Save(misfit), 1);
+        scratch.MakeFolder("out");
+        setup.file = gauge;
+        setup.templateName = fitting;
+        setup.outputFile = scratch / "out/gauge.rbx0";
+    }
+
+    Outcome Check(const StoredSetup& s)
+    {
+        const std::string doc = scratch.Write("setup.wpx", Document(s));
+        return RunVelmora("check " + doc);
+    }
+
+    TempFolder scratch;
+    std::string gauge = scratch / "gauge.txt";
+    std::string gaugeRbx = scratch / "gauge.rbx0";
+    std::string fitting = scratch / "gauge.xml";
+    std::string misfit = scratch / "comma.xml";
+    StoredSetup setup;
+};
+
+bool HasLine(const std::string& output, const std::string& start)
+{
+    return output.find(start) == 0 || output.find("\n" + start) != std::string::npos;
+}
+
+} // namespace
+
+TEST_F(CheckCommand, AFittingSingleFileSetupPassesEveryCheck)
+{
+    const Outcome outcome = Check(setup);
+    EXPECT_EQ(outcome.status, 0) << outcome.output;
+    for (const char* line : {"PASS input: ", "PASS template: ", "PASS preview: ", "PASS output: "})
+        EXPECT_TRUE(HasLine(outcome.output, line)) << line << "\n" << outcome.output;
+}
+
+TEST_F(CheckCommand, ATemplateThatDoesNotFitFailsWithTheReason)
+{
+    setup.templateName = misfit;
+    const Outcome outcome = Check(setup);
+    EXPECT_EQ(outcome.status, 1);
+    EXPECT_TRUE(HasLine(outcome.output, "PASS input: ")) << outcome.output;
+    EXPECT_TRUE(HasLine(outcome.output, "FAIL template: " + gauge)) << outcome.output;
+    EXPECT_TRUE(HasLine(outcome.output, "FAIL preview: not tried")) << outcome.output;
+    EXPECT_TRUE(HasLine(outcome.output, "PASS output: ")) << outcome.output;
+}
+
+TEST_F(CheckCommand, AFolderPassesWhenOneOfItsFilesFits)
+{
+    const std::string folder = scratch.MakeFolder("in");
+    std::filesystem::copy_file(gauge, folder + "/gauge.txt");
+    setup.type = 2;
+    setup.file.clear();
+    setup.folder = folder;
+    setup.outputFolder = scratch / "out";
+    EXPECT_EQ(Check(setup).status, 0);
+
+    setup.templateName = misfit;
+    const Outcome outcome = Check(setup);
+    EXPECT_EQ(outcome.status, 1);
+    EXPECT_TRUE(HasLine(outcome.output, "FAIL template: " + res::LoadString(res::IDS_TEMPLATE_NO_MATCH)))
+        << outcome.output;
+
+    setup.outputFolder = scratch / "missing";
+    EXPECT_TRUE(HasLine(Check(setup).output, "FAIL output: " + res::LoadString(res::IDS_FOLDER_INVALID)));
+}
+
+TEST_F(CheckCommand, InputProblemsUseTheWizardsTexts)
+{
+    StoredSetup missing = setup;
+    missing.file = scratch / "missing.txt";
+    Outcome outcome = Check(missing);
+    EXPECT_EQ(outcome.status, 1);
+    EXPECT_TRUE(HasLine(outcome.output, "FAIL input: " + res::LoadString(res::IDS_FILE_INVALID))) << outcome.output;
+    EXPECT_TRUE(HasLine(outcome.output, "FAIL template: not tried")) << outcome.output;
+
+    ScopedEnv absent("VELMORA_SPREADSHEET", "absent");
+    StoredSetup excel = setup;
+    excel.format = 3;
+    excel.file = scratch.Write("book.xlsx", "x");
+    outcome = Check(excel);
+    EXPECT_TRUE(HasLine(outcome.output, "FAIL input: " + res::LoadString(res::IDS_EXCEL_MISSING))) << outcome.output;
+}
+
+TEST_F(CheckCommand, RbxInputHasNoTemplateCheckAndManualTemplatesAreNotHeldAgainstTheFile)
+{
+    StoredSetup rbx = setup;
+    rbx.format = 1;
+    rbx.file = gaugeRbx;
+    rbx.templateName.clear();
+    Outcome outcome = Check(rbx);
+    EXPECT_EQ(outcome.status, 0) << outcome.output;
+    EXPECT_EQ(outcome.output.find("template:"), std::string::npos) << outcome.output;
+
+    StoredSetup manual = setup;
+    manual.option = 3;
+    manual.templateName.clear();
+    outcome = Check(manual);
+    EXPECT_EQ(outcome.status, 0) << outcome.output;
+    EXPECT_TRUE(HasLine(outcome.output, "PASS template: ")) << outcome.output;
+}
+
+TEST_F(CheckCommand, UsageAndUnreadableDocuments)
+{
+    EXPECT_EQ(RunVelmora("check").status, 2);
+    EXPECT_EQ(RunVelmora("check a b").status, 2);
+    EXPECT_EQ(RunVelmora("check --frobnicate").status, 2);
+    EXPECT_EQ(RunVelmora("check --help").status, 0);
+    EXPECT_EQ(RunVelmora("check " + scratch / "missing.wpx").status, 1);
+    const std::string empty = scratch.Write("empty.wpx", "wpx 1\nwpx end\n");
+    EXPECT_EQ(RunVelmora("check " + empty).status, 1);
+}
