@@ -56,8 +56,8 @@ std::unique_ptr<ITimeSeriesComponent> CreateComponent();
 
 using ComponentFactory = std::function<std::unique_ptr<ITimeSeriesComponent>()>;
 
-// Makes CreateComponent use `factory` for the lifetime of this object, process-wide (tests put a
-// recording component or an absent one in place of the real one).
+// Makes CreateComponent use `factory` for the lifetime of this object, process-wide; an empty
+// factory makes creation fail. Tests put a recording component, or none, in place of the real one.
 class ScopedComponentFactory {
 public:
     explicit ScopedComponentFactory(ComponentFactory factory);
