@@ -2,6 +2,7 @@
 
 #include "converter/AsciiSeriesReader.h"
 #include "converter/AsciiSeriesWriter.h"
+#include "converter/ExcelSeriesReader.h"
 #include "converter/OutputFile.h"
 #include "converter/RbxSeriesReader.h"
 #include "converter/RbxSeriesWriter.h"
@@ -120,7 +121,7 @@ std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* sp
     switch (format) {
     case Format::Rbx0: return std::make_unique<RbxSeriesReader>();
     case Format::Ascii: return spec ? std::make_unique<AsciiSeriesReader>(*spec) : nullptr;
-    case Format::Excel: return nullptr;
+    case Format::Excel: return spec ? std::make_unique<ExcelSeriesReader>(*spec) : nullptr;
     }
     return nullptr;
 }

@@ -70,13 +70,47 @@ TEST(Conversion, TextToTextWithSelectionReordersAndNotesMissingItems)
               "2020/01/01 00:30:00\t9\t0.3\n");
 }
 
-TEST(Conversion, XlsxOutputIsAWorkbook)
+void RoundTripThrough(std::initializer_list<Format> formats)
+{
+    for (Format middle : formats)
+        for (Format last : formats) {
+            SCOPED_TRACE(std::string(FormatName(middle)) + " then " + FormatName(last));
+            convtest::ScratchFolder folder;
+            convtest::WriteFile(folder.Path("in.txt"), kSample);
+            const std::string mid = folder.Path(std::string("mid") + OutputExtension(middle));
+            const std::string end = folder.Path(std::string("end") + OutputExtension(last));
+            FileReport first = Convert(Format::Ascii, folder.Path("in.txt"), middle, mid);
+            ASSERT_TRUE(first.converted) << first.problem.Describe();
+            FileReport second = Convert(middle, mid, last, end);
+            ASSERT_TRUE(second.converted) << second.problem.Describe();
+            FileReport back = Convert(last, end, Format::Ascii, folder.Path("back.txt"));
+            ASSERT_TRUE(back.converted) << back.problem.Describe();
+            EXPECT_EQ(convtest::ReadFile(folder.Path("back.txt")), kSample);
+        }
+}
+
+TEST(Conversion, TextAndRbx0PairsRoundTrip) { RoundTripThrough({Format::Rbx0, Format::Ascii}); }
+
+// Waits on the workbook reader: it drops inline-string cells (the streaming writer's) and the
+// time of day of date cells, so a written workbook does not read back yet.
+TEST(Conversion, DISABLED_EveryFormatPairRoundTrips) { RoundTripThrough({Format::Rbx0, Format::Ascii, Format::Excel}); }
+
+TEST(Conversion, DamagedWorkbookFailsWithoutOutput)
 {
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), kSample);
-    FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Excel, folder.Path("out.xlsx"));
-    ASSERT_TRUE(report.converted) << report.problem.Describe();
-    EXPECT_EQ(convtest::ReadFile(folder.Path("out.xlsx")).substr(0, 2), "PK");
+    ASSERT_TRUE(Convert(Format::Ascii, folder.Path("in.txt"), Format::Excel, folder.Path("good.xlsx")).converted);
+    const std::string bytes = convtest::ReadFile(folder.Path("good.xlsx"));
+    std::string flipped = bytes;
+    for (size_t i = bytes.size() / 3; i < bytes.size() / 3 + 64; ++i)
+        flipped[i] = static_cast<char>(~flipped[i]);
+    for (const std::string& damaged : {bytes.substr(0, bytes.size() / 2), flipped, std::string("PK not a zip")}) {
+        convtest::WriteFile(folder.Path("bad.xlsx"), damaged);
+        FileReport report = Convert(Format::Excel, folder.Path("bad.xlsx"), Format::Ascii, folder.Path("out.txt"));
+        EXPECT_FALSE(report.converted);
+        EXPECT_FALSE(report.problem.message.empty());
+        EXPECT_FALSE(fs::exists(folder.Path("out.txt")));
+    }
 }
 
 TEST(Conversion, FailureLeavesTheOldOutputAndNoTemporary)

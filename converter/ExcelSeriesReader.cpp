@@ -1,0 +1,362 @@
+#include "converter/ExcelSeriesReader.h"
+
+#include "parsers/HeaderCells.h"
+#include "platform/spreadsheet/WorkbookReader.h"
+#include "platform/system/Text.h"
+#include "resources/StringTable.h"
+#include "templates/Specification.h"
+
+#include <algorithm>
+#include <cmath>
+
+namespace converter {
+
+namespace {
+
+constexpr size_t kQueuedRows = 256;
+
+const sheet::RowCell* CellAt(const std::vector<sheet::RowCell>& cells, int column)
+{
+    auto it = std::lower_bound(cells.begin(), cells.end(), column,
+                               [](const sheet::RowCell& cell, int c) { return cell.column < c; });
+    return it != cells.end() && it->column == column ? &*it : nullptr;
+}
+
+std::string TextAt(const std::vector<sheet::RowCell>& cells, int column)
+{
+    const sheet::RowCell* cell = CellAt(cells, column);
+    return cell ? cell->text : std::string();
+}
+
+bool IsValueTypeName(const std::string& name)
+{
+    int code = 0;
+    return text::EqualsNoCase(name, "Instantaneous") || CSpecification::GetValueTypeCode(name, code);
+}
+
+} // namespace
+
+ExcelSeriesReader::ExcelSeriesReader(const CSpecification& spec) : m_spec(spec) {}
+
+ExcelSeriesReader::~ExcelSeriesReader()
+{
+    {
+        std::lock_guard<std::mutex> lock(m_mutex);
+        m_stop = true;
+    }
+    m_changed.notify_all();
+    if (m_producer.joinable())
+        m_producer.join();
+}
+
+Status ExcelSeriesReader::Open(const std::string& path)
+{
+    m_path = path;
+    m_header = SeriesHeader();
+    m_header.timeTitle = "DateTime";
+    m_sheet = m_spec.m_DataDesc.m_nExcelSheet;
+    m_formatColumns = m_spec.CountFormatColumns(1);
+    m_stampColumn = m_spec.GetDateTimeColumn();
+    m_deleteInUse = m_spec.m_DataDesc.m_nDeleteValueCheck != 0;
+    if (m_spec.m_DataDesc.m_nStartRow < 1)
+        return m_status = Status::Fail(path, 0, "the data start row of the template must be 1 or more");
+    if (m_stampColumn < 1)
+        return m_status = Status::Fail(path, 0, "the template's date/time option must be 0, 1 or 2");
+    if (Status header = ReadHeader(); !header)
+        return m_status = header;
+    std::vector<size_t> all(m_itemCount);
+    for (size_t i = 0; i < all.size(); ++i)
+        all[i] = i;
+    Select(all);
+    StartRows();
+    return m_status;
+}
+
+// One pass over the sheet for its used columns and the header rows.
+Status ExcelSeriesReader::ReadHeader()
+{
+    const CDataDescription& data = m_spec.m_DataDesc;
+    sheet::WorkbookReader workbook;
+    if (!workbook.Open(m_path))
+        return Status::Fail(m_path, 0, workbook.Error());
+    if (m_sheet < 1 || m_sheet > workbook.SheetCount())
+        return Status::Fail(m_path, 0, res::LoadString(res::IDS_SHEET_INDEX_TOO_LARGE));
+
+    std::vector<int> wanted{data.m_nStartRow, 1};
+    if (data.m_nItemTitleOption == 0)
+        wanted.push_back(data.m_nItemDescriptionRow);
+    for (auto [option, row] : {std::pair{data.m_nUnitTypeOption, data.m_nUnitTypeRow},
+                               std::pair{data.m_nUnitOption, data.m_nUnitRow},
+                               std::pair{data.m_nValueTypeOption, data.m_nValueTypeRow}})
+        if (option == 1)
+            wanted.push_back(row);
+    std::map<int, SheetRow> headerRows;
+    int first = 0, last = 0;
+    const bool read = workbook.ReadRows(m_sheet, [&](int row, const std::vector<sheet::RowCell>& cells) {
+        if (!cells.empty()) {
+            first = first == 0 ? cells.front().column : std::min(first, cells.front().column);
+            last = std::max(last, cells.back().column);
+        }
+        if (std::find(wanted.begin(), wanted.end(), row) != wanted.end())
+            headerRows[row] = SheetRow{row, cells};
+        return true;
+    });
+    if (!read)
+        return Status::Fail(m_path, 0, workbook.Error());
+    if (last < 2 || last - first < 1)
+        return Status::Fail(m_path, 0, "the sheet has fewer than two used columns");
+    m_firstColumn = first;
+    m_lastColumn = last;
+    m_firstValueColumn = m_stampColumn != first ? first : first + m_formatColumns;
+    if (m_deleteInUse)
+        m_deleteValue = data.m_nDeleteValueRadio == 1
+                            ? (headerRows.count(data.m_nDeleteValueRow) ? TextAt(headerRows[data.m_nDeleteValueRow].cells, 1) : std::string())
+                            : data.m_strDeleteValue;
+    return ReadItems(headerRows);
+}
+
+Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
+{
+    const CDataDescription& data = m_spec.m_DataDesc;
+    std::vector<int> valueColumns;
+    for (int x = m_firstValueColumn; x <= m_lastColumn; ++x)
+        if (x < m_stampColumn || x >= m_stampColumn + m_formatColumns)
+            valueColumns.push_back(x);
+    m_itemCount = valueColumns.size();
+    if (m_itemCount == 0)
+        return Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_NO_ITEM_COLUMN));
+    auto rowCells = [&](int row) {
+        auto it = headerRows.find(row);
+        return it == headerRows.end() ? std::vector<sheet::RowCell>() : it->second.cells;
+    };
+
+    // The sheet's own date/time title when it has one, so a round trip keeps it.
+    if (data.m_nItemTitleOption == 0) {
+        const std::string title = TextAt(rowCells(data.m_nItemDescriptionRow), m_stampColumn);
+        if (!title.empty())
+            m_header.timeTitle = title;
+    }
+    m_header.items.assign(m_itemCount, ItemInfo());
+    for (size_t i = 0; i < m_itemCount; ++i) {
+        ItemInfo& item = m_header.items[i];
+        const int column = valueColumns[i];
+        const CItemDefinition* def = i < data.m_vecItemDefs.size() ? &data.m_vecItemDefs[i] : nullptr;
+        if (data.m_nItemTitleOption == 0) {
+            item.name = TextAt(rowCells(data.m_nItemDescriptionRow), column);
+            if (item.name.empty())
+                item.name = "Item" + std::to_string(column - m_firstColumn + 1);
+        } else {
+            item.name = m_itemCount > data.m_vecItemDefs.size() ? "Item" + std::to_string(i + 1) : def->m_strTitle;
+        }
+        struct Part {
+            int option;
+            int row;
+            const std::string& global;
+            std::string CItemDefinition::*member;
+            CString (*cut)(const CString&);
+            int emptyMessage;
+            std::string& target;
+        } parts[] = {
+            {data.m_nUnitTypeOption, data.m_nUnitTypeRow, data.m_strGlobalUnitType, &CItemDefinition::m_strType,
+             TextBeforeBracket, res::IDS_NO_ITEM_TYPE, item.type},
+            {data.m_nUnitOption, data.m_nUnitRow, data.m_strGlobalUnit, &CItemDefinition::m_strUnit, TextInBrackets,
+             res::IDS_NO_UNIT_TYPE, item.unit},
+            {data.m_nValueTypeOption, data.m_nValueTypeRow, data.m_strGlobalValueType, &CItemDefinition::m_strValueType,
+             TextAfterColon, res::IDS_NO_VALUE_TYPE, item.valueType},
+        };
+        for (Part& part : parts) {
+            switch (part.option) {
+            case 0: part.target = part.global; break;
+            case 1:
+                part.target = part.cut(TextAt(rowCells(part.row), column));
+                if (part.target.empty())
+                    return Status::Fail(m_path, part.row, res::LoadString(part.emptyMessage));
+                break;
+            case 2: part.target = def ? def->*part.member : std::string(); break;
+            default: return Status::Fail(m_path, 0, "the template's item options must be 0, 1 or 2");
+            }
+        }
+        if (!IsValueTypeName(item.valueType))
+            return Status::Fail(m_path, data.m_nValueTypeRow,
+                                res::LoadString(res::IDS_VALUE_TYPE_INVALID) + " '" + item.valueType + "'");
+    }
+
+    const CTimeDescription& time = m_spec.m_TimeDesc;
+    m_start = StampFields();
+    switch (time.m_nDateTimeOption) {
+    case 0:
+        m_useFormat = time.m_bUseDTFormat != 0;
+        m_format = std::make_unique<DateFormat>(time.m_strDateTimeFormat);
+        break;
+    case 1:
+        m_useFormat = time.m_bUseTFormat != 0;
+        m_format = std::make_unique<DateFormat>(time.m_strTimeFormat, DateFormat::Reads::Time);
+        m_start.year = 100;
+        if (!DateFormat("YYYY-MM-DD", DateFormat::Reads::Date).Read(time.m_strGlobalDate, m_start))
+            return Status::Fail(m_path, 0, "the template's global date '" + time.m_strGlobalDate + "' is not YYYY-MM-DD");
+        break;
+    case 2:
+        m_useFormat = time.m_bUseDFormat != 0;
+        m_format = std::make_unique<DateFormat>(time.m_strDateFormat, DateFormat::Reads::Date);
+        if (!DateFormat("HH:mm:ss", DateFormat::Reads::Time).Read(time.m_strGlobalTime, m_start))
+            return Status::Fail(m_path, 0, "the template's global time '" + time.m_strGlobalTime + "' is not HH:mm:ss");
+        m_start.year = 100;
+        break;
+    default: return Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
+    }
+    return Status::Ok();
+}
+
+void ExcelSeriesReader::Select(const std::vector<size_t>& items)
+{
+    SeriesReader::Select(items);
+    m_slotOfColumn.assign(static_cast<size_t>(m_lastColumn) + 1, -1);
+    size_t item = 0;
+    for (int x = m_firstValueColumn; x <= m_lastColumn; ++x) {
+        if (x >= m_stampColumn && x < m_stampColumn + m_formatColumns)
+            continue;
+        for (size_t slot = 0; slot < items.size(); ++slot)
+            if (items[slot] == item)
+                m_slotOfColumn[static_cast<size_t>(x)] = static_cast<int>(slot);
+        ++item;
+    }
+}
+
+void ExcelSeriesReader::StartRows()
+{
+    const int startRow = m_spec.m_DataDesc.m_nStartRow;
+    m_producer = std::thread([this, startRow] {
+        sheet::WorkbookReader workbook;
+        bool ok = workbook.Open(m_path);
+        if (ok)
+            ok = workbook.ReadRows(m_sheet, [&](int number, const std::vector<sheet::RowCell>& cells) {
+                if (number < startRow)
+                    return true;
+                std::unique_lock<std::mutex> lock(m_mutex);
+                m_changed.wait(lock, [&] { return m_stop || m_queue.size() < kQueuedRows; });
+                if (m_stop)
+                    return false;
+                m_queue.push_back(SheetRow{number, cells});
+                m_changed.notify_all();
+                return true;
+            });
+        std::lock_guard<std::mutex> lock(m_mutex);
+        if (!ok && !m_stop)
+            m_producerError = workbook.Error();
+        m_producerDone = true;
+        m_changed.notify_all();
+    });
+}
+
+bool ExcelSeriesReader::Next(Row& row)
+{
+    while (m_status) {
+        SheetRow sheetRow;
+        {
+            std::unique_lock<std::mutex> lock(m_mutex);
+            m_changed.wait(lock, [&] { return !m_queue.empty() || m_producerDone; });
+            if (m_queue.empty()) {
+                if (!m_producerError.empty())
+                    return Fail(m_path, m_rowNumber, m_producerError);
+                return false;
+            }
+            sheetRow = std::move(m_queue.front());
+            m_queue.pop_front();
+            m_changed.notify_all();
+        }
+        m_rowNumber = sheetRow.number;
+        bool endOfData = false;
+        if (!ReadDataRow(sheetRow, row, endOfData))
+            return false;
+        if (endOfData) {
+            // A row without a date/time ends the data, as in the preview; later rows are notes.
+            std::lock_guard<std::mutex> lock(m_mutex);
+            m_stop = true;
+            m_queue.clear();
+            m_changed.notify_all();
+            return false;
+        }
+        return true;
+    }
+    return false;
+}
+
+bool ExcelSeriesReader::IsDeleted(const std::string& text) const
+{
+    return m_deleteInUse && text::EqualsNoCase(text, m_deleteValue);
+}
+
+bool ExcelSeriesReader::ReadStamp(const SheetRow& sheetRow, Stamp& stamp, bool& endOfData)
+{
+    const CTimeDescription& time = m_spec.m_TimeDesc;
+    const int option = time.m_nDateTimeOption;
+    StampFields fields = m_start;
+    if (m_useFormat) {
+        std::string joined;
+        for (int w = 0; w < m_formatColumns; ++w)
+            joined += TextAt(sheetRow.cells, m_stampColumn + w) + " ";
+        joined = text::Trim(joined);
+        if (joined.empty()) {
+            endOfData = true;
+            return true;
+        }
+        if (!m_format->Read(joined, fields))
+            return Fail(m_path, sheetRow.number, res::LoadString(res::IDS_DATETIME_UNPARSABLE) + " '" + joined + "'");
+    } else {
+        const sheet::RowCell* cell = CellAt(sheetRow.cells, m_stampColumn);
+        if (!cell || (cell->value.type == sheet::Variant::Text && text::Trim(cell->text).empty())) {
+            endOfData = true;
+            return true;
+        }
+        std::optional<Stamp> value;
+        if (cell->value.type == sheet::Variant::Number) {
+            value = StampFromSerialDays(cell->value.number);
+        } else {
+            StampFields parsed = option == 0 ? StampFields() : m_start;
+            if (m_format->Read(cell->text, parsed))
+                value = StampFromFields(parsed);
+        }
+        if (!value)
+            return Fail(m_path, sheetRow.number, "the date/time cell '" + cell->text + "' is not a date");
+        const StampFields cellFields = FieldsFromStamp(*value);
+        if (option == 0)
+            fields = cellFields;
+        else if (option == 1)
+            fields.hour = cellFields.hour, fields.minute = cellFields.minute, fields.second = cellFields.second;
+        else
+            fields.year = cellFields.year, fields.month = cellFields.month, fields.day = cellFields.day;
+    }
+    std::optional<Stamp> value = StampFromFields(fields);
+    if (!value)
+        return Fail(m_path, sheetRow.number, "the date/time of the row does not exist in the calendar");
+    stamp = *value;
+    return true;
+}
+
+bool ExcelSeriesReader::ReadDataRow(const SheetRow& sheetRow, Row& row, bool& endOfData)
+{
+    if (!ReadStamp(sheetRow, row.stamp, endOfData) || endOfData)
+        return m_status.ok();
+    row.values.assign(m_selection.size(), kMissing);
+    for (const sheet::RowCell& cell : sheetRow.cells) {
+        if (cell.column < 0 || cell.column > m_lastColumn)
+            continue;
+        const int slot = m_slotOfColumn[static_cast<size_t>(cell.column)];
+        if (slot < 0 || IsDeleted(cell.text))
+            continue;
+        double value = kMissing;
+        switch (cell.value.type) {
+        case sheet::Variant::Number:
+        case sheet::Variant::Boolean: value = cell.value.number; break;
+        case sheet::Variant::Text:
+            if (m_numbers.Read(cell.text, value) == ValueText::NotANumber)
+                return Fail(m_path, sheetRow.number, "the value '" + cell.text + "' is not a number", cell.column);
+            break;
+        default: break; // empty and error cells are missing values
+        }
+        row.values[static_cast<size_t>(slot)] = value;
+    }
+    return true;
+}
+
+} // namespace converter
