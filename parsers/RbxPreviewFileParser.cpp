@@ -12,6 +12,7 @@
 #include <cstdio>
 #include <cstring>
 #include <algorithm>
+#include <charconv>
 #include <exception>
 #include <vector>
 
@@ -96,21 +97,80 @@ double StepOffsetDays(const AxisValues& axis, int t, double stepTime, double day
     return stepTime * daysPerUnit;
 }
 
-// Writes "%Y-%m-%d %H:%M:%S" of `stamp`; the calendar arithmetic is done here because it runs once
-// per time step of the file.
+// Writes `value` with `digits` digits, zero-padded, at `out`.
+char* PutDigits(char* out, int value, int digits)
+{
+    for (int i = digits - 1; i >= 0; --i, value /= 10)
+        out[i] = static_cast<char>('0' + value % 10);
+    return out + digits;
+}
+
+// "%Y-%m-%d %H:%M:%S" of `stamp`, written by hand: it runs once per time step of the file.
 CString FormatStamp(const COleDateTime& stamp)
 {
     int year, month, day, hour, minute, second;
     if (!stamp.GetFields(year, month, day, hour, minute, second))
         return "Invalid DateTime";
-    char text[32];
-    int length = std::snprintf(text, sizeof(text), "%04d-%02d-%02d %02d:%02d:%02d", year, month, day, hour, minute,
-                               second);
-    return CString(text, static_cast<size_t>(length));
+    char text[19];
+    char* p = PutDigits(text, year, 4);
+    *p++ = '-';
+    p = PutDigits(p, month, 2);
+    *p++ = '-';
+    p = PutDigits(p, day, 2);
+    *p++ = ' ';
+    p = PutDigits(p, hour, 2);
+    *p++ = ':';
+    p = PutDigits(p, minute, 2);
+    *p++ = ':';
+    PutDigits(p, second, 2);
+    return CString(text, sizeof(text));
 }
 
-// Reads the next value of an item into `value` (large enough for all the item's values) and writes
-// the first as text; unknown data types read nothing.
+template <typename T>
+T Load(const unsigned char* bytes)
+{
+    T value;
+    std::memcpy(&value, bytes, sizeof(value));
+    return value;
+}
+
+// The text of one value: "%f" for floating point (six decimals), the character itself, or the
+// decimal integer. to_chars gives the same digits as printf, many times faster.
+void WriteValue(int dataType, const unsigned char* value, CString& text)
+{
+    char buffer[400]; // "%f" of the largest double takes 316 characters
+    char* const end = buffer + sizeof(buffer);
+    std::to_chars_result written{buffer, std::errc()};
+    switch (dataType) {
+    case rbx::kFloat32:
+        written = std::to_chars(buffer, end, static_cast<double>(Load<float>(value)), std::chars_format::fixed, 6);
+        break;
+    case rbx::kFloat64:
+        written = std::to_chars(buffer, end, Load<double>(value), std::chars_format::fixed, 6);
+        break;
+    case rbx::kChar:
+        text.assign(1, static_cast<char>(value[0]));
+        return;
+    case rbx::kInt32:
+        written = std::to_chars(buffer, end, Load<std::int32_t>(value));
+        break;
+    case rbx::kUInt32:
+        written = std::to_chars(buffer, end, Load<std::uint32_t>(value));
+        break;
+    case rbx::kInt16:
+        written = std::to_chars(buffer, end, Load<std::int16_t>(value));
+        break;
+    case rbx::kInteger:
+        written = std::to_chars(buffer, end, Load<std::int64_t>(value));
+        break;
+    default:
+        break;
+    }
+    text.assign(buffer, written.ec == std::errc() ? written.ptr : buffer);
+}
+
+// Reads the next value of an item into `valueBuffer` (large enough for all the item's values) and
+// writes the first as text; unknown data types read nothing.
 bool ReadValueText(const COpenRbxFile& rbxFile, int dataType, std::vector<unsigned char>& valueBuffer, double& time,
                    CString& text)
 {
@@ -120,54 +180,7 @@ bool ReadValueText(const COpenRbxFile& rbxFile, int dataType, std::vector<unsign
     }
     if (rbxReadItemTimeStep(rbxFile.Header(), rbxFile.File(), &time, valueBuffer.data()) != 0)
         return false;
-    const unsigned char* value = valueBuffer.data();
-    char buffer[512];
-    int length = 0;
-    switch (dataType) {
-    case rbx::kFloat32: {
-        float v;
-        std::memcpy(&v, value, sizeof(v));
-        length = std::snprintf(buffer, sizeof(buffer), "%f", static_cast<double>(v));
-        break;
-    }
-    case rbx::kFloat64: {
-        double v;
-        std::memcpy(&v, value, sizeof(v));
-        length = std::snprintf(buffer, sizeof(buffer), "%f", v);
-        break;
-    }
-    case rbx::kChar:
-        length = std::snprintf(buffer, sizeof(buffer), "%c", static_cast<char>(value[0]));
-        break;
-    case rbx::kInt32: {
-        std::int32_t v;
-        std::memcpy(&v, value, sizeof(v));
-        length = std::snprintf(buffer, sizeof(buffer), "%d", static_cast<int>(v));
-        break;
-    }
-    case rbx::kUInt32: {
-        std::uint32_t v;
-        std::memcpy(&v, value, sizeof(v));
-        length = std::snprintf(buffer, sizeof(buffer), "%u", static_cast<unsigned>(v));
-        break;
-    }
-    case rbx::kInt16: {
-        std::int16_t v;
-        std::memcpy(&v, value, sizeof(v));
-        length = std::snprintf(buffer, sizeof(buffer), "%d", static_cast<int>(v));
-        break;
-    }
-    case rbx::kInteger: {
-        std::int64_t v;
-        std::memcpy(&v, value, sizeof(v));
-        length = std::snprintf(buffer, sizeof(buffer), "%lld", static_cast<long long>(v));
-        break;
-    }
-    default:
-        break;
-    }
-    // "%f" of a huge float needs more than the buffer: snprintf then reports the full length.
-    text.assign(buffer, static_cast<size_t>(std::min<int>(std::max(length, 0), sizeof(buffer) - 1)));
+    WriteValue(dataType, valueBuffer.data(), text);
     return true;
 }
 
