@@ -1,9 +1,11 @@
 #include "parsers/ParserFactory.h"
 
 #include "parsers/AsciiFilePreviewParser.h"
+#include "parsers/ExcelFilePreviewParser.h"
 #include "parsers/RbxPreviewFileParser.h"
 #include "platform/system/Text.h"
 #include "templates/AsciiSpecification.h"
+#include "templates/ExcelSpecification.h"
 
 #include <exception>
 
@@ -23,6 +25,8 @@ std::unique_ptr<CSpecification> MakeSpecification(int format)
     switch (format) {
     case kFormatAscii:
         return std::make_unique<CAsciiSpecification>();
+    case kFormatExcel:
+        return std::make_unique<CExcelSpecification>();
     default:
         return nullptr;
     }
@@ -35,6 +39,8 @@ std::unique_ptr<CFilePreviewParser> MakeParser(int format)
         return std::make_unique<CRbxPreviewFileParser>();
     case kFormatAscii:
         return std::make_unique<CAsciiFilePreviewParser>();
+    case kFormatExcel:
+        return std::make_unique<CExcelFilePreviewParser>();
     default:
         return nullptr;
     }

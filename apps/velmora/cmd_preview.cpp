@@ -1,4 +1,4 @@
-// velmora preview FILE --format ascii|rbx0 [--template T.xml] [--items 2,0] [--json]: reads a data
+// velmora preview FILE --format ascii|excel|rbx0 [--template T.xml] [--items 2,0] [--json]: reads a data
 // file the way the wizard's preview does and prints what the parser made of it.
 #include "apps/velmora/Commands.h"
 #include "parsers/ParserFactory.h"
@@ -14,10 +14,10 @@ namespace {
 void PrintHelp()
 {
     std::printf(
-        "Usage: velmora preview FILE --format ascii|rbx0 [--template T.xml] [--items 2,0] [--json]\n\n"
-        "Reads FILE with the preview parser of the format, as the setup wizard does: an ASCII file\n"
-        "through the template T.xml (the template defaults without one), an rbx0 file through its own\n"
-        "header. --items selects item positions (from 0, in the order given) for the preview columns.\n\n"
+        "Usage: velmora preview FILE --format ascii|excel|rbx0 [--template T.xml] [--items 2,0] [--json]\n\n"
+        "Reads FILE with the preview parser of the format, as the setup wizard does: an ASCII file or\n"
+        "an Excel workbook through the template T.xml (the template defaults without one), an rbx0 file\n"
+        "through its own header. --items selects item positions (from 0, in the order given) for the preview columns.\n\n"
         "Prints the file's first lines (\"Input file\") and the parsed table (\"Import result\"); message\n"
         "boxes the parser shows go to stderr. With --json one object instead:\n"
         "  {\"ok\", \"messages\": [{\"text\", \"caption\"}], \"itemNames\", \"rows\", \"rawLines\",\n"
@@ -84,10 +84,10 @@ int ReadOptions(int argc, char** argv, Options& options)
     if (options.file.empty())
         return host::UsageError("preview", "needs a data file");
     if (formatName.empty())
-        return host::UsageError("preview", "needs --format ascii or --format rbx0");
+        return host::UsageError("preview", "needs --format ascii, --format excel or --format rbx0");
     options.format = FormatFromName(formatName);
     if (!MakeParser(options.format))
-        return host::UsageError("preview", "cannot preview the format '" + formatName + "' (ascii or rbx0)");
+        return host::UsageError("preview", "cannot preview the format '" + formatName + "' (ascii, excel or rbx0)");
     if (!options.templatePath.empty() && !MakeSpecification(options.format))
         return host::UsageError("preview", "an " + formatName + " file describes itself; --template does not apply");
     return -1;
