@@ -5,7 +5,6 @@
 #include "converter/AsciiSeriesWriter.h"
 #include "converter/Converter.h"
 #include "converter/RbxSeriesWriter.h"
-#include "converter/XlsxSeriesWriter.h"
 #include "engine/Engine.h"
 #include "platform/bridge/BridgeComponent.h"
 #include "platform/bridge/BridgeVerdict.h"
@@ -16,6 +15,8 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
+
+#include <xlsxwriter.h>
 
 using checktest::TempFolder;
 
@@ -39,6 +40,29 @@ void WriteSeries(converter::SeriesWriter& writer, const std::string& path)
         ASSERT_TRUE(writer.Write(row).ok());
     }
     ASSERT_TRUE(writer.Finish().ok());
+}
+
+// The workbook a user would save from the spreadsheet application: shared strings, real date cells,
+// in the layout a new Excel template reads.
+void WriteWorkbook(const std::string& path)
+{
+    lxw_workbook* workbook = workbook_new(path.c_str());
+    ASSERT_NE(workbook, nullptr);
+    lxw_worksheet* sheet = workbook_add_worksheet(workbook, nullptr);
+    lxw_format* date = workbook_add_format(workbook);
+    format_set_num_format(date, "yyyy/mm/dd hh:mm:ss");
+    worksheet_write_string(sheet, 0, 1, "Water level[m]:Instantaneous", nullptr);
+    worksheet_write_string(sheet, 0, 2, "Discharge[m^3/s]:Instantaneous", nullptr);
+    worksheet_write_string(sheet, 1, 0, "Date/time", nullptr);
+    worksheet_write_string(sheet, 1, 1, "Level", nullptr);
+    worksheet_write_string(sheet, 1, 2, "Flow", nullptr);
+    for (int step = 0; step < 3; ++step) {
+        lxw_datetime stamp = {2021, 1, 1, step, 0, 0.0};
+        worksheet_write_datetime(sheet, static_cast<lxw_row_t>(2 + step), 0, &stamp, date);
+        worksheet_write_number(sheet, static_cast<lxw_row_t>(2 + step), 1, 1.5 + step, nullptr);
+        worksheet_write_number(sheet, static_cast<lxw_row_t>(2 + step), 2, 2.5 * step, nullptr);
+    }
+    ASSERT_EQ(workbook_close(workbook), LXW_NO_ERROR);
 }
 
 struct Verdict {
@@ -91,8 +115,7 @@ protected:
         WriteSeries(ascii, asciiFile);
         converter::RbxSeriesWriter rbx;
         WriteSeries(rbx, rbxFile);
-        converter::XlsxSeriesWriter xlsx;
-        WriteSeries(xlsx, excelFile);
+        WriteWorkbook(excelFile);
 
         ASSERT_EQ(CAsciiSpecification().Save(asciiTemplate), 1);
         CAsciiSpecification commaSeparated;
