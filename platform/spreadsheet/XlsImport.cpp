@@ -75,12 +75,20 @@ void Check(int code, const std::string& path)
         throw OpenError(path, FreeXlWhy(code));
 }
 
+// FreeXL answers some damaged streams with success and no handle.
+void CheckOpened(int code, const Handle& handle, const std::string& path)
+{
+    Check(code, path);
+    if (handle.m_handle == nullptr)
+        throw OpenError(path, "the workbook stream is damaged (unexpected records).");
+}
+
 // FreeXL keeps every cell of a sheet in memory at once: refuse sheets whose grid is too big
 // before it allocates them. The metadata-only open reads no cells.
 void CheckDimensions(const std::string& path, const ImportLimits& limits)
 {
     Handle info;
-    Check(freexl_open_info(path.c_str(), &info.m_handle), path);
+    CheckOpened(freexl_open_info(path.c_str(), &info.m_handle), info, path);
     unsigned sheets = 0;
     Check(freexl_get_info(info.m_handle, FREEXL_BIFF_SHEET_COUNT, &sheets), path);
     for (unsigned s = 0; s < sheets; ++s) {
@@ -171,9 +179,9 @@ void ImportXls(const std::string& path, ImportSink& sink, StyleTable& styles, co
     CheckDimensions(path, limits);
 
     Handle workbook;
-    Check(freexl_open(path.c_str(), &workbook.m_handle), path);
+    CheckOpened(freexl_open(path.c_str(), &workbook.m_handle), workbook, path);
     unsigned password = 0;
-    if (freexl_get_info(workbook.m_handle, FREEXL_BIFF_PASSWORD, &password) == FREEXL_OK && password != 0)
+    if (freexl_get_info(workbook.m_handle, FREEXL_BIFF_PASSWORD, &password) == FREEXL_OK && password == FREEXL_BIFF_OBFUSCATED)
         throw OpenError(path, "the workbook is password-protected.");
     DateStyles dateStyles{styles.Add(NumberFormat(kDateCode)), styles.Add(NumberFormat(kDateTimeCode)),
                           styles.Add(NumberFormat(kTimeCode))};

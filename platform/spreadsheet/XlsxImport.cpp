@@ -245,7 +245,8 @@ public:
     {
         std::optional<CellPosition> position = ParseCellAddress(address);
         if (!position)
-            throw AutomationError("the cell reference '" + std::string(address) + "' is not valid.");
+            throw AutomationError("the cell reference '" + std::string(address) +
+                                  "' is malformed or lies outside the sheet's grid (1048576 rows, 16384 columns).");
         return {0, position->row - 1, position->column - 1};
     }
     orcus::spreadsheet::src_range_t resolve_range(std::string_view range) override

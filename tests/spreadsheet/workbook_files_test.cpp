@@ -1,0 +1,159 @@
+// Workbook files of both kinds through the object model: .xls written by our own script
+// (tests/data/spreadsheet/make_test_files.py), and damaged or hostile files, each of which must
+// fail to open with a message naming the file and the cause.
+#include "TestWorkbooks.h"
+
+#include "platform/spreadsheet/SpreadsheetApplication.h"
+
+#include <gtest/gtest.h>
+
+using namespace sheet;
+using sheettest::DataFile;
+
+namespace {
+
+std::shared_ptr<Worksheet> OpenSheet(Application& app, const std::string& path, int sheet = 1)
+{
+    return app.Workbooks()->Open(path)->Worksheets()->Item(sheet);
+}
+
+std::string Text(Worksheet& sheet, const std::string& address)
+{
+    return sheet.Range(address)->Text().text;
+}
+
+// The message of the AutomationError that opening `path` raises ("" when it opens).
+std::string OpenFailure(const std::string& path)
+{
+    auto app = CreateApplication(ApplicationSettings());
+    try {
+        app->Workbooks()->Open(path);
+    } catch (const AutomationError& e) {
+        return e.what();
+    }
+    return std::string();
+}
+
+} // namespace
+
+TEST(XlsWorkbooks, ValuesTextsAndUsedRangeOfABiffWorkbook)
+{
+    auto app = CreateApplication(ApplicationSettings());
+    auto book = app->Workbooks()->Open(DataFile("series.xls"));
+    auto sheets = book->Worksheets();
+    ASSERT_EQ(sheets->Count(), 2);
+    auto sheet = sheets->Item(1);
+
+    EXPECT_EQ(Text(*sheet, "C1"), "Flow station");
+    EXPECT_EQ(Text(*sheet, "D2"), "A");
+    // Dates show in the default date format; their values are serial numbers.
+    EXPECT_EQ(Text(*sheet, "C3"), "5/17/2021");
+    EXPECT_DOUBLE_EQ(sheet->Range("C3")->Value2().number, 44333);
+    EXPECT_EQ(Text(*sheet, "D3"), "4.5");
+    EXPECT_EQ(Text(*sheet, "E6"), "6000");
+
+    auto used = sheet->UsedRange();
+    EXPECT_EQ(used->Column(), 3);
+    EXPECT_EQ(used->Count(), 7 * 3);
+    Variant values = used->Value2();
+    ASSERT_EQ(values.type, Variant::Array);
+    EXPECT_EQ(values.At(1, 1).text, "Flow station");
+    EXPECT_TRUE(values.At(7, 1).IsEmpty());
+
+    auto empty = sheets->Item(2)->UsedRange();
+    EXPECT_EQ(empty->Count(), 1);
+    EXPECT_TRUE(empty->Value2().IsEmpty());
+}
+
+TEST(XlsWorkbooks, DateTimesAndTimesKeepTheirSeconds)
+{
+    auto app = CreateApplication(ApplicationSettings());
+    auto sheet = OpenSheet(*app, DataFile("stamps.xls"));
+    EXPECT_EQ(Text(*sheet, "A2"), "5/17/2021 1:02:03");
+    EXPECT_EQ(Text(*sheet, "A4"), "5/17/2021 13:02:03");
+    EXPECT_EQ(Text(*sheet, "B3"), "13:00:00");
+    EXPECT_NEAR(sheet->Range("A2")->Value2().number, 44333 + 3723.0 / 86400, 1e-9);
+    EXPECT_NEAR(sheet->Range("B2")->Value2().number, 0.5, 1e-9);
+}
+
+TEST(XlsxWorkbooks, ErrorAndInlineStringCellsAreNotReportedByTheLibrary)
+{
+    // liborcus 0.17 passes over error cells and inline strings: they read as blank and do not
+    // count for the used range (docs/spreadsheet.md).
+    auto app = CreateApplication(ApplicationSettings());
+    auto sheet = OpenSheet(*app, DataFile("errors.xlsx"));
+    EXPECT_TRUE(sheet->Range("A1")->Value2().IsEmpty());
+    EXPECT_EQ(Text(*sheet, "C1"), "");
+    auto used = sheet->UsedRange();
+    EXPECT_EQ(used->Column(), 26);
+    EXPECT_EQ(used->Count(), 1);
+    EXPECT_EQ(Text(*sheet, "Z30"), "7");
+}
+
+TEST(XlsxWorkbooks, FormattedBlankCellsWidenTheUsedRange)
+{
+    sheettest::XlsxBuilder builder(sheettest::TempFile("blank.xlsx"));
+    lxw_worksheet* sheet = builder.AddSheet("S");
+    builder.Number(sheet, 2, 2, 1);
+    builder.Blank(sheet, 5, 4, "0.00");
+    std::string path = builder.Close();
+    auto app = CreateApplication(ApplicationSettings());
+    auto used = OpenSheet(*app, path)->UsedRange();
+    EXPECT_EQ(used->Column(), 2);
+    EXPECT_EQ(used->Count(), 4 * 3);
+}
+
+TEST(BadWorkbooks, EachFailsToOpenWithItsReason)
+{
+    struct Case {
+        const char* file;
+        const char* why;
+    } cases[] = {
+        {"empty.xls", "the file is empty"},
+        {"text.xlsx", "not a workbook"},
+        {"password.xlsx", "password-protected"},
+        {"truncated.xls", "damaged"},
+        {"no-workbook.xls", "no workbook stream"},
+        {"truncated.xlsx", "damaged (no central directory)"},
+        {"not-a-workbook.xlsx", "xl/workbook.xml is missing"},
+        {"broken-xml.xlsx", "damaged"},
+        {"bomb.xlsx", "zip bomb"},
+        {"wide.xlsx", "outside the sheet's grid"},
+    };
+    for (const Case& c : cases) {
+        std::string path = DataFile(c.file);
+        std::string message = OpenFailure(path);
+        EXPECT_NE(message.find(path), std::string::npos) << c.file << ": " << message;
+        EXPECT_NE(message.find(c.why), std::string::npos) << c.file << ": " << message;
+    }
+}
+
+TEST(BadWorkbooks, LimitsAreConfigurable)
+{
+    ApplicationSettings settings;
+    settings.load.limits.maxFileBytes = 1000;
+    auto app = CreateApplication(settings);
+    EXPECT_THROW(app->Workbooks()->Open(DataFile("series.xls")), AutomationError);
+    settings.load.limits = ImportLimits();
+    settings.load.limits.maxXlsSheetCells = 20;
+    app = CreateApplication(settings);
+    EXPECT_THROW(app->Workbooks()->Open(DataFile("series.xls")), AutomationError);
+}
+
+TEST(LargeWorkbooks, AMillionRowsOpenWithBoundedMemoryButRefuseOneHugeArray)
+{
+    std::string path = sheettest::TempFile("million.xlsx");
+    {
+        sheettest::XlsxBuilder builder(path, true);
+        lxw_worksheet* sheet = builder.AddSheet("Tall");
+        for (int row = 1; row <= 1048576; ++row)
+            worksheet_write_number(sheet, static_cast<lxw_row_t>(row - 1), 0, row, nullptr);
+        builder.Close();
+    }
+    auto app = CreateApplication(ApplicationSettings());
+    auto sheet = OpenSheet(*app, path);
+    EXPECT_EQ(Text(*sheet, "A20"), "20");
+    auto used = sheet->UsedRange();
+    EXPECT_EQ(used->Count(), 1048576);
+    EXPECT_THROW(used->Value2(), AutomationError);
+}
