@@ -27,27 +27,6 @@ std::vector<const AttributeRule*> ReportedValues()
     return rules;
 }
 
-// Length of the well-formed UTF-8 sequence at `i` (no overlong forms, surrogates or values past
-// U+10FFFF), or 0 when there is none.
-size_t Utf8SequenceLength(const CString& s, size_t i)
-{
-    auto byte = [&](size_t k) { return static_cast<unsigned char>(s[k]); };
-    unsigned char lead = byte(i);
-    size_t length = lead < 0x80 ? 1 : (lead >> 5) == 0x6 ? 2 : (lead >> 4) == 0xE ? 3 : (lead >> 3) == 0x1E ? 4 : 0;
-    if (length == 0 || i + length > s.size())
-        return 0;
-    char32_t code = length == 1 ? lead : lead & (0x7F >> length);
-    for (size_t k = 1; k < length; ++k) {
-        if ((byte(i + k) & 0xC0) != 0x80)
-            return 0;
-        code = (code << 6) | (byte(i + k) & 0x3F);
-    }
-    static const char32_t kSmallest[] = {0, 0, 0x80, 0x800, 0x10000};
-    if (code < kSmallest[length] || code > 0x10FFFF || (code >= 0xD800 && code <= 0xDFFF))
-        return 0;
-    return length;
-}
-
 // A JSON string literal; bytes that are not UTF-8 become U+FFFD so the output stays valid JSON.
 CString JsonString(const CString& value)
 {

@@ -261,7 +261,7 @@ void AppendList(pugi::xml_node& extension, const char* listName, const char* ent
 {
     pugi::xml_node list = extension.append_child(listName);
     for (const CItemDefinition& item : items)
-        list.append_child(entryName).text().set((item.*field).c_str());
+        list.append_child(entryName).text().set(RepairUtf8(item.*field).c_str());
 }
 
 void BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_document& document)
@@ -272,7 +272,7 @@ void BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_doc
     pugi::xml_node root = document.append_child(layout.root);
     root.append_attribute("xmlns:xsi").set_value(kSchemaInstanceNamespace);
     for (const AttributeRule& rule : layout.attributes)
-        root.append_attribute(rule.name).set_value(AttributeText(rule, spec).c_str());
+        root.append_attribute(rule.name).set_value(RepairUtf8(AttributeText(rule, spec)).c_str());
     pugi::xml_node extension = root.append_child(layout.extension);
     const auto& items = spec.m_DataDesc.m_vecItemDefs;
     if (items.empty())
@@ -284,6 +284,42 @@ void BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_doc
 }
 
 } // namespace
+
+size_t Utf8SequenceLength(std::string_view s, size_t i)
+{
+    auto byte = [&](size_t k) { return static_cast<unsigned char>(s[k]); };
+    unsigned char lead = byte(i);
+    size_t length = lead < 0x80 ? 1 : (lead >> 5) == 0x6 ? 2 : (lead >> 4) == 0xE ? 3 : (lead >> 3) == 0x1E ? 4 : 0;
+    if (length == 0 || i + length > s.size())
+        return 0;
+    char32_t code = length == 1 ? lead : lead & (0x7F >> length);
+    for (size_t k = 1; k < length; ++k) {
+        if ((byte(i + k) & 0xC0) != 0x80)
+            return 0;
+        code = (code << 6) | (byte(i + k) & 0x3F);
+    }
+    static const char32_t kSmallest[] = {0, 0, 0x80, 0x800, 0x10000};
+    if (code < kSmallest[length] || code > 0x10FFFF || (code >= 0xD800 && code <= 0xDFFF))
+        return 0;
+    return length;
+}
+
+CString RepairUtf8(std::string_view text)
+{
+    CString out;
+    out.reserve(text.size());
+    for (size_t i = 0; i < text.size();) {
+        size_t length = Utf8SequenceLength(text, i);
+        if (length == 0) {
+            AppendUtf8(out, static_cast<unsigned char>(text[i]));
+            ++i;
+        } else {
+            out.append(text, i, length);
+            i += length;
+        }
+    }
+    return out;
+}
 
 bool ReadFileBytes(const CString& path, std::string& bytes, CString& error)
 {
@@ -326,7 +362,7 @@ bool DecodeToUtf8(std::string_view bytes, std::string& utf8, CString& error)
         return DecodeUtf16(bytes, true, utf8, error);
     if (StartsWith(bytes, "\xEF\xBB\xBF"sv))
         bytes.remove_prefix(3);
-    utf8.assign(bytes);
+    utf8 = RepairUtf8(bytes);
     return true;
 }
 

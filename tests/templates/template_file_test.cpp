@@ -351,3 +351,21 @@ TEST(TemplateFile, AcceptedEncodings)
     ASSERT_EQ(spec.LoadFromMemory(utf16be, "be.xml"), 1) << spec.LastError();
     EXPECT_EQ(spec.m_DataDesc.m_strGlobalUnit, "\xC2\xB5\xF0\x9F\x98\x80");
 }
+
+TEST(TemplateFile, BytesThatAreNotUtf8AreReadAsLatin1)
+{
+    ScratchFolder folder;
+    CAsciiSpecification spec;
+    spec.m_DataDesc.m_strGlobalUnit = "m\xB3/s";                 // Latin-1 from an 8-bit input file
+    spec.m_strDefDelimiter = "::\xA3\xED\xED\xED\xA3";             // stray bytes, one looking like a surrogate
+    spec.m_DataDesc.m_vecItemDefs = {{"\xC0\xAF", "", "", ""}}; // an overlong form
+    ASSERT_EQ(spec.Save(folder.File("latin.xml")), 1);
+    CAsciiSpecification loaded;
+    ASSERT_EQ(loaded.Load(folder.File("latin.xml")), 1) << loaded.LastError();
+    EXPECT_EQ(loaded.m_DataDesc.m_strGlobalUnit, "m\xC2\xB3/s");
+    EXPECT_EQ(loaded.m_strDefDelimiter, "::\xC2\xA3\xC3\xAD\xC3\xAD\xC3\xAD\xC2\xA3");
+    EXPECT_EQ(loaded.m_DataDesc.m_vecItemDefs.at(0).m_strTitle, "\xC3\x80\xC2\xAF");
+
+    ASSERT_EQ(loaded.LoadFromMemory("<ASCIITSBridgeSpecification GlobalUnit='\xB5g \xC2\xB5g'/>", "l.xml"), 1);
+    EXPECT_EQ(loaded.m_DataDesc.m_strGlobalUnit, "\xC2\xB5g \xC2\xB5g");
+}
