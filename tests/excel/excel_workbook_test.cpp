@@ -1,12 +1,12 @@
 // The Excel parser on real .xlsx files written here with libxlsxwriter, read through the in-process
 // spreadsheet application.
+#include "XlsxFile.h"
 #include "parsers/ExcelFilePreviewParser.h"
 #include "platform/system/FileSystem.h"
 #include "resources/StringTable.h"
 #include "templates/ExcelSpecification.h"
 
 #include <gtest/gtest.h>
-#include <xlsxwriter.h>
 
 #include <cstdlib>
 #include <optional>
@@ -15,72 +15,6 @@
 namespace {
 
 using Strings = std::vector<std::string>;
-
-// Writes one .xlsx file into the temporary folder and removes it again.
-class XlsxFile {
-public:
-    explicit XlsxFile(const std::string& name)
-    {
-        std::string folder;
-        sys::GetTempPath(4096, folder);
-        path = folder + "velmora_xl_" + std::to_string(::getpid()) + "_" + name + ".xlsx";
-        m_book = workbook_new(path.c_str());
-        m_twoDecimals = workbook_add_format(m_book);
-        format_set_num_format(m_twoDecimals, "0.00");
-        m_date = workbook_add_format(m_book);
-        format_set_num_format(m_date, "yyyy/mm/dd");
-        m_time = workbook_add_format(m_book);
-        format_set_num_format(m_time, "hh:mm:ss");
-    }
-    ~XlsxFile()
-    {
-        Close();
-        sys::DeleteFile(path);
-    }
-
-    lxw_worksheet* Sheet(int number)
-    {
-        while (static_cast<int>(m_sheets.size()) < number)
-            m_sheets.push_back(workbook_add_worksheet(m_book, nullptr));
-        return m_sheets[static_cast<size_t>(number - 1)];
-    }
-    // Rows and columns from 1, as the parser counts them.
-    void Text(int row, int column, const char* value, int sheet = 1)
-    {
-        worksheet_write_string(Sheet(sheet), Row(row), Col(column), value, nullptr);
-    }
-    void Number(int row, int column, double value) { worksheet_write_number(Sheet(1), Row(row), Col(column), value, m_twoDecimals); }
-    void Date(int row, int column, int year, int month, int day)
-    {
-        lxw_datetime when {year, month, day, 0, 0, 0};
-        worksheet_write_datetime(Sheet(1), Row(row), Col(column), &when, m_date);
-    }
-    void Time(int row, int column, int hour, int minute, double second)
-    {
-        lxw_datetime when {0, 0, 0, hour, minute, second};
-        worksheet_write_datetime(Sheet(1), Row(row), Col(column), &when, m_time);
-    }
-    void Close()
-    {
-        if (m_book) {
-            Sheet(1);
-            EXPECT_EQ(workbook_close(m_book), LXW_NO_ERROR);
-            m_book = nullptr;
-        }
-    }
-
-    std::string path;
-
-private:
-    static lxw_row_t Row(int row) { return static_cast<lxw_row_t>(row - 1); }
-    static lxw_col_t Col(int column) { return static_cast<lxw_col_t>(column - 1); }
-
-    lxw_workbook* m_book = nullptr;
-    std::vector<lxw_worksheet*> m_sheets;
-    lxw_format* m_twoDecimals = nullptr;
-    lxw_format* m_date = nullptr;
-    lxw_format* m_time = nullptr;
-};
 
 // Sets an environment variable for one scope.
 class ScopedEnv {
