@@ -1,0 +1,125 @@
+// Conversion speed: a generated time-series text (a "YYYY/MM/DD HH:mm:ss" stamp and 10 values a
+// row) converted to rbx0 and back, and to .xlsx, with MB/s, rows/s and the process's peak memory.
+// Rows: VELMORA_BENCH_ROWS (default 1,000,000; the .xlsx case takes a tenth).
+#include "converter/Converter.h"
+#include "converter/StampText.h"
+#include "templates/Specification.h"
+
+#include <benchmark/benchmark.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+#include <random>
+#include <string>
+#include <sys/resource.h>
+#include <unistd.h>
+
+namespace {
+
+namespace fs = std::filesystem;
+
+size_t Rows()
+{
+    const char* rows = std::getenv("VELMORA_BENCH_ROWS");
+    return rows ? std::strtoull(rows, nullptr, 10) : 1000000;
+}
+
+fs::path Folder()
+{
+    static const fs::path folder = [] {
+        fs::path path = fs::temp_directory_path() / ("velmora-bench-" + std::to_string(::getpid()));
+        fs::create_directories(path);
+        return path;
+    }();
+    return folder;
+}
+
+std::string MakeText(size_t rows)
+{
+    const fs::path path = Folder() / ("series-" + std::to_string(rows) + ".txt");
+    if (fs::exists(path))
+        return path.string();
+    std::FILE* out = std::fopen(path.c_str(), "wb");
+    std::string head;
+    for (int i = 0; i < 10; ++i)
+        head += std::string(i ? "\t" : "") + "Undefined[Undefined]:Instantaneous";
+    std::fprintf(out, "%s\nDate/time", head.c_str());
+    for (int i = 0; i < 10; ++i)
+        std::fprintf(out, "\tV%d", i);
+    std::fputc('\n', out);
+    std::mt19937 random(1);
+    std::uniform_real_distribution<double> value(0, 1000);
+    converter::Stamp stamp = *converter::StampFromFields({2000, 1, 1, 0, 0, 0});
+    char line[256];
+    for (size_t r = 0; r < rows; ++r, stamp += 60) {
+        char* p = converter::FormatStamp(stamp, line);
+        for (int i = 0; i < 10; ++i)
+            p += std::snprintf(p, 16, "\t%.4f", value(random));
+        *p++ = '\n';
+        std::fwrite(line, 1, static_cast<size_t>(p - line), out);
+    }
+    std::fclose(out);
+    return path.string();
+}
+
+double PeakMegabytes()
+{
+    rusage usage{};
+    getrusage(RUSAGE_SELF, &usage);
+    return static_cast<double>(usage.ru_maxrss) / 1024.0;
+}
+
+void Run(benchmark::State& state, converter::Format in, const std::string& input, converter::Format out, size_t rows)
+{
+    const std::string output = (Folder() / (std::string("out") + converter::OutputExtension(out))).string();
+    std::unique_ptr<CSpecification> spec;
+    converter::Status status;
+    spec = converter::LoadTemplate(in, "", status);
+    const double inputBytes = static_cast<double>(fs::file_size(input));
+    for (auto _ : state) {
+        converter::FileJob job{in, input, spec.get(), {}, out, output, "bench"};
+        converter::FileReport report = converter::ConvertFile(job);
+        if (!report.converted)
+            state.SkipWithError(report.problem.Describe().c_str());
+    }
+    state.counters["MB/s"] = benchmark::Counter(inputBytes / 1e6, benchmark::Counter::kIsIterationInvariantRate);
+    state.counters["rows/s"] = benchmark::Counter(static_cast<double>(rows), benchmark::Counter::kIsIterationInvariantRate);
+    state.counters["peak_MB"] = PeakMegabytes();
+}
+
+void TextToRbx0(benchmark::State& state)
+{
+    Run(state, converter::Format::Ascii, MakeText(Rows()), converter::Format::Rbx0, Rows());
+}
+
+void Rbx0ToText(benchmark::State& state)
+{
+    const std::string text = MakeText(Rows());
+    const std::string rbx0 = (Folder() / "in.rbx0").string();
+    converter::Status status;
+    auto spec = converter::LoadTemplate(converter::Format::Ascii, "", status);
+    converter::ConvertFile({converter::Format::Ascii, text, spec.get(), {}, converter::Format::Rbx0, rbx0, ""});
+    Run(state, converter::Format::Rbx0, rbx0, converter::Format::Ascii, Rows());
+}
+
+void TextToXlsx(benchmark::State& state)
+{
+    const size_t rows = std::max<size_t>(1, Rows() / 10);
+    Run(state, converter::Format::Ascii, MakeText(rows), converter::Format::Excel, rows);
+}
+
+BENCHMARK(TextToRbx0)->Unit(benchmark::kMillisecond)->Iterations(3)->UseRealTime();
+BENCHMARK(Rbx0ToText)->Unit(benchmark::kMillisecond)->Iterations(3)->UseRealTime();
+BENCHMARK(TextToXlsx)->Unit(benchmark::kMillisecond)->Iterations(1)->UseRealTime();
+
+} // namespace
+
+int main(int argc, char** argv)
+{
+    benchmark::Initialize(&argc, argv);
+    benchmark::RunSpecifiedBenchmarks();
+    benchmark::Shutdown();
+    fs::remove_all(Folder());
+    return 0;
+}
