@@ -7,6 +7,8 @@
 
 #include <gtest/gtest.h>
 
+#include <sys/stat.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 using checktest::RecordingBridge;
@@ -122,16 +124,44 @@ TEST_F(WithRecordingBridge, FindMatchingFileSkipsHiddenUnexaminableAndFolderEntr
     EXPECT_TRUE(recorder.calls.empty());
 }
 
+// Under an account that reads every file, the check runs in a child process with a plain user's rights.
 TEST(FindMatchingFile, SkipsReadProtectedFiles)
 {
     TempFolder scratch;
-    const std::string locked = scratch.Write("locked.txt", "x");
-    ::chmod(locked.c_str(), 0);
-    if (::access(locked.c_str(), R_OK) == 0)
-        GTEST_SKIP() << "running with rights that read any file";
-    CEngine engine;
-    CString match;
-    EXPECT_EQ(engine.FindMatchingFile(scratch.Path(), match, 2, ""), 0);
+    ::chmod(scratch.Path().c_str(), 0755);
+    const std::string locked = scratch.MakeFolder("locked");
+    const std::string open = scratch.MakeFolder("open");
+    ::chmod(locked.c_str(), 0755);
+    ::chmod(open.c_str(), 0755);
+    const std::string lockedFile = locked + "/a.txt";
+    const std::string openFile = open + "/a.txt";
+    std::ofstream(lockedFile) << "x";
+    std::ofstream(openFile) << "x";
+    ::chmod(lockedFile.c_str(), 0);
+    ::chmod(openFile.c_str(), 0644);
+
+    auto matches = [](const std::string& folder) {
+        CEngine engine;
+        CString match;
+        return engine.FindMatchingFile(folder, match, 2, "");
+    };
+    if (::access(lockedFile.c_str(), R_OK) != 0) {
+        EXPECT_EQ(matches(locked), 0);
+        EXPECT_EQ(matches(open), 1);
+        return;
+    }
+    const pid_t child = ::fork();
+    ASSERT_NE(child, -1);
+    if (child == 0) {
+        const bool dropped = ::setgid(65534) == 0 && ::setuid(65534) == 0;
+        ::_exit(!dropped ? 3 : (matches(locked) == 0 && matches(open) == 1) ? 0 : 1);
+    }
+    int status = 0;
+    ::waitpid(child, &status, 0);
+    ASSERT_TRUE(WIFEXITED(status));
+    if (WEXITSTATUS(status) == 3)
+        GTEST_SKIP() << "cannot take a plain user's rights here";
+    EXPECT_EQ(WEXITSTATUS(status), 0) << "a read-protected file was taken, or a readable one was not";
 }
 
 TEST(FindMatchingFile, AFolderThatCannotBeListedHasNoMatch)

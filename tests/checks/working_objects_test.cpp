@@ -158,14 +158,6 @@ TEST(SetTemplate, SamePathInOtherCaseKeepsTheLoadedFlag)
     EXPECT_EQ(spec.m_strTemplateFile, "/t/snow.xml");
 }
 
-TEST(SetTemplate, WithoutATemplateObjectStoresTheChoiceOnly)
-{
-    CEngine engine;
-    engine.SetTemplate(3, "/t/x.xml");
-    EXPECT_EQ(engine.m_nTemplateOption, 3);
-    EXPECT_EQ(engine.m_strTemplateName, "/t/x.xml");
-}
-
 TEST(SetItems, CopiesIntoRecordTemplateAndParserIncludingAnEmptyList)
 {
     CEngine engine;
