@@ -182,6 +182,18 @@ TEST_F(CheckCommand, RbxInputHasNoTemplateCheckAndManualTemplatesAreNotHeldAgain
     EXPECT_TRUE(HasLine(outcome.output, "PASS template: ")) << outcome.output;
 }
 
+TEST_F(CheckCommand, ReadsTheEngineFileLayoutToo)
+{
+    std::string doc = Document(setup);
+    const size_t setupStart = doc.find(" section \"Setup\"");
+    doc.erase(setupStart, doc.find("  section \"INPUT\"") - setupStart);
+    doc.erase(doc.rfind(" end\nend"), 5);
+    doc.replace(doc.find("OkaToolbox"), 10, "VELMORA");
+    const Outcome outcome = RunVelmora("check " + scratch.Write("engine.wpx", doc));
+    EXPECT_EQ(outcome.status, 0) << doc << outcome.output;
+    EXPECT_TRUE(HasLine(outcome.output, "PASS template: ")) << outcome.output;
+}
+
 TEST_F(CheckCommand, UsageAndUnreadableDocuments)
 {
     EXPECT_EQ(RunVelmora("check").status, 2);
