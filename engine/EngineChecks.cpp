@@ -16,7 +16,6 @@ namespace {
 
 constexpr size_t kMaxPath = 260;
 constexpr std::int64_t kTextProbeBytes = 40960;
-constexpr unsigned short kVerdictTrue = 65535;
 
 // From the last dot of the last path element, dot included; empty when that element has none.
 CString ExtensionOf(const CString& path)
@@ -35,7 +34,8 @@ bool IsAsciiExtension(const CString& extension)
            text::EqualsNoCase(extension, ".csv");
 }
 
-// Entries a folder scan never offers: folders and files that are hidden, temporary or unreadable.
+// False for the entries a folder scan passes over: folders, and files that are hidden, temporary or
+// unreadable.
 bool IsCandidateEntry(const CString& path)
 {
     const auto attributes = sys::GetAttributes(path);
@@ -131,7 +131,7 @@ int CEngine::BridgeAccepts(const CString& file, const CString& templatePath, int
     } catch (...) {
         return 0;
     }
-    return verdict == kVerdictTrue ? 1 : 0;
+    return verdict == bridge::kVerdictTrue ? 1 : 0;
 }
 
 int CEngine::FindMatchingFile(const CString& folder, CString& firstMatch, int format, const CString& templatePath)
@@ -147,7 +147,7 @@ int CEngine::FindMatchingFile(const CString& folder, CString& firstMatch, int fo
         CString scratch;
         if (!CheckFileExtension(path, format, scratch))
             continue;
-        if (templatePath.empty() || BridgeAccepts(path, templatePath, format, static_cast<short>(kVerdictTrue))) {
+        if (templatePath.empty() || BridgeAccepts(path, templatePath, format, bridge::kFolderScan)) {
             firstMatch = path;
             return 1;
         }
@@ -166,7 +166,7 @@ int CEngine::VerifyTemplate(const int& option, const CString& templatePath, CStr
         return 0;
     }
     if (m_nInputType == 1) {
-        const int accepted = BridgeAccepts(m_strInputFile, templatePath, m_nInputFormat, 0);
+        const int accepted = BridgeAccepts(m_strInputFile, templatePath, m_nInputFormat, bridge::kSingleFile);
         if (accepted)
             SetPreviewFile(m_strInputFile);
         return accepted;
