@@ -1,6 +1,5 @@
 // `velmora preview --format excel` on workbooks written here, as a user would run it.
 #include "XlsxFile.h"
-#include "resources/StringTable.h"
 #include "templates/ExcelSpecification.h"
 
 #include <gtest/gtest.h>
@@ -82,29 +81,11 @@ TEST_F(ExcelPreviewCommand, JsonOfAParsedWorkbook)
     EXPECT_TRUE(Has(run, "[\"Gauge 12\",\"\",\"\"]")) << run.out;
 }
 
-TEST_F(ExcelPreviewCommand, MissingSheetReportsItsMessage)
-{
-    m_spec.m_DataDesc.m_nExcelSheet = 3;
-    const CommandRun run = Preview(Arguments("--json"));
-    EXPECT_EQ(run.status, 1);
-    EXPECT_TRUE(Has(run, res::LoadString(res::IDS_SHEET_INDEX_TOO_LARGE))) << run.out;
-}
-
 TEST_F(ExcelPreviewCommand, AbsentApplicationFailsWithoutMessages)
 {
     const CommandRun run = Preview(Arguments("--json"), "VELMORA_SPREADSHEET=absent");
     EXPECT_EQ(run.status, 1);
     EXPECT_TRUE(Has(run, "{\"ok\":false,\n\"messages\":[]")) << run.out;
-}
-
-TEST_F(ExcelPreviewCommand, TextOutput)
-{
-    const CommandRun run = Preview(Arguments(""));
-    ASSERT_EQ(run.status, 0) << run.out;
-    EXPECT_TRUE(Has(run, "Input file\n")) << run.out;
-    EXPECT_TRUE(Has(run, "Import result\n")) << run.out;
-    EXPECT_TRUE(Has(run, "2021/05/19 00:00:00  2.25")) << run.out;
-    EXPECT_TRUE(Has(run, "Parse succeeded.")) << run.out;
 }
 
 } // namespace
