@@ -1,0 +1,218 @@
+// End to end through the built programs: "velmora run DOC" loads the plug-in, which writes the
+// engine's setup file and starts the engine program; the files it leaves are then read back with
+// the converter library.
+#include "converter/Converter.h"
+#include "templates/Specification.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace fs = std::filesystem;
+using converter::Format;
+
+namespace {
+
+const std::string kSample = "Rainfall[mm]:Accumulated\tWater Level[m]:Instantaneous\tUndefined[Undefined]:Instantaneous\n"
+                            "Time\tRain\tLevel\tOther\n"
+                            "2020/01/01 00:00:00\t0.1\t1.25\t7\n"
+                            "2020/01/01 00:15:00\t\t1.5\t8\n"
+                            "2020/01/01 00:30:00\t0.3\t\t9\n";
+
+std::string ReadFile(const fs::path& path)
+{
+    std::ifstream in(path, std::ios::binary);
+    std::stringstream s;
+    s << in.rdbuf();
+    return s.str();
+}
+
+void WriteFile(const fs::path& path, const std::string& content) { std::ofstream(path, std::ios::binary) << content; }
+
+class EndToEnd : public ::testing::Test {
+protected:
+    void SetUp() override
+    {
+        static int counter = 0;
+        m_root = fs::temp_directory_path() / ("velmora-e2e-" + std::to_string(::getpid()) + "-" + std::to_string(counter++));
+        fs::remove_all(m_root);
+        fs::create_directories(m_root);
+    }
+    void TearDown() override { fs::remove_all(m_root); }
+
+    fs::path Path(const std::string& name) const { return m_root / name; }
+
+    struct Setup {
+        int type = 1;
+        Format in = Format::Ascii;
+        std::string input; // file or folder
+        std::string templateName;
+        std::string items; // "0, 2"
+        Format out = Format::Rbx0;
+        std::string output;
+    };
+
+    // Writes the host's document and runs the host program on it; returns its exit status.
+    int RunHost(const Setup& s)
+    {
+        const bool folder = s.type == 2;
+        std::ostringstream doc;
+        doc << "wpx 1\ntarget \"OkaToolbox\"\n  section \"Setup\"\n    Name = \"e2e run\"\n"
+            << "    section \"INPUT\"\n      Type = " << s.type << "\n      File_format = " << static_cast<int>(s.in)
+            << "\n      File_name = file \"" << (folder ? "" : s.input) << "\"\n      Folder_name = file \""
+            << (folder ? s.input : "") << "\"\n    end\n"
+            << "    section \"TEMPLATE\"\n      Template_option = 1\n      Template_name = file \"" << s.templateName
+            << "\"\n      Items = " << s.items << "\n    end\n"
+            << "    section \"OUTPUT\"\n      File_format = " << static_cast<int>(s.out) << "\n      File_name = file \""
+            << (folder ? "" : s.output) << "\"\n      Folder_name = file \"" << (folder ? s.output : "")
+            << "\"\n      File_title = \"E2E\"\n      Log_file = file \"" << Path("run.log").string() << "\"\n    end\n"
+            << "  end\nend\nwpx end\n";
+        WriteFile(Path("setup.wpx"), doc.str());
+        const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora run --silent '" + Path("setup.wpx").string() +
+                                    "' >'" + Path("host.out").string() + "' 2>&1";
+        const int status = std::system(command.c_str());
+        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    }
+
+    std::string Log() const { return ReadFile(m_root / "run.log"); }
+
+    // `kSample` in `format` at `path`, made with the library.
+    void MakeInput(Format format, const fs::path& path)
+    {
+        if (format == Format::Ascii) {
+            WriteFile(path, kSample);
+            return;
+        }
+        WriteFile(Path("seed.txt"), kSample);
+        converter::Status status;
+        auto spec = converter::LoadTemplate(Format::Ascii, "", status);
+        auto report = converter::ConvertFile({Format::Ascii, Path("seed.txt").string(), spec.get(), {}, format, path.string(), ""});
+        ASSERT_TRUE(report.converted) << report.problem.Describe();
+        fs::remove(Path("seed.txt"));
+    }
+
+    // The file at `path` read back as text in the engine's own layout.
+    std::string AsText(Format format, const fs::path& path)
+    {
+        if (format == Format::Ascii)
+            return ReadFile(path);
+        converter::Status status;
+        auto spec = converter::LoadTemplate(format, "", status);
+        const fs::path text = Path("readback.txt");
+        auto report = converter::ConvertFile({format, path.string(), spec.get(), {}, Format::Ascii, text.string(), ""});
+        EXPECT_TRUE(report.converted) << report.problem.Describe();
+        return ReadFile(text);
+    }
+
+    fs::path m_root;
+};
+
+const std::string kSelectedAsText = "Undefined[Undefined]:Instantaneous\tRainfall[mm]:Accumulated\n"
+                                    "Time\tOther\tRain\n"
+                                    "2020/01/01 00:00:00\t7\t0.1\n"
+                                    "2020/01/01 00:15:00\t8\t\n"
+                                    "2020/01/01 00:30:00\t9\t0.3\n";
+
+// Formats whose files the engine both writes and reads back today.
+const Format kReadableFormats[] = {Format::Rbx0, Format::Ascii};
+
+TEST_F(EndToEnd, EveryFormatPairSingleFileWithSelection)
+{
+    for (Format in : kReadableFormats)
+        for (Format out : kReadableFormats) {
+            SCOPED_TRACE(std::string(converter::FormatName(in)) + " to " + converter::FormatName(out));
+            const fs::path input = Path(std::string("in") + converter::OutputExtension(in));
+            const fs::path output = Path(std::string("out") + converter::OutputExtension(out));
+            MakeInput(in, input);
+            ASSERT_EQ(RunHost({1, in, input.string(), "", "2, 0", out, output.string()}), 0)
+                << ReadFile(Path("host.out")) << Log();
+            std::string expected = kSelectedAsText;
+            if (in == Format::Rbx0 || out == Format::Rbx0) // an rbx0 file has no title for its time column
+                expected.replace(expected.find("Time\t"), 4, "Date/time");
+            EXPECT_EQ(AsText(out, output), expected);
+            fs::remove(output);
+        }
+}
+
+TEST_F(EndToEnd, ExcelOutputIsWrittenFromEveryReadableInput)
+{
+    for (Format in : kReadableFormats) {
+        const fs::path input = Path(std::string("in") + converter::OutputExtension(in));
+        MakeInput(in, input);
+        ASSERT_EQ(RunHost({1, in, input.string(), "", "", Format::Excel, Path("out.xlsx").string()}), 0) << Log();
+        EXPECT_EQ(ReadFile(Path("out.xlsx")).substr(0, 2), "PK");
+        EXPECT_NE(Log().find("3 time steps, 3 of 3 items"), std::string::npos) << Log();
+    }
+}
+
+TEST_F(EndToEnd, FolderWithAMisfitConvertsTheRestAndFails)
+{
+    fs::create_directories(Path("in"));
+    fs::create_directories(Path("out"));
+    WriteFile(Path("in/a.txt"), kSample);
+    WriteFile(Path("in/b.csv"), kSample);
+    WriteFile(Path("in/misfit.txt"), "no template describes this\n");
+    WriteFile(Path("out/misfit.rbx0"), "an older output");
+    EXPECT_EQ(RunHost({2, Format::Ascii, Path("in").string(), "", "", Format::Rbx0, Path("out").string()}), 1);
+    EXPECT_EQ(AsText(Format::Rbx0, Path("out/a.rbx0")), kSample.substr(0, kSample.find("Time")) + "Date/time" +
+                                                               kSample.substr(kSample.find("Time") + 4));
+    EXPECT_TRUE(fs::exists(Path("out/b.rbx0")));
+    EXPECT_EQ(ReadFile(Path("out/misfit.rbx0")), "an older output");
+    EXPECT_NE(Log().find("SKIPPED " + Path("in/misfit.txt").string()), std::string::npos) << Log();
+    EXPECT_NE(Log().find("Some files are skipped because they do not match the template."), std::string::npos);
+}
+
+TEST_F(EndToEnd, BrokenLineFarIntoTheFileFailsWithItsLineAndNoOutput)
+{
+    std::string content = kSample.substr(0, kSample.find("2020"));
+    long long seconds = 0;
+    char line[96];
+    for (int n = 3; n <= 500005; ++n, ++seconds) {
+        std::snprintf(line, sizeof line, "2020/01/%02lld %02lld:%02lld:%02lld\t%d\t1\t2\n", 1 + seconds / 86400,
+                      seconds / 3600 % 24, seconds / 60 % 60, seconds % 60, n);
+        content += n == 500000 ? std::string("2020/01/01 00:00:00\t1\t2\n") : std::string(line);
+    }
+    WriteFile(Path("big.txt"), content);
+    EXPECT_EQ(RunHost({1, Format::Ascii, Path("big.txt").string(), "", "", Format::Rbx0, Path("big.rbx0").string()}), 1);
+    EXPECT_FALSE(fs::exists(Path("big.rbx0")));
+    EXPECT_NE(Log().find(Path("big.txt").string() + ":500000: "), std::string::npos) << Log();
+    for (const auto& entry : fs::directory_iterator(m_root))
+        EXPECT_EQ(entry.path().filename().string().find(".part-"), std::string::npos) << entry.path();
+}
+
+TEST_F(EndToEnd, DamagedInputsFailWithAClearEntry)
+{
+    MakeInput(Format::Rbx0, Path("good.rbx0"));
+    const std::string bytes = ReadFile(Path("good.rbx0"));
+    WriteFile(Path("cut.rbx0"), bytes.substr(0, bytes.size() - 5));
+    EXPECT_EQ(RunHost({1, Format::Rbx0, Path("cut.rbx0").string(), "", "", Format::Ascii, Path("cut.txt").string()}), 1);
+    EXPECT_FALSE(fs::exists(Path("cut.txt")));
+    EXPECT_NE(Log().find(Path("cut.rbx0").string() + ": "), std::string::npos) << Log();
+
+    MakeInput(Format::Excel, Path("good.xlsx"));
+    const std::string workbook = ReadFile(Path("good.xlsx"));
+    WriteFile(Path("bad.xlsx"), workbook.substr(0, workbook.size() / 2));
+    EXPECT_EQ(RunHost({1, Format::Excel, Path("bad.xlsx").string(), "", "", Format::Ascii, Path("bad.txt").string()}), 1);
+    EXPECT_FALSE(fs::exists(Path("bad.txt")));
+    EXPECT_NE(Log().find(Path("bad.xlsx").string() + ": "), std::string::npos) << Log();
+}
+
+TEST_F(EndToEnd, EngineProgramHelpAndUsage)
+{
+    const std::string engine = std::string(VELMORA_BIN_DIR) + "/Velmora";
+    auto status = [](const std::string& command) {
+        const int s = std::system((command + " >/dev/null 2>&1").c_str());
+        return WIFEXITED(s) ? WEXITSTATUS(s) : -1;
+    };
+    EXPECT_EQ(status(engine + " --help"), 0);
+    EXPECT_EQ(status(engine), 2);
+    EXPECT_EQ(status(engine + " --bogus x.wpx"), 2);
+    EXPECT_EQ(status(engine + " '" + Path("missing.wpx").string() + "' 1"), 3);
+}
+
+} // namespace
