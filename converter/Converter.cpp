@@ -195,8 +195,10 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     std::unique_ptr<SeriesReader> reader = MakeReader(job.inputFormat, job.spec);
     if (!reader)
         return Refuse(report, Status::Fail(job.input, 0, std::string(FormatName(job.inputFormat)) + " input needs a template"), false);
+    // Only a template can fail to fit; an rbx0 file that cannot be opened is damaged.
+    const bool throughTemplate = job.inputFormat != Format::Rbx0;
     if (Status opened = reader->Open(job.input); !opened)
-        return Refuse(report, opened, false);
+        return Refuse(report, opened, !throughTemplate);
     report.itemsInFile = reader->Header().items.size();
     const std::vector<size_t> selection = ResolveSelection(job.items, report.itemsInFile, report.notes);
     if (selection.empty())
@@ -226,7 +228,7 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
             progress(report.rows, reader->BytesConsumed());
     }
     if (!reader->status())
-        return Refuse(report, reader->status(), report.rows > 0);
+        return Refuse(report, reader->status(), report.rows > 0 || !throughTemplate);
     if (report.rows > 0)
         report.lastStamp = FormatStamp(row.stamp);
     if (Status finished = writer->Finish(); !finished)

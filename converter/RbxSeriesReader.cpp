@@ -12,6 +12,13 @@ namespace converter {
 namespace {
 // A block holds at most this many values, whatever the number of items.
 constexpr size_t kValuesPerBlock = 64 * 1024;
+
+// The reader's messages may already name the file; the problem names it once.
+std::string WithoutPath(const std::string& message, const std::string& path)
+{
+    const std::string prefix = path + ": ";
+    return message.compare(0, prefix.size(), prefix) == 0 ? message.substr(prefix.size()) : message;
+}
 } // namespace
 
 RbxSeriesReader::RbxSeriesReader() : m_reader(std::make_unique<rbx::CRbxReader>()) {}
@@ -21,7 +28,7 @@ Status RbxSeriesReader::Open(const std::string& path)
 {
     m_path = path;
     if (!m_reader->Open(path))
-        return m_status = Status::Fail(path, 0, m_reader->Error());
+        return m_status = Status::Fail(path, 0, WithoutPath(m_reader->Error(), path));
     const rbx::FileHeader& header = m_reader->Header();
     const rbx::TimeAxis& axis = header.axis;
     if (!rbx::IsCalendarAxis(axis.type))
@@ -74,7 +81,7 @@ bool RbxSeriesReader::FillBlock()
 {
     size_t got = 0;
     if (!m_reader->ReadSteps(m_blockSteps, m_times.data(), m_values.data(), got)) {
-        m_status = Status::Fail(m_path, 0, m_reader->Error() + " (after " + std::to_string(m_stepIndex) + " time steps)");
+        m_status = Status::Fail(m_path, 0, WithoutPath(m_reader->Error(), m_path) + " (after " + std::to_string(m_stepIndex) + " time steps)");
         return false;
     }
     m_inBlock = got;
