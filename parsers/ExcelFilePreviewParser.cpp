@@ -27,6 +27,16 @@ std::shared_ptr<T> Require(std::shared_ptr<T> object, const char* what)
     return object;
 }
 
+// The range of one cell. A place outside the grid has no address and is refused here, without
+// relying on the sheet to refuse an empty one.
+std::shared_ptr<sheet::CellRange> CellRangeAt(sheet::Worksheet& sheet, int row, int column)
+{
+    const CString address = CExcelFilePreviewParser::CellAddress(row, column);
+    if (address.empty())
+        throw sheet::AutomationError("no cell at row " + std::to_string(row) + ", column " + std::to_string(column));
+    return Require(sheet.Range(address), "Range");
+}
+
 } // namespace
 
 // ---------------------------------------------------------------------------------------------
@@ -247,7 +257,7 @@ CStringList CExcelFilePreviewParser::ReadTexts(sheet::Worksheet& sheet, int row,
     lastColumn = std::min(lastColumn, kLastSheetColumn);
     for (int column = firstColumn; column <= lastColumn; ++column) {
         try {
-            texts.push_back(VariantText(Require(sheet.Range(CellAddress(row, column)), "Range")->Text()));
+            texts.push_back(VariantText(CellRangeAt(sheet, row, column)->Text()));
         } catch (const sheet::AutomationError&) {
             if (keepPlaces)
                 texts.emplace_back();
@@ -278,7 +288,7 @@ int CExcelFilePreviewParser::ReadDateTimeCells(int row, int column, int n, std::
     for (int k = 0; k < n; ++k) {
         try {
             const int cellColumn = column > kLastSheetColumn - k ? kLastSheetColumn + 1 : column + k;
-            auto range = Require(sheet->Range(CellAddress(row, cellColumn)), "Range");
+            auto range = CellRangeAt(*sheet, row, cellColumn);
             cells[static_cast<size_t>(k)] = (n == 1 && !asText) ? range->Value2() : range->Text();
         } catch (const sheet::AutomationError&) {
             CloseWorkbook();

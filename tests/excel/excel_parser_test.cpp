@@ -178,6 +178,12 @@ TEST_F(ExcelParserTest, StartRowBeyondThePreviewBoundReadsNoDataRows)
     ASSERT_EQ(m_parser->Parse(""), 1);
     EXPECT_EQ(m_parser->m_vecRows.size(), 3u) << "metadata rows only";
     EXPECT_EQ(m_parser->m_vecRawLines.size(), 20u) << "header rows up to row 20";
+
+    // A row before the first has no cells: the data end at once.
+    m_spec.m_DataDesc.m_nStartRow = -2000000000;
+    ASSERT_EQ(m_parser->Parse(""), 1);
+    EXPECT_EQ(m_parser->m_vecRows.size(), 3u);
+    EXPECT_TRUE(m_parser->m_vecRawLines.empty());
 }
 
 TEST_F(ExcelParserTest, DataRowsEndAtRowTwentyAndAtTheFirstUnreadableStamp)
