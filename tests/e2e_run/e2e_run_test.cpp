@@ -170,6 +170,19 @@ INSTANTIATE_TEST_SUITE_P(
         ResultCase{"SilentOk", "0", 1, true, 0, ""}, ResultCase{"SilentFails", "9", 2, true, 1, ""}),
     [](const testing::TestParamInfo<ResultCase>& param) { return param.param.name; });
 
+TEST_F(E2eRun, WithoutOverrideTheEngineProgramBesideThePluginRuns)
+{
+    m_env.erase(m_env.begin()); // no VELMORA_ENGINE
+    m_env.emplace_back("PATH", "/nonexistent");
+    WriteFile(Path("docs/setup.wpx"), SetupDocument(1));
+    Outcome outcome = Host("run '" + Path("docs/setup.wpx") + "'");
+    // The input file does not exist, so the real engine program fails; it names the file it was given.
+    EXPECT_EQ(outcome.status, 1);
+    EXPECT_NE(outcome.err.find(Path("docs/data/in.csv")), std::string::npos) << outcome.err;
+    EXPECT_NE(outcome.err.find("Run Engine: Error running engine.\n"), std::string::npos) << outcome.err;
+    EXPECT_FALSE(EngineStarted()) << "the recording stand-in was not used";
+}
+
 TEST_F(E2eRun, DamagedOrMissingDocumentIsNamedWithItsLine)
 {
     WriteFile(Path("docs/bad.wpx"), "wpx 1\ntarget \"OkaToolbox\"\n  Name = \"unclosed\n");
