@@ -28,12 +28,13 @@ CString GetFixedText(const unsigned char* data, std::size_t offset, std::size_t 
     return value;
 }
 
-std::uint32_t HeaderChecksum(const std::vector<unsigned char>& bytes)
+// Over the whole header, its own field counted as zero bytes.
+std::uint32_t HeaderChecksum(const unsigned char* data, std::size_t size)
 {
-    std::uint32_t crc = Crc32(0, bytes.data(), layout::kHeaderChecksum);
+    std::uint32_t crc = Crc32(0, data, layout::kHeaderChecksum);
     const unsigned char zero[4] = {0, 0, 0, 0};
     crc = Crc32(crc, zero, 4);
-    return Crc32(crc, bytes.data() + layout::kHeaderChecksum + 4, bytes.size() - layout::kHeaderChecksum - 4);
+    return Crc32(crc, data + layout::kHeaderChecksum + 4, size - layout::kHeaderChecksum - 4);
 }
 
 bool DigitsAt(const CString& s, std::size_t pos, std::size_t count, int& value)
@@ -204,7 +205,7 @@ void PatchHeader(std::vector<unsigned char>& bytes, const FileHeader& header)
     PutFixedText(bytes, layout::kStartDate, header.axis.startDate, 10);
     PutFixedText(bytes, layout::kStartTime, header.axis.startTime, 8);
     bytes::PutAt<std::uint32_t>(bytes, layout::kDataChecksum, header.dataChecksum);
-    bytes::PutAt<std::uint32_t>(bytes, layout::kHeaderChecksum, HeaderChecksum(bytes));
+    bytes::PutAt<std::uint32_t>(bytes, layout::kHeaderChecksum, HeaderChecksum(bytes.data(), bytes.size()));
 }
 
 bool DecodeFixedPart(const unsigned char* data, std::size_t size, std::uint32_t& headerSize, CString& error)
@@ -242,8 +243,7 @@ bool DecodeHeader(const unsigned char* data, std::size_t size, std::uint64_t fil
         error = text::Format("the file is truncated inside its header (%u header bytes)", headerSize);
         return false;
     }
-    const std::vector<unsigned char> copy(data, data + size);
-    if (HeaderChecksum(copy) != bytes::Get<std::uint32_t>(data + layout::kHeaderChecksum)) {
+    if (HeaderChecksum(data, size) != bytes::Get<std::uint32_t>(data + layout::kHeaderChecksum)) {
         error = "the header checksum does not match (the header is damaged)";
         return false;
     }
