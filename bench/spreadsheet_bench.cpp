@@ -11,6 +11,7 @@
 #include <benchmark/benchmark.h>
 #include <xlsxwriter.h>
 
+#include <cstdio>
 #include <map>
 #include <string>
 #include <sys/resource.h>
@@ -20,9 +21,20 @@ namespace {
 
 constexpr int kColumns = 5;
 
+// The workbooks made for this run, removed when the program ends.
+struct MadeFiles {
+    std::map<long, std::string> paths;
+    ~MadeFiles()
+    {
+        for (const auto& [rows, path] : paths)
+            std::remove(path.c_str());
+    }
+};
+
 std::string MakeWorkbook(long rows)
 {
-    static std::map<long, std::string> made;
+    static MadeFiles files;
+    auto& made = files.paths;
     if (auto found = made.find(rows); found != made.end())
         return found->second;
     const std::string path = "/tmp/velmora-sheet-bench-" + std::to_string(::getpid()) + "-" + std::to_string(rows) + ".xlsx";

@@ -32,7 +32,8 @@ struct Variant {
 class CellRange {
 public:
     virtual ~CellRange() = default;
-    virtual Variant Text() const = 0;   // the displayed text of the first cell
+    // The displayed text; for several cells their common text, or Empty (null) when they differ.
+    virtual Variant Text() const = 0;
     virtual Variant Value2() const = 0; // raw values; an Array for more than one cell
     virtual int Count() const = 0;      // number of cells
     virtual int Column() const = 0;     // first column, from 1
