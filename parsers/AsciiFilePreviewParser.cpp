@@ -17,13 +17,12 @@ void Show(int stringId) { ui::ShowStringMessage(stringId); }
 ui::Row RawRow(const CString& line)
 {
     CString shown;
-    shown.reserve(line.size());
-    for (char c : line) {
-        if (c == '\t')
-            shown += "    ";
-        else
-            shown += c;
+    size_t from = 0;
+    for (size_t tab = line.find('\t'); tab != CString::npos; from = tab + 1, tab = line.find('\t', from)) {
+        shown.append(line, from, tab - from);
+        shown += "    ";
     }
+    shown.append(line, from, CString::npos);
     return ui::Row{std::move(shown)};
 }
 
@@ -63,11 +62,12 @@ int CAsciiFilePreviewParser::ReadLine(int n, CString& text)
     if (n < 0 || !sys::FileExists(m_strFile))
         return 0;
     CTextLineReader reader(m_strFile);
-    CString line;
-    int read = 0;
-    while (read < n && reader.ReadLine(line))
-        ++read;
-    text = read == n && n > 0 ? std::move(line) : CString();
+    text.clear();
+    int passed = 0;
+    while (passed + 1 < n && reader.SkipLine())
+        ++passed;
+    if (passed + 1 == n && !reader.ReadLine(text))
+        text.clear();
     return 1;
 }
 

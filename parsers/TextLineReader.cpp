@@ -43,3 +43,19 @@ bool CTextLineReader::ReadLine(CString& line)
         line.pop_back();
     return true;
 }
+
+bool CTextLineReader::SkipLine()
+{
+    bool readAny = false;
+    while (m_nBegin < m_nEnd || Fill()) {
+        readAny = true;
+        const char* begin = m_buffer.data() + m_nBegin;
+        const auto* newline = static_cast<const char*>(std::memchr(begin, '\n', m_nEnd - m_nBegin));
+        if (newline) {
+            m_nBegin += static_cast<size_t>(newline - begin) + 1;
+            return true;
+        }
+        m_nBegin = m_nEnd;
+    }
+    return readAny;
+}

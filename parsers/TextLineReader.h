@@ -14,6 +14,8 @@ public:
 
     // The next line into `line`; false at the end of the file. Throws CFileException on a read error.
     bool ReadLine(CString& line);
+    // Passes over the next line without keeping it; false at the end of the file.
+    bool SkipLine();
 
 private:
     // Refills the buffer; false at the end of the file.
