@@ -7,7 +7,6 @@
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
-#include <sstream>
 
 using namespace wpx;
 
@@ -182,28 +181,35 @@ int wpxRead(const CString& path, WPXHANDLE* doc, CString* error)
     *doc = nullptr;
     CString ignored;
     CString& message = error ? *error : ignored;
+    const CString shownPath = path.empty() ? CString("(no file name)") : path;
     std::error_code ec;
     if (std::filesystem::is_directory(path, ec)) {
-        message = path + ": is a folder; expected a parameter document";
+        message = shownPath + ": is a folder; expected a parameter document";
+        return 0;
+    }
+    if (std::filesystem::exists(path, ec) && !std::filesystem::is_regular_file(path, ec)) {
+        message = shownPath + ": is not a regular file; expected a parameter document";
         return 0;
     }
     std::ifstream in(path, std::ios::binary);
     if (path.empty() || !in) {
-        message = (path.empty() ? CString("(no file name)") : path) + ": cannot open the parameter document";
+        message = shownPath + ": cannot open the parameter document";
         return 0;
     }
     std::uintmax_t size = std::filesystem::file_size(path, ec);
-    if (!ec && size > kMaxDocumentBytes) {
-        message = path + ": the file is larger than 64 MiB; expected a parameter document";
+    if (ec || size > kMaxDocumentBytes) {
+        message = shownPath + (ec ? ": cannot tell the size of the parameter document"
+                                  : ": the file is larger than 64 MiB; expected a parameter document");
         return 0;
     }
-    std::ostringstream content;
-    content << in.rdbuf();
+    std::string content(static_cast<size_t>(size), '\0');
+    in.read(content.data(), static_cast<std::streamsize>(content.size()));
     if (in.bad()) {
-        message = path + ": cannot read the parameter document";
+        message = shownPath + ": cannot read the parameter document";
         return 0;
     }
-    return wpxParse(content.str(), path, AbsoluteFolderOf(path), doc, &message);
+    content.resize(static_cast<size_t>(in.gcount())); // shorter if the file shrank meanwhile
+    return wpxParse(content, path, AbsoluteFolderOf(path), doc, &message);
 }
 
 WPXHANDLE wpxTargetByNum(WPXHANDLE doc, int n)

@@ -260,7 +260,7 @@ TEST(WpxRead, NoTruncationOfAValidFileIsAccepted)
     }
 }
 
-TEST(WpxRead, MissingFileAndFolderAreNamed)
+TEST(WpxRead, MissingFileFolderDeviceAndHugeFileAreRefused)
 {
     ScratchFolder scratch;
     WPXHANDLE doc = nullptr;
@@ -270,6 +270,12 @@ TEST(WpxRead, MissingFileAndFolderAreNamed)
     EXPECT_EQ(wpxRead(scratch.Path(), &doc, &error), 0);
     EXPECT_NE(error.find("is a folder"), std::string::npos) << error;
     EXPECT_EQ(doc, nullptr);
+    EXPECT_EQ(wpxRead("/dev/zero", &doc, &error), 0) << "an endless device is not read";
+    EXPECT_NE(error.find("/dev/zero: is not a regular file"), std::string::npos) << error;
+    WriteText(scratch.File("huge.wpx"), "wpx 1\n");
+    fs::resize_file(scratch.File("huge.wpx"), (64u << 20) + 1); // sparse: costs no disk
+    EXPECT_EQ(wpxRead(scratch.File("huge.wpx"), &doc, &error), 0);
+    EXPECT_NE(error.find("larger than 64 MiB"), std::string::npos) << error;
 }
 
 TEST(WpxHandles, SurviveA32BitIntAndDieWithTheirDocument)
