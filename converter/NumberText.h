@@ -21,6 +21,7 @@ public:
 
 private:
     std::string m_separator;
+    bool m_pointSeparator = false;
     char m_other = 0; // the separator that must not appear when "." or "," is in force; 0 for none
 };
 

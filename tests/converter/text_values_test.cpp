@@ -8,6 +8,8 @@
 
 #include <cmath>
 #include <random>
+#include <charconv>
+#include <cstring>
 
 using namespace converter;
 
@@ -142,6 +144,53 @@ TEST(FormatValue, ShortestTextReadsBackExactly)
     }
     char buffer[40];
     EXPECT_EQ(FormatValue(kMissing, buffer), buffer);
+}
+
+} // namespace
+
+namespace {
+
+TEST(NumberReader, FastDecimalsAgreeWithFromChars)
+{
+    std::mt19937_64 random(99);
+    NumberReader reader(".");
+    for (int n = 0; n < 200000; ++n) {
+        const int digits = 1 + static_cast<int>(random() % 17);
+        std::string text = (random() % 4 == 0) ? "-" : "";
+        const int point = static_cast<int>(random() % (digits + 1));
+        for (int i = 0; i < digits; ++i) {
+            if (i == point && i > 0)
+                text += '.';
+            text += static_cast<char>('0' + random() % 10);
+        }
+        double fast = 0, reference = 0;
+        ASSERT_EQ(reader.Read(text, fast), ValueText::Number) << text;
+        std::from_chars(text.data(), text.data() + text.size(), reference);
+        ASSERT_EQ(fast, reference) << text;
+    }
+}
+
+TEST(FormatValue, RandomValuesReadBackExactly)
+{
+    std::mt19937_64 random(5);
+    NumberReader reader(".");
+    for (int n = 0; n < 200000; ++n) {
+        double value;
+        switch (n % 3) {
+        case 0: value = static_cast<double>(static_cast<std::int64_t>(random() % 2000000000) - 1000000000) / 10000.0; break;
+        case 1: value = std::ldexp(static_cast<double>(random() >> 11), static_cast<int>(random() % 200) - 100); break;
+        default: value = static_cast<double>(random() % 1000) * 1e-7; break;
+        }
+        char buffer[40];
+        const std::string text(buffer, FormatValue(value, buffer));
+        double back = 0;
+        ASSERT_EQ(reader.Read(text, back), ValueText::Number) << text;
+        ASSERT_EQ(back, value) << text;
+    }
+    char buffer[40];
+    EXPECT_EQ(std::string(buffer, FormatValue(255.069, buffer)), "255.069");
+    EXPECT_EQ(std::string(buffer, FormatValue(-0.05, buffer)), "-0.05");
+    EXPECT_EQ(std::string(buffer, FormatValue(7.0, buffer)), "7");
 }
 
 } // namespace
