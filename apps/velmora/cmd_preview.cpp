@@ -93,6 +93,17 @@ int ReadOptions(int argc, char** argv, Options& options)
     return -1;
 }
 
+// The preview rows; without a selection they are the parser's rows, which are used in place because
+// an rbx0 table can take gigabytes.
+template <typename Use>
+void WithPreviewRows(const CFilePreviewParser& parser, Use use)
+{
+    if (parser.EffectiveSelection().empty())
+        use(parser.m_vecRows);
+    else
+        use(parser.BuildPreviewRows());
+}
+
 // --- JSON output -----------------------------------------------------------------------------------
 
 // Appends `text` as a JSON string. Bytes that are not UTF-8 become U+FFFD, so the output stays valid.
@@ -181,7 +192,7 @@ void WriteJson(const CFilePreviewParser& parser, bool ok, const ui::ScriptedUser
     std::string titles = ",\n\"previewTitles\":";
     AppendJsonList(titles, parser.BuildPreviewTitles());
     std::fwrite(titles.data(), 1, titles.size(), stdout);
-    WriteJsonRows(stdout, "previewRows", parser.BuildPreviewRows());
+    WithPreviewRows(parser, [](const ui::Rows& rows) { WriteJsonRows(stdout, "previewRows", rows); });
     std::fputs("}\n", stdout);
 }
 
@@ -231,7 +242,7 @@ void WriteText(const CFilePreviewParser& parser, bool ok, const ui::ScriptedUser
         std::printf("\n");
     }
     std::printf("Import result\n");
-    PrintTable(parser.BuildPreviewTitles(), parser.BuildPreviewRows());
+    WithPreviewRows(parser, [&parser](const ui::Rows& rows) { PrintTable(parser.BuildPreviewTitles(), rows); });
     std::printf("\n%s\n", ok ? "Parse succeeded." : "Parse failed.");
 }
 
