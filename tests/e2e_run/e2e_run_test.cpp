@@ -183,6 +183,18 @@ TEST_F(E2eRun, WithoutOverrideTheEngineProgramBesideThePluginRuns)
     EXPECT_FALSE(EngineStarted()) << "the recording stand-in was not used";
 }
 
+TEST_F(E2eRun, ShippedExampleConvertsWithTheRealEngineProgram)
+{
+    // A copy, so the conversion writes nothing into the source tree.
+    fs::copy(std::string(VELMORA_SOURCE_DIR) + "/examples", Path("examples"), fs::copy_options::recursive);
+    m_env.erase(m_env.begin()); // no VELMORA_ENGINE
+    Outcome outcome = Host("run '" + Path("examples/ascii-to-rbx0.wpx") + "'");
+    EXPECT_EQ(outcome.status, 0) << outcome.err;
+    EXPECT_NE(outcome.err.find("Run Engine: Status: OK\n"), std::string::npos) << outcome.err;
+    EXPECT_GT(fs::file_size(Path("examples/river_gauge.converted.rbx0")), 0u);
+    EXPECT_TRUE(fs::is_empty(Path("tmp"))) << "the temporary setup file is gone";
+}
+
 TEST_F(E2eRun, DamagedOrMissingDocumentIsNamedWithItsLine)
 {
     WriteFile(Path("docs/bad.wpx"), "wpx 1\ntarget \"OkaToolbox\"\n  Name = \"unclosed\n");
