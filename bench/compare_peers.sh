@@ -1,0 +1,82 @@
+#!/usr/bin/env bash
+# Text <-> rbx0 conversion speed beside its peers, in one run on one core: cat (the limit), pandas
+# (read_csv, to_datetime with the explicit format, written to a binary file) and DuckDB (its npm
+# package, one thread, written to Parquet). Installs python3-pandas (apt) and DuckDB (npm, into a
+# temporary folder) when they are missing.
+#   bench/compare_peers.sh [BUILD_DIR] [ROWS]     (defaults: build, 1000000)
+set -euo pipefail
+cd "$(dirname "$0")/.."
+build="${1:-build}"
+rows="${2:-1000000}"
+engine="$build/bin/Velmora"
+[ -x "$engine" ] || { echo "no engine program at $engine; build first" >&2; exit 2; }
+work="$(mktemp -d)"
+trap 'rm -rf "$work"' EXIT
+
+if ! /usr/bin/python3 -c 'import pandas' 2>/dev/null; then
+  echo "installing python3-pandas ..." >&2
+  (apt-get update -qq && apt-get install -y -qq python3-pandas) >/dev/null
+fi
+if [ ! -d "$work/duckdb/node_modules/@duckdb/node-api" ]; then
+  echo "installing DuckDB for node into $work/duckdb ..." >&2
+  mkdir -p "$work/duckdb"
+  (cd "$work/duckdb" && npm init -y >/dev/null && npm install --silent @duckdb/node-api >/dev/null)
+fi
+
+echo "generating $rows rows ..." >&2
+/usr/bin/python3 - "$work/series.txt" "$rows" <<'PY'
+import random, sys, datetime
+path, rows = sys.argv[1], int(sys.argv[2])
+random.seed(1)
+t, step = datetime.datetime(2000, 1, 1), datetime.timedelta(minutes=1)
+with open(path, "w") as f:
+    f.write("\t".join(["Undefined[Undefined]:Instantaneous"] * 10) + "\n")
+    f.write("Date/time\t" + "\t".join("V%d" % i for i in range(10)) + "\n")
+    for _ in range(rows):
+        f.write(t.strftime("%Y/%m/%d %H:%M:%S") + "\t" + "\t".join("%.4f" % (random.random() * 1000) for _ in range(10)) + "\n")
+        t += step
+PY
+bytes=$(stat -c %s "$work/series.txt")
+
+setup() { # input-format input output-format output
+  printf 'wpx 1\ntarget "VELMORA"\n section "INPUT"\n  Type = 1\n  File_format = %s\n  File_name = file "%s"\n end\n section "OUTPUT"\n  File_format = %s\n  File_name = file "%s"\n  Log_file = file "%s"\n end\nend\nwpx end\n' \
+    "$1" "$2" "$3" "$4" "$work/log.txt" > "$work/setup.wpx"
+}
+measure() { # name command...
+  local name="$1"; shift
+  /usr/bin/time -f "%e %M" -o "$work/time" "$@" >/dev/null
+  read -r seconds kb < "$work/time"
+  awk -v n="$name" -v s="$seconds" -v kb="$kb" -v b="$bytes" -v r="$rows" \
+    'BEGIN { if (s < 0.005) s = 0.005; printf "| %-28s | %7.2f | %8.1f | %10.0f | %7.1f |\n", n, s, b / s / 1e6, r / s, kb / 1024 }'
+}
+
+cat > "$work/pandas_read.py" <<'PY'
+import sys, numpy, pandas
+frame = pandas.read_csv(sys.argv[1], sep="\t", skiprows=[0])
+stamps = pandas.to_datetime(frame.iloc[:, 0], format="%Y/%m/%d %H:%M:%S")
+with open(sys.argv[2], "wb") as out:
+    stamps.to_numpy().astype("int64").tofile(out)
+    frame.iloc[:, 1:].to_numpy(dtype=numpy.float64).tofile(out)
+PY
+cat > "$work/duckdb/convert.mjs" <<'JS'
+import { DuckDBInstance } from "@duckdb/node-api";
+const instance = await DuckDBInstance.create(":memory:", { threads: "1" });
+const connection = await instance.connect();
+await connection.run(`COPY (SELECT strptime("Date/time", '%Y/%m/%d %H:%M:%S') AS stamp, * EXCLUDE ("Date/time")
+  FROM read_csv('${process.argv[2]}', delim='\t', skip=1, header=true)) TO '${process.argv[3]}' (FORMAT parquet)`);
+JS
+
+echo "| What (one core)              | seconds |     MB/s |     rows/s | peak MB |"
+echo "|------------------------------|---------|----------|------------|---------|"
+measure "cat" cat "$work/series.txt"
+setup 2 "$work/series.txt" 1 "$work/series.rbx0"
+measure "Velmora text -> rbx0" "$engine" "$work/setup.wpx" 1 --threads 1 --quiet
+setup 1 "$work/series.rbx0" 2 "$work/back.txt"
+measure "Velmora rbx0 -> text" "$engine" "$work/setup.wpx" 1 --threads 1 --quiet
+head -n $((rows / 10 + 2)) "$work/series.txt" > "$work/tenth.txt"
+setup 2 "$work/tenth.txt" 3 "$work/tenth.xlsx"
+bytes_all=$bytes; rows_all=$rows; bytes=$(stat -c %s "$work/tenth.txt"); rows=$((rows / 10))
+measure "Velmora text -> xlsx (1/10)" "$engine" "$work/setup.wpx" 1 --threads 1 --quiet
+bytes=$bytes_all; rows=$rows_all
+measure "pandas read_csv + binary" /usr/bin/python3 "$work/pandas_read.py" "$work/series.txt" "$work/pandas.bin"
+measure "DuckDB 1 thread + Parquet" node "$work/duckdb/convert.mjs" "$work/series.txt" "$work/duck.parquet"

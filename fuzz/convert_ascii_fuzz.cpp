@@ -1,0 +1,78 @@
+// The engine's ASCII reader on arbitrary bytes, through a new template's defaults and through a
+// comma template that ignores consecutive and leading delimiters; the fast splitter must also give
+// NextField's calls for every line.
+#include "converter/AsciiSeriesReader.h"
+#include "converter/FieldSplitter.h"
+#include "platform/ui/UserInterface.h"
+#include "templates/AsciiSpecification.h"
+
+#include <cstdint>
+#include <cstdio>
+#include <string>
+#include <unistd.h>
+
+namespace {
+
+void ReadWhole(const CSpecification& spec, const std::string& path)
+{
+    converter::AsciiSeriesReader reader(spec);
+    if (!reader.Open(path))
+        return;
+    converter::Row row;
+    while (reader.Next(row)) {
+    }
+}
+
+void CompareSplits(const CSpecification& spec, const std::string& line)
+{
+    converter::FieldSplitter splitter(spec);
+    splitter.Split(line);
+    CString copy = line;
+    int pos = 0;
+    size_t call = 0;
+    do {
+        const CString field = spec.NextField(copy, pos);
+        if (call >= splitter.Calls().size() || splitter.Calls()[call].text != field || splitter.Calls()[call].end != pos)
+            __builtin_trap();
+        ++call;
+    } while (pos != -1);
+    if (call != splitter.Calls().size())
+        __builtin_trap();
+}
+
+} // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
+{
+    static ui::SilentUserInterface silent;
+    static ui::ScopedUserInterface scope(silent);
+    static const std::string path = "/tmp/convert_ascii_fuzz_" + std::to_string(::getpid()) + ".txt";
+    std::FILE* file = std::fopen(path.c_str(), "wb");
+    if (!file)
+        return 0;
+    std::fwrite(data, 1, size, file);
+    std::fclose(file);
+
+    CAsciiSpecification defaults;
+    ReadWhole(defaults, path);
+    CAsciiSpecification comma;
+    comma.m_strDelimiter = "Comma";
+    comma.m_bIgnoreConsecutiveDelimiters = 1;
+    comma.m_bIgnoreBegginingOfLineDelimiters = size % 2;
+    comma.m_DataDesc.m_nUnitTypeOption = 0;
+    comma.m_DataDesc.m_nUnitOption = 0;
+    comma.m_DataDesc.m_nValueTypeOption = 0;
+    ReadWhole(comma, path);
+
+    const std::string text(reinterpret_cast<const char*>(data), size < 4096 ? size : 4096);
+    size_t start = 0;
+    while (start <= text.size()) {
+        size_t end = text.find('\n', start);
+        if (end == std::string::npos)
+            end = text.size();
+        CompareSplits(comma, text.substr(start, end - start));
+        start = end + 1;
+    }
+    std::remove(path.c_str());
+    return 0;
+}
