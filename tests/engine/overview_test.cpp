@@ -59,15 +59,6 @@ TEST(OverviewText, EmptyItemListLeavesALineWithOneTab)
     EXPECT_NE(text.find("\tTemplate_name: /t/ascii.xml\r\n\t\r\n\r\nOUTPUT\r\n"), std::string::npos) << text;
 }
 
-TEST(OverviewText, SingleItemHasNoComma)
-{
-    CEngine engine;
-    SingleAsciiFile(engine).m_arrItems = {0};
-    CString text;
-    engine.GetOverviewText(text);
-    EXPECT_NE(text.find("\tItems: 0\r\n"), std::string::npos) << text;
-}
-
 TEST(OverviewText, UnknownFormatPrintsAnEmptyBridgeName)
 {
     CEngine engine;
