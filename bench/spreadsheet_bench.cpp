@@ -68,7 +68,7 @@ void Preview(benchmark::State& state, int retainedRows)
     const std::string path = MakeWorkbook(state.range(0));
     sheet::ApplicationSettings settings;
     settings.load.retainedRows = retainedRows;
-    auto app = sheet::CreateApplication(settings);
+    auto app = sheet::StartApplication(settings);
     for (auto _ : state) {
         auto book = app->Workbooks()->Open(path);
         auto ws = book->Worksheets()->Item(1);

@@ -41,7 +41,7 @@ void WalkWorkbook(const std::string& path)
     sheet::ApplicationSettings settings;
     settings.maxArrayCells = 100000;
     settings.load.retainedRows = 20;
-    auto app = sheet::CreateApplication(settings);
+    auto app = sheet::StartApplication(settings);
     try {
         auto sheets = app->Workbooks()->Open(path)->Worksheets();
         for (int s = 1; s <= sheets->Count() && s <= 4; ++s) {

@@ -282,7 +282,7 @@ std::optional<ApplicationSettings> SettingsFromEnvironment()
     return settings;
 }
 
-std::shared_ptr<Application> CreateApplication(const ApplicationSettings& settings)
+std::shared_ptr<Application> StartApplication(const ApplicationSettings& settings)
 {
     return std::make_shared<ApplicationImpl>(settings);
 }
@@ -292,7 +292,7 @@ std::shared_ptr<Application> CreateApplication()
     std::optional<ApplicationSettings> settings = SettingsFromEnvironment();
     if (!settings)
         return nullptr;
-    return CreateApplication(*settings);
+    return StartApplication(*settings);
 }
 
 } // namespace sheet

@@ -21,6 +21,6 @@ struct ApplicationSettings {
 std::optional<ApplicationSettings> SettingsFromEnvironment();
 
 // Starts an application with explicit settings, whatever the environment says.
-std::shared_ptr<Application> CreateApplication(const ApplicationSettings& settings);
+std::shared_ptr<Application> StartApplication(const ApplicationSettings& settings);
 
 } // namespace sheet

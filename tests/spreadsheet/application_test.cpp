@@ -63,11 +63,11 @@ std::string MakeSeriesWorkbook()
     return path;
 }
 
-std::shared_ptr<Application> StartApplication(int retainedRows = 1000)
+std::shared_ptr<Application> StartWithWindow(int retainedRows = 1000)
 {
     ApplicationSettings settings;
     settings.load.retainedRows = retainedRows;
-    return CreateApplication(settings);
+    return StartApplication(settings);
 }
 
 std::shared_ptr<Worksheet> FirstSheet(const std::shared_ptr<Application>& app, const std::string& path)
@@ -109,7 +109,7 @@ TEST(SpreadsheetApplication, EnvironmentMakesItAbsentOrOlder)
 
 TEST(SpreadsheetApplication, SheetsAreCountedAndIndexedFromOne)
 {
-    auto app = StartApplication();
+    auto app = StartWithWindow();
     auto sheets = app->Workbooks()->Open(MakeSeriesWorkbook())->Worksheets();
     EXPECT_EQ(sheets->Count(), 2);
     EXPECT_NE(sheets->Item(2), nullptr);
@@ -119,7 +119,7 @@ TEST(SpreadsheetApplication, SheetsAreCountedAndIndexedFromOne)
 
 TEST(SpreadsheetApplication, TextShowsTheFormattedValueAndValue2TheRawOne)
 {
-    auto app = StartApplication();
+    auto app = StartWithWindow();
     auto sheet = FirstSheet(app, MakeSeriesWorkbook());
     EXPECT_EQ(TextAt(*sheet, "C3"), "2021/05/17");
     EXPECT_EQ(TextAt(*sheet, "D3"), "4.50");
@@ -139,7 +139,7 @@ TEST(SpreadsheetApplication, TextShowsTheFormattedValueAndValue2TheRawOne)
 
 TEST(SpreadsheetApplication, UsedRangeIsTheSmallestBlockHoldingEveryValue)
 {
-    auto app = StartApplication();
+    auto app = StartWithWindow();
     auto sheet = FirstSheet(app, MakeSeriesWorkbook());
     auto used = sheet->UsedRange();
     EXPECT_EQ(used->Column(), 3);
@@ -155,7 +155,7 @@ TEST(SpreadsheetApplication, UsedRangeIsTheSmallestBlockHoldingEveryValue)
 
 TEST(SpreadsheetApplication, EmptySheetHasTheFirstCellAsUsedRange)
 {
-    auto app = StartApplication();
+    auto app = StartWithWindow();
     auto sheets = app->Workbooks()->Open(MakeSeriesWorkbook())->Worksheets();
     auto used = sheets->Item(2)->UsedRange();
     EXPECT_EQ(used->Count(), 1);
@@ -165,7 +165,7 @@ TEST(SpreadsheetApplication, EmptySheetHasTheFirstCellAsUsedRange)
 
 TEST(SpreadsheetApplication, RangeBetweenTwoCellsInEitherOrder)
 {
-    auto app = StartApplication();
+    auto app = StartWithWindow();
     auto sheet = FirstSheet(app, MakeSeriesWorkbook());
     for (auto range : {sheet->Range("C2", "E3"), sheet->Range("E3", "C2"), sheet->Range("C2:E3")}) {
         EXPECT_EQ(range->Count(), 6);
@@ -182,7 +182,7 @@ TEST(SpreadsheetApplication, RangeBetweenTwoCellsInEitherOrder)
 
 TEST(SpreadsheetApplication, BadAddressesFailLikeAutomationErrors)
 {
-    auto app = StartApplication();
+    auto app = StartWithWindow();
     auto sheet = FirstSheet(app, MakeSeriesWorkbook());
     for (const char* address : {"", "3C", "A0", "XFE1", "A1048577", "A1B", "AAAAA1"})
         EXPECT_THROW(sheet->Range(address), AutomationError) << address;
@@ -191,7 +191,7 @@ TEST(SpreadsheetApplication, BadAddressesFailLikeAutomationErrors)
 
 TEST(SpreadsheetApplication, ClosedWorkbookObjectsAreDisconnected)
 {
-    auto app = StartApplication();
+    auto app = StartWithWindow();
     auto book = app->Workbooks()->Open(MakeSeriesWorkbook());
     auto sheets = book->Worksheets();
     auto sheet = sheets->Item(1);
@@ -207,7 +207,7 @@ TEST(SpreadsheetApplication, ClosedWorkbookObjectsAreDisconnected)
 
 TEST(SpreadsheetApplication, QuitDisconnectsEverything)
 {
-    auto app = StartApplication();
+    auto app = StartWithWindow();
     auto workbooks = app->Workbooks();
     auto sheet = FirstSheet(app, MakeSeriesWorkbook());
     app->Quit();
@@ -218,7 +218,7 @@ TEST(SpreadsheetApplication, QuitDisconnectsEverything)
 
 TEST(SpreadsheetApplication, MissingFileFailsToOpenNamingIt)
 {
-    auto app = StartApplication();
+    auto app = StartWithWindow();
     std::string missing = sheettest::TempFile("no-such.xlsx");
     try {
         app->Workbooks()->Open(missing);
@@ -236,7 +236,7 @@ TEST(SpreadsheetApplication, RowsBeyondTheHeldWindowAreReadOnDemand)
         book.Number(sheet, row, 1, row);
     std::string path = book.Close();
 
-    auto app = StartApplication(20);
+    auto app = StartWithWindow(20);
     auto ws = FirstSheet(app, path);
     EXPECT_EQ(TextAt(*ws, "A20"), "20");
     EXPECT_EQ(TextAt(*ws, "A250"), "250");
@@ -249,7 +249,7 @@ TEST(SpreadsheetApplication, OversizedRangeValuesFailInsteadOfExhaustingMemory)
 {
     ApplicationSettings settings;
     settings.maxArrayCells = 100;
-    auto app = CreateApplication(settings);
+    auto app = StartApplication(settings);
     auto ws = FirstSheet(app, MakeSeriesWorkbook());
     EXPECT_THROW(ws->Range("A1", "J11")->Value2(), AutomationError);
     EXPECT_THROW(ws->Range("A1", "J11")->Text(), AutomationError);

@@ -25,7 +25,7 @@ std::string Text(Worksheet& sheet, const std::string& address)
 // The message of the AutomationError that opening `path` raises ("" when it opens).
 std::string OpenFailure(const std::string& path)
 {
-    auto app = CreateApplication(ApplicationSettings());
+    auto app = StartApplication(ApplicationSettings());
     try {
         app->Workbooks()->Open(path);
     } catch (const AutomationError& e) {
@@ -38,7 +38,7 @@ std::string OpenFailure(const std::string& path)
 
 TEST(XlsWorkbooks, ValuesTextsAndUsedRangeOfABiffWorkbook)
 {
-    auto app = CreateApplication(ApplicationSettings());
+    auto app = StartApplication(ApplicationSettings());
     auto book = app->Workbooks()->Open(DataFile("series.xls"));
     auto sheets = book->Worksheets();
     ASSERT_EQ(sheets->Count(), 2);
@@ -67,7 +67,7 @@ TEST(XlsWorkbooks, ValuesTextsAndUsedRangeOfABiffWorkbook)
 
 TEST(XlsWorkbooks, DateTimesAndTimesKeepTheirSeconds)
 {
-    auto app = CreateApplication(ApplicationSettings());
+    auto app = StartApplication(ApplicationSettings());
     auto sheet = OpenSheet(*app, DataFile("stamps.xls"));
     EXPECT_EQ(Text(*sheet, "A2"), "5/17/2021 1:02:03");
     EXPECT_EQ(Text(*sheet, "A4"), "5/17/2021 13:02:03");
@@ -80,7 +80,7 @@ TEST(XlsxWorkbooks, ErrorAndInlineStringCellsAreNotReportedByTheLibrary)
 {
     // liborcus 0.17 passes over error cells and inline strings: they read as blank and do not
     // count for the used range (docs/spreadsheet.md).
-    auto app = CreateApplication(ApplicationSettings());
+    auto app = StartApplication(ApplicationSettings());
     auto sheet = OpenSheet(*app, DataFile("errors.xlsx"));
     EXPECT_TRUE(sheet->Range("A1")->Value2().IsEmpty());
     EXPECT_EQ(Text(*sheet, "C1"), "");
@@ -97,7 +97,7 @@ TEST(XlsxWorkbooks, FormattedBlankCellsWidenTheUsedRange)
     builder.Number(sheet, 2, 2, 1);
     builder.Blank(sheet, 5, 4, "0.00");
     std::string path = builder.Close();
-    auto app = CreateApplication(ApplicationSettings());
+    auto app = StartApplication(ApplicationSettings());
     auto used = OpenSheet(*app, path)->UsedRange();
     EXPECT_EQ(used->Column(), 2);
     EXPECT_EQ(used->Count(), 4 * 3);
@@ -132,11 +132,11 @@ TEST(BadWorkbooks, LimitsAreConfigurable)
 {
     ApplicationSettings settings;
     settings.load.limits.maxFileBytes = 1000;
-    auto app = CreateApplication(settings);
+    auto app = StartApplication(settings);
     EXPECT_THROW(app->Workbooks()->Open(DataFile("series.xls")), AutomationError);
     settings.load.limits = ImportLimits();
     settings.load.limits.maxXlsSheetCells = 20;
-    app = CreateApplication(settings);
+    app = StartApplication(settings);
     EXPECT_THROW(app->Workbooks()->Open(DataFile("series.xls")), AutomationError);
 }
 
@@ -150,7 +150,7 @@ TEST(LargeWorkbooks, AMillionRowsOpenWithBoundedMemoryButRefuseOneHugeArray)
             worksheet_write_number(sheet, static_cast<lxw_row_t>(row - 1), 0, row, nullptr);
         builder.Close();
     }
-    auto app = CreateApplication(ApplicationSettings());
+    auto app = StartApplication(ApplicationSettings());
     auto sheet = OpenSheet(*app, path);
     EXPECT_EQ(Text(*sheet, "A20"), "20");
     auto used = sheet->UsedRange();

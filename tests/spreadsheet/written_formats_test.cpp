@@ -58,7 +58,7 @@ TEST(WrittenFormats, TextsMatchWhatTheWriterMeant)
     builder.Text(sheet, row, 1, "plain text", "0.00");
     std::string path = builder.Close();
 
-    auto app = CreateApplication(ApplicationSettings());
+    auto app = StartApplication(ApplicationSettings());
     auto ws = app->Workbooks()->Open(path)->Worksheets()->Item(1);
     row = 1;
     for (const Written& w : kWritten) {
