@@ -7,6 +7,7 @@
 #include <pugixml.hpp>
 
 #include <cstddef>
+#include <exception>
 #include <string>
 #include <string_view>
 
@@ -38,7 +39,7 @@ bool DecodeToUtf8(std::string_view bytes, std::string& utf8, CString& error);
 // Parses a template file's bytes; `name` is used in messages. Refuses DTDs and deep nesting.
 bool ParseDocument(std::string_view bytes, const CString& name, pugi::xml_document& document, CString& error);
 
-// The first element named `root` anywhere in the document, or a null node.
+// The first element called `name` anywhere in the document, in document order; null when none.
 pugi::xml_node FindElement(const pugi::xml_document& document, const char* name);
 
 // Fills `spec` from the document by `layout`; false with `error` set (and `spec` partly filled) on a bad value.
