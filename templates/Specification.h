@@ -70,9 +70,12 @@ public:
     void SetTemplateFile(const CString& path);
     CString GetDelimiterString() const;
     CString GetDecimalSeparatorString() const;
-    // The separator text of a separator name; 0 (and a blank) for an unknown name.
+    // The separator text of a separator name, compared exactly; "User Locale" asks the process locale.
+    // 0 (and a blank) for an unknown name.
     static int MapSeparatorName(const CString& name, CString& text);
-    // The next field of `line` from `pos`; `pos` becomes -1 after the last field.
+    // The next field of `line` from `pos` (0 for the first call); `pos` becomes -1 after the last
+    // field. A user delimiter of several characters separates only where its whole text stands. A
+    // malformed quoted field shows message 2305 and gives an empty field.
     CString NextField(CString& line, int& pos) const;
 
     static int GetValueTypeCode(const CString& name, int& code);
