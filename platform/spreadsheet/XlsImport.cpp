@@ -7,6 +7,7 @@
 
 #include <freexl.h>
 
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <fstream>
@@ -81,6 +82,61 @@ void CheckOpened(int code, const Handle& handle, const std::string& path)
     Check(code, path);
     if (handle.m_handle == nullptr)
         throw OpenError(path, "the workbook stream is damaged (unexpected records).");
+}
+
+std::uint32_t Le32(const unsigned char* p)
+{
+    return static_cast<std::uint32_t>(p[0]) | static_cast<std::uint32_t>(p[1]) << 8 |
+           static_cast<std::uint32_t>(p[2]) << 16 | static_cast<std::uint32_t>(p[3]) << 24;
+}
+
+// FreeXL trusts the name lengths of the compound file's directory entries and converts that many
+// bytes from a 64-byte field. Walk the directory first and refuse entries it would overrun.
+void CheckCompoundDirectory(const std::string& path)
+{
+    std::ifstream in(path, std::ios::binary | std::ios::ate);
+    const std::uint64_t size = static_cast<std::uint64_t>(in.tellg());
+    std::vector<unsigned char> header(512);
+    in.seekg(0);
+    if (!in.read(reinterpret_cast<char*>(header.data()), 512))
+        throw OpenError(path, "the compound file is damaged (its header is cut short).");
+    const unsigned shift = header[30] | header[31] << 8;
+    if (shift != 9 && shift != 12)
+        throw OpenError(path, "the compound file is damaged (sector size 2^" + std::to_string(shift) + ").");
+    const std::uint64_t sectorSize = 1ull << shift;
+    const std::uint64_t sectorCount = size > sectorSize ? (size - sectorSize) / sectorSize + 1 : 0;
+    auto readSector = [&](std::uint32_t index, std::vector<unsigned char>& out) {
+        out.assign(sectorSize, 0);
+        if (index >= sectorCount)
+            return false;
+        in.clear();
+        in.seekg(static_cast<std::streamoff>((index + 1ull) * sectorSize));
+        return static_cast<bool>(in.read(reinterpret_cast<char*>(out.data()), static_cast<std::streamsize>(sectorSize)));
+    };
+
+    // The FAT: the sectors the header lists (enough for the files FreeXL can read at all).
+    std::vector<std::uint32_t> fat;
+    std::vector<unsigned char> sector;
+    const std::uint32_t fatSectors = Le32(&header[44]);
+    for (std::uint32_t i = 0; i < fatSectors && i < 109; ++i) {
+        if (!readSector(Le32(&header[76 + 4 * i]), sector))
+            throw OpenError(path, "the compound file is damaged (its allocation table lies outside the file).");
+        for (std::uint64_t k = 0; k + 4 <= sectorSize; k += 4)
+            fat.push_back(Le32(&sector[k]));
+    }
+
+    std::uint32_t next = Le32(&header[48]);
+    for (std::uint64_t steps = 0; next < 0xFFFFFFFAu; ++steps) {
+        if (steps > sectorCount || !readSector(next, sector))
+            throw OpenError(path, "the compound file is damaged (its directory chain is broken).");
+        for (std::uint64_t at = 0; at + 128 <= sectorSize; at += 128) {
+            const unsigned nameLength = sector[at + 64] | sector[at + 65] << 8;
+            const unsigned type = sector[at + 66];
+            if (nameLength > 64 || nameLength % 2 != 0 || type > 5)
+                throw OpenError(path, "the compound file is damaged (bad directory entry).");
+        }
+        next = next < fat.size() ? fat[next] : 0xFFFFFFFEu;
+    }
 }
 
 // FreeXL keeps every cell of a sheet in memory at once: refuse sheets whose grid is too big
@@ -174,6 +230,7 @@ void ImportXls(const std::string& path, ImportSink& sink, StyleTable& styles, co
     if (probe && static_cast<std::uint64_t>(probe.tellg()) > limits.maxFileBytes)
         throw OpenError(path, "the file is larger than " + std::to_string(limits.maxFileBytes >> 20) + " MiB.");
     probe.close();
+    CheckCompoundDirectory(path);
     if (LooksEncrypted(path))
         throw OpenError(path, "the workbook is password-protected.");
     CheckDimensions(path, limits);

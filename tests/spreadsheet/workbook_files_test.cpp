@@ -114,6 +114,7 @@ TEST(BadWorkbooks, EachFailsToOpenWithItsReason)
         {"password.xlsx", "password-protected"},
         {"truncated.xls", "damaged"},
         {"no-workbook.xls", "no workbook stream"},
+        {"bad-directory.xls", "bad directory entry"},
         {"truncated.xlsx", "damaged (no central directory)"},
         {"not-a-workbook.xlsx", "xl/workbook.xml is missing"},
         {"broken-xml.xlsx", "damaged"},

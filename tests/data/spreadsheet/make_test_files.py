@@ -186,6 +186,10 @@ def make_xls_files():
                                           ("EncryptedPackage", b"\0" * 4096)]))
     full = compound_file([("Workbook", workbook_stream([("Data", series_cells())]))])
     write("truncated.xls", full[:1100])
+    # A directory entry whose name length overruns its 64-byte name field.
+    bad = bytearray(full)
+    bad[SECTOR * 2 + 128 + 64:SECTOR * 2 + 128 + 66] = b"\xff\xff"
+    write("bad-directory.xls", bytes(bad))
     # The compound file is sound but holds no workbook stream.
     write("no-workbook.xls", compound_file([("Something", b"\0" * 4096)]))
 
@@ -225,13 +229,18 @@ def column_letters(column):
     return letters
 
 
-def xlsx(name, sheet_xml, compression=zipfile.ZIP_DEFLATED):
-    with zipfile.ZipFile(os.path.join(HERE, name), "w", compression) as z:
-        z.writestr("[Content_Types].xml", CONTENT_TYPES)
-        z.writestr("_rels/.rels", ROOT_RELS)
-        z.writestr("xl/workbook.xml", WORKBOOK)
-        z.writestr("xl/_rels/workbook.xml.rels", WORKBOOK_RELS)
-        z.writestr("xl/worksheets/sheet1.xml", sheet_xml)
+def put(z, name, data):
+    # A fixed time stamp keeps the packages identical from run to run.
+    z.writestr(zipfile.ZipInfo(name, date_time=(2021, 5, 17, 0, 0, 0)), data, compress_type=zipfile.ZIP_DEFLATED)
+
+
+def xlsx(name, sheet_xml):
+    with zipfile.ZipFile(os.path.join(HERE, name), "w") as z:
+        put(z, "[Content_Types].xml", CONTENT_TYPES)
+        put(z, "_rels/.rels", ROOT_RELS)
+        put(z, "xl/workbook.xml", WORKBOOK)
+        put(z, "xl/_rels/workbook.xml.rels", WORKBOOK_RELS)
+        put(z, "xl/worksheets/sheet1.xml", sheet_xml)
 
 
 def make_xlsx_files():
@@ -249,7 +258,7 @@ def make_xlsx_files():
     xlsx("broken-xml.xlsx", SHEET_HEAD + '<row r="1"><c r="A1"><v>1</v></c><row' + SHEET_TAIL)
     # A zip without a workbook part.
     with zipfile.ZipFile(os.path.join(HERE, "not-a-workbook.xlsx"), "w") as z:
-        z.writestr("readme.txt", "just a zip")
+        put(z, "readme.txt", "just a zip")
     # A zip cut short: the directory at its end is missing.
     with open(os.path.join(HERE, "errors.xlsx"), "rb") as f:
         write("truncated.xlsx", f.read()[:300])
