@@ -122,26 +122,31 @@ OpenedTemplate NewTemplate(const CString& kind)
 
 OpenedTemplate OpenTemplateFile(const CString& path, CString& error)
 {
-    std::string bytes;
-    if (!ReadFileBytes(path, bytes, error))
-        return {};
-    pugi::xml_document document;
-    if (!ParseDocument(bytes, path, document, error))
-        return {};
-    CString query = CString("//") + AsciiFileLayout().root + " | //" + ExcelFileLayout().root;
-    pugi::xml_node root = document.select_node(query.c_str()).node();
-    if (!root) {
-        error = path + ": not a template file: no element " + AsciiFileLayout().root + " or " +
-                ExcelFileLayout().root;
+    try {
+        std::string bytes;
+        if (!ReadFileBytes(path, bytes, error))
+            return {};
+        pugi::xml_document document;
+        if (!ParseDocument(bytes, path, document, error))
+            return {};
+        CString query = CString("//") + AsciiFileLayout().root + " | //" + ExcelFileLayout().root;
+        pugi::xml_node root = document.select_node(query.c_str()).node();
+        if (!root) {
+            error = path + ": not a template file: no element " + AsciiFileLayout().root + " or " +
+                    ExcelFileLayout().root;
+            return {};
+        }
+        bool ascii = std::strcmp(root.name(), AsciiFileLayout().root) == 0;
+        OpenedTemplate opened = NewTemplate(ascii ? AsciiFileLayout().kind : ExcelFileLayout().kind);
+        bool loaded = ascii ? LoadKind<CAsciiSpecification>(opened, bytes, path, error)
+                            : LoadKind<CExcelSpecification>(opened, bytes, path, error);
+        if (!loaded)
+            return {};
+        return opened;
+    } catch (const std::exception& e) {
+        error = path + ": cannot be read: " + e.what();
         return {};
     }
-    bool ascii = std::strcmp(root.name(), AsciiFileLayout().root) == 0;
-    OpenedTemplate opened = NewTemplate(ascii ? AsciiFileLayout().kind : ExcelFileLayout().kind);
-    bool loaded = ascii ? LoadKind<CAsciiSpecification>(opened, bytes, path, error)
-                        : LoadKind<CExcelSpecification>(opened, bytes, path, error);
-    if (!loaded)
-        return {};
-    return opened;
 }
 
 void WriteTemplateText(CSpecification& spec, const FileLayout& layout, std::ostream& out)

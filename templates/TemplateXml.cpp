@@ -7,6 +7,7 @@
 #include <cstdio>
 #include <cstring>
 #include <memory>
+#include <new>
 #include <sstream>
 
 namespace tmplfile {
@@ -256,31 +257,42 @@ CString AttributeText(const AttributeRule& rule, CSpecification& spec)
     return CString();
 }
 
-void AppendList(pugi::xml_node& extension, const char* listName, const char* entryName,
+// pugixml reports a failed allocation by a null node or a false result, never by throwing.
+bool AppendList(pugi::xml_node& extension, const char* listName, const char* entryName,
                 const std::vector<CItemDefinition>& items, CString CItemDefinition::*field)
 {
     pugi::xml_node list = extension.append_child(listName);
-    for (const CItemDefinition& item : items)
-        list.append_child(entryName).text().set(RepairUtf8(item.*field).c_str());
+    if (!list)
+        return false;
+    for (const CItemDefinition& item : items) {
+        pugi::xml_node entry = list.append_child(entryName);
+        if (!entry || !entry.text().set(RepairUtf8(item.*field).c_str()))
+            return false;
+    }
+    return true;
 }
 
-void BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_document& document)
+bool BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_document& document)
 {
     pugi::xml_node declaration = document.append_child(pugi::node_pi);
-    declaration.set_name("xml");
-    declaration.set_value(kDeclarationData);
+    if (!declaration || !declaration.set_name("xml") || !declaration.set_value(kDeclarationData))
+        return false;
     pugi::xml_node root = document.append_child(layout.root);
-    root.append_attribute("xmlns:xsi").set_value(kSchemaInstanceNamespace);
+    if (!root || !root.append_attribute("xmlns:xsi").set_value(kSchemaInstanceNamespace))
+        return false;
     for (const AttributeRule& rule : layout.attributes)
-        root.append_attribute(rule.name).set_value(RepairUtf8(AttributeText(rule, spec)).c_str());
+        if (!root.append_attribute(rule.name).set_value(RepairUtf8(AttributeText(rule, spec)).c_str()))
+            return false;
     pugi::xml_node extension = root.append_child(layout.extension);
+    if (!extension)
+        return false;
     const auto& items = spec.m_DataDesc.m_vecItemDefs;
     if (items.empty())
-        return;
-    AppendList(extension, "ItemTitles", "ItemTitle", items, &CItemDefinition::m_strTitle);
-    AppendList(extension, "ItemTypes", "ItemType", items, &CItemDefinition::m_strType);
-    AppendList(extension, "ItemUnits", "ItemUnit", items, &CItemDefinition::m_strUnit);
-    AppendList(extension, "ValueTypes", "ValueType", items, &CItemDefinition::m_strValueType);
+        return true;
+    return AppendList(extension, "ItemTitles", "ItemTitle", items, &CItemDefinition::m_strTitle) &&
+           AppendList(extension, "ItemTypes", "ItemType", items, &CItemDefinition::m_strType) &&
+           AppendList(extension, "ItemUnits", "ItemUnit", items, &CItemDefinition::m_strUnit) &&
+           AppendList(extension, "ValueTypes", "ValueType", items, &CItemDefinition::m_strValueType);
 }
 
 } // namespace
@@ -328,15 +340,21 @@ bool ReadFileBytes(const CString& path, std::string& bytes, CString& error)
         error = path + ": cannot be opened: " + std::strerror(errno);
         return false;
     }
-    bytes.clear();
-    char buffer[65536];
-    size_t got = 0;
-    while ((got = std::fread(buffer, 1, sizeof(buffer), file.get())) > 0) {
-        if (bytes.size() + got > kMaxFileBytes) {
-            error = text::Format("%s: larger than %zu bytes, which no template file is", path.c_str(), kMaxFileBytes);
-            return false;
+    try {
+        bytes.clear();
+        char buffer[65536];
+        size_t got = 0;
+        while ((got = std::fread(buffer, 1, sizeof(buffer), file.get())) > 0) {
+            if (bytes.size() + got > kMaxFileBytes) {
+                error = text::Format("%s: larger than %zu bytes, which no template file is", path.c_str(),
+                                     kMaxFileBytes);
+                return false;
+            }
+            bytes.append(buffer, got);
         }
-        bytes.append(buffer, got);
+    } catch (const std::exception& e) {
+        error = path + ": cannot be read: " + e.what();
+        return false;
     }
     if (std::ferror(file.get())) {
         error = path + ": cannot be read: " + std::strerror(errno);
@@ -429,7 +447,8 @@ bool ReadTemplate(const pugi::xml_document& document, const FileLayout& layout, 
 std::string RenderTemplate(CSpecification& spec, const FileLayout& layout)
 {
     pugi::xml_document document;
-    BuildDocument(spec, layout, document);
+    if (!BuildDocument(spec, layout, document))
+        throw std::bad_alloc();
     std::ostringstream out;
     document.save(out, "\t", pugi::format_indent | pugi::format_write_bom | pugi::format_no_declaration,
                   pugi::encoding_utf16_le);

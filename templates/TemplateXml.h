@@ -49,7 +49,8 @@ bool ReadTemplate(const pugi::xml_document& document, const FileLayout& layout, 
 // Writes `spec` by `layout` as UTF-16 (little endian, with byte-order mark) to `path`.
 bool WriteTemplate(CSpecification& spec, const FileLayout& layout, const CString& path, CString& error);
 
-// The file contents WriteTemplate would write, for callers that store them elsewhere.
+// The file contents WriteTemplate would write, for callers that store them elsewhere; throws
+// std::bad_alloc when the document cannot be built.
 std::string RenderTemplate(CSpecification& spec, const FileLayout& layout);
 
 // The common body of both kinds' Load: reads into a copy and commits it only when everything was good.
