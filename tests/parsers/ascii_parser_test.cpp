@@ -80,23 +80,26 @@ TEST_F(AsciiParserTest, SpaceLayoutNameLineMustLeaveRoomForBothDateTimeTitles)
     EXPECT_EQ(MessageIds(ui), (Ids{res::IDS_NAME_COLUMNS_MISMATCH}));
 }
 
-TEST_F(AsciiParserTest, DateTimeInTheMiddleStillStampsFirst)
+TEST_F(AsciiParserTest, DateTimeElsewhereStillStampsFirst)
 {
-    spec.m_strDelimiter = "Space";
-    spec.m_TimeDesc.m_nDateTimeCol = 2;
-    Bind("h\nA When Clock B\n1 2020/01/01 12:00:00 2\n");
-    ASSERT_EQ(parser.Parse(""), 1) << ::testing::PrintToString(MessageIds(ui));
-    EXPECT_EQ(parser.m_vecItemNames, (CStringList{"When", "A", "B"}));
-    EXPECT_EQ(parser.m_vecRows.back(), (ui::Row{"2020/01/01 12:00:00", "1", "2"}));
-}
-
-TEST_F(AsciiParserTest, DateTimeInTheLastColumn)
-{
-    spec.m_TimeDesc.m_nDateTimeCol = 3;
-    Bind("h\nA\tB\tTime\n1\t2\t2020/01/01 12:00:00\n");
-    ASSERT_EQ(parser.Parse(""), 1) << ::testing::PrintToString(MessageIds(ui));
-    EXPECT_EQ(parser.m_vecItemNames, (CStringList{"Time", "A", "B"}));
-    EXPECT_EQ(parser.m_vecRows.back(), (ui::Row{"2020/01/01 12:00:00", "1", "2"}));
+    struct Case {
+        const char* delimiter;
+        int column;
+        const char* file;
+        CStringList names;
+    };
+    const Case cases[] = {
+        {"Space", 2, "h\nA When Clock B\n1 2020/01/01 12:00:00 2\n", {"When", "A", "B"}},
+        {"Tab", 3, "h\nA\tB\tTime\n1\t2\t2020/01/01 12:00:00\n", {"Time", "A", "B"}},
+    };
+    for (const Case& c : cases) {
+        spec.m_strDelimiter = c.delimiter;
+        spec.m_TimeDesc.m_nDateTimeCol = c.column;
+        Bind(c.file);
+        ASSERT_EQ(parser.Parse(""), 1) << c.file << ::testing::PrintToString(MessageIds(ui));
+        EXPECT_EQ(parser.m_vecItemNames, c.names);
+        EXPECT_EQ(parser.m_vecRows.back(), (ui::Row{"2020/01/01 12:00:00", "1", "2"}));
+    }
 }
 
 TEST_F(AsciiParserTest, GlobalDateAndGlobalTimeStamps)
