@@ -3,6 +3,8 @@
 #include "platform/ui/UserInterface.h"
 #include "templates/Specification.h"
 
+#include <cstring>
+
 namespace converter {
 
 FieldSplitter::FieldSplitter(const CSpecification& spec)
@@ -16,7 +18,7 @@ FieldSplitter::FieldSplitter(const CSpecification& spec)
 
 void FieldSplitter::Split(std::string_view line)
 {
-    m_calls.clear();
+    m_count = 0;
     m_quoteError = false;
     m_offset = 0;
     if (m_fast)
@@ -34,11 +36,36 @@ void FieldSplitter::SplitFast(std::string_view line)
 {
     m_line = line;
     int pos = 0;
+    if (!m_consecutive && !m_leading) {
+        // Without the two flags a field that does not start with a quote is the text up to the
+        // next delimiter: one pass over the line gives every call; a quote hands over to NextField.
+        const size_t length = line.size();
+        size_t at = 0;
+        while (true) {
+            if (at == length) {
+                if (length > 0 && line[length - 1] == m_delimiterChar) {
+                    Add({}, static_cast<int>(length), static_cast<int>(length) + 1);
+                    Add({}, static_cast<int>(length) + 1, -1);
+                } else {
+                    Add({}, static_cast<int>(length), -1);
+                }
+                return;
+            }
+            if (line[at] == '"')
+                break;
+            const void* found = std::memchr(line.data() + at, m_delimiterChar, length - at);
+            const size_t end = found ? static_cast<size_t>(static_cast<const char*>(found) - line.data()) : length;
+            const size_t next = found ? end + 1 : length;
+            Add(line.substr(at, end - at), static_cast<int>(at), static_cast<int>(next));
+            at = next;
+        }
+        pos = static_cast<int>(at);
+    }
     do {
         const int start = pos;
         std::string_view field = NextField(pos);
         // NextField may have cut the line's start; positions then count from the cut.
-        m_calls.push_back(Call{field, start, pos});
+        Add(field, start, pos);
     } while (pos != -1);
 }
 
@@ -142,7 +169,7 @@ void FieldSplitter::SplitThroughSpecification(std::string_view line)
         m_slowFields.push_back(m_spec.NextField(m_slowLine, pos));
         if (m_slowLine.size() != before) // the leading delimiters were cut off
             m_offset = static_cast<int>(originalLength - m_slowLine.size());
-        m_calls.push_back(Call{m_slowFields.back(), start, pos});
+        Add(m_slowFields.back(), start, pos);
     } while (pos != -1);
     m_line = m_slowLine;
     m_quoteError = !recorder.boxes.empty();

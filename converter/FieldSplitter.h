@@ -4,6 +4,7 @@
 // left the position, the field text). Single-character delimiters take the fast path; any other
 // delimiter goes through NextField itself.
 #include <deque>
+#include <span>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -26,7 +27,7 @@ public:
     // Splits `line`. The calls and the line they index stay valid until the next Split.
     void Split(std::string_view line);
 
-    const std::vector<Call>& Calls() const { return m_calls; }
+    std::span<const Call> Calls() const { return {m_calls.data(), m_count}; }
     // The line as the calls index it: a leading-delimiter flag may have cut delimiters off its start.
     std::string_view Line() const { return m_line; }
     // True when a quoted field was malformed (NextField would have shown its message).
@@ -41,6 +42,12 @@ private:
     std::string_view NextField(int& pos);
     std::string_view TakeField(int& pos, bool& skipAfter);
     bool DelimiterAt(int pos) const;
+    void Add(std::string_view text, int start, int end)
+    {
+        if (m_count == m_calls.size())
+            m_calls.resize(m_calls.size() * 2 + 16);
+        m_calls[m_count++] = Call{text, start, end};
+    }
 
     const CSpecification& m_spec;
     std::string m_delimiter;
@@ -52,7 +59,8 @@ private:
     std::string_view m_line;
     int m_offset = 0;
     bool m_quoteError = false;
-    std::vector<Call> m_calls;
+    std::vector<Call> m_calls; // grows only; the first m_count are this line's
+    size_t m_count = 0;
     // Slow path only: the line NextField may change and the fields it returned.
     std::string m_slowLine;
     std::deque<std::string> m_slowFields;

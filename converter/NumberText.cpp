@@ -19,27 +19,26 @@ constexpr std::uint64_t kExactMantissa = 1ull << 53;
 // exact power of ten: IEEE division rounds correctly, so this is the value from_chars gives.
 bool ReadPlainDecimal(std::string_view text, double& value)
 {
-    size_t i = 0;
-    const bool negative = !text.empty() && text[0] == '-';
+    const char* p = text.data();
+    const char* const end = p + text.size();
+    const bool negative = p < end && *p == '-';
     if (negative)
-        ++i;
+        ++p;
+    // Unsigned arithmetic may wrap on long texts; those are refused by the digit count below.
     std::uint64_t mantissa = 0;
-    int digits = 0, decimals = 0;
-    bool point = false;
-    for (; i < text.size(); ++i) {
-        const char c = text[i];
-        if (c >= '0' && c <= '9') {
-            if (++digits > 15)
-                return false;
-            mantissa = mantissa * 10 + static_cast<unsigned>(c - '0');
-            decimals += point ? 1 : 0;
-        } else if (c == '.' && !point) {
-            point = true;
-        } else {
-            return false;
-        }
+    const char* const integerStart = p;
+    while (p < end && static_cast<unsigned>(*p - '0') < 10)
+        mantissa = mantissa * 10 + static_cast<unsigned>(*p++ - '0');
+    size_t digits = static_cast<size_t>(p - integerStart);
+    size_t decimals = 0;
+    if (p < end && *p == '.') {
+        const char* const fractionStart = ++p;
+        while (p < end && static_cast<unsigned>(*p - '0') < 10)
+            mantissa = mantissa * 10 + static_cast<unsigned>(*p++ - '0');
+        decimals = static_cast<size_t>(p - fractionStart);
+        digits += decimals;
     }
-    if (digits == 0)
+    if (p != end || digits == 0 || digits > 15)
         return false;
     value = static_cast<double>(mantissa) / kPowersOfTen[decimals];
     if (negative)
@@ -59,6 +58,9 @@ NumberReader::NumberReader(std::string_view decimalSeparator)
 
 ValueText NumberReader::Read(std::string_view field, double& value) const
 {
+    // Most fields are plain decimals without blanks around them.
+    if (m_pointSeparator && !field.empty() && field.front() != ' ' && ReadPlainDecimal(field, value))
+        return ValueText::Number;
     size_t b = 0, e = field.size();
     while (b < e && IsBlank(field[b]))
         ++b;
