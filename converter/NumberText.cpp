@@ -138,11 +138,14 @@ char* FormatValue(double value, char* out)
     const double magnitude = std::fabs(value);
     if (magnitude < 1e15 && magnitude >= 1e-6) {
         for (int decimals = 0; decimals <= 15; ++decimals) {
-            const double scaled = std::nearbyint(magnitude * kPowersOfTen[decimals]);
+            const double scaled = magnitude * kPowersOfTen[decimals];
             if (scaled >= static_cast<double>(kExactMantissa))
                 break;
-            if (scaled / kPowersOfTen[decimals] == magnitude)
-                return WriteScaled(static_cast<std::uint64_t>(scaled), decimals, std::signbit(value), out);
+            const auto digits = static_cast<std::uint64_t>(scaled + 0.5);
+            // Only a near-integer can be the one; the division then decides exactly.
+            if (std::fabs(scaled - static_cast<double>(digits)) <= scaled * 1e-12 &&
+                static_cast<double>(digits) / kPowersOfTen[decimals] == magnitude)
+                return WriteScaled(digits, decimals, std::signbit(value), out);
         }
     }
     return std::to_chars(out, out + 32, value).ptr;
