@@ -597,10 +597,16 @@ bool RenderFraction(const Section& section, double value, std::string& out)
     size_t next = slash + 1;
     for (; afterSlash.empty() && next < t.size() && t[next].kind == Kind::Digit; ++next)
         ++denominatorWidth;
-    int fixedDenominator = std::atoi(afterSlash.c_str());
+    long parsedDenominator = std::strtol(afterSlash.c_str(), nullptr, 10);
+    int fixedDenominator = static_cast<int>(std::clamp<long>(parsedDenominator, 0, 99999));
     int maxDenominator = fixedDenominator > 0 ? fixedDenominator
                                               : static_cast<int>(std::pow(10.0, std::max<size_t>(1, std::min<size_t>(denominatorWidth, 4)))) - 1;
 
+    // Past 10^9 (without a whole part) or 10^15 a fraction has no digits left to show.
+    if ((!hasWhole && value >= 1e9) || value >= 1e15) {
+        out = FormatGeneral(value);
+        return true;
+    }
     double whole = hasWhole ? std::floor(value) : 0.0;
     double part = value - whole;
     int bestNumerator = 0, bestDenominator = 1;
@@ -641,7 +647,7 @@ bool RenderFraction(const Section& section, double value, std::string& out)
     } else {
         out += pad(std::to_string(bestNumerator), numeratorWidth, true);
         out += "/";
-        out += fixedDenominator > 0 ? afterSlash : pad(std::to_string(bestDenominator), denominatorWidth, false);
+        out += fixedDenominator > 0 ? std::to_string(fixedDenominator) : pad(std::to_string(bestDenominator), denominatorWidth, false);
     }
     for (size_t i = next; i < t.size(); ++i)
         if (t[i].kind == Kind::Literal)
