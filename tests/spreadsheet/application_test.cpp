@@ -256,3 +256,20 @@ TEST(SpreadsheetApplication, OversizedRangeValuesFailInsteadOfExhaustingMemory)
     EXPECT_EQ(ws->Range("A1", "J11")->Count(), 110);
     EXPECT_THROW(ws->Range("A1", "XFD1048576")->Count(), AutomationError);
 }
+
+TEST(SpreadsheetApplication, CellBudgetBoundsWhatIsHeldEvenAfterRereading)
+{
+    XlsxBuilder book(sheettest::TempFile("budget.xlsx"));
+    lxw_worksheet* sheet = book.AddSheet("Tall");
+    for (int row = 1; row <= 300; ++row)
+        book.Number(sheet, row, 1, row);
+    std::string path = book.Close();
+
+    ApplicationSettings settings;
+    settings.load.maxStoredCells = 50;
+    auto app = StartApplication(settings);
+    auto ws = FirstSheet(app, path);
+    EXPECT_EQ(TextAt(*ws, "A50"), "50");
+    EXPECT_EQ(ws->UsedRange()->Count(), 300); // the used range still counts every row
+    EXPECT_THROW(ws->Range("A250")->Text(), AutomationError);
+}
