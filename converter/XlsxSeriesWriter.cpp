@@ -21,6 +21,18 @@ std::string MetadataCell(const ItemInfo& item)
            part(item.valueType, "Instantaneous");
 }
 
+// Header texts go in as formulas with their text result: in constant-memory mode a plain string
+// becomes an inline string, which the workbook reader (liborcus 0.17) passes over, while a
+// formula's cached text result is read by it and shown by every spreadsheet program.
+void WriteText(lxw_worksheet* sheet, lxw_row_t row, lxw_col_t column, const std::string& text)
+{
+    std::string formula = "=\"";
+    for (char c : text)
+        formula += c == '"' ? std::string("\"\"") : std::string(1, c);
+    formula += '"';
+    worksheet_write_formula_str(sheet, row, column, formula.c_str(), nullptr, text.c_str());
+}
+
 } // namespace
 
 XlsxSeriesWriter::~XlsxSeriesWriter()
@@ -54,14 +66,14 @@ Status XlsxSeriesWriter::Begin(const std::string& path, const SeriesHeader& head
     worksheet_set_column(m_sheet, 0, 0, 20, nullptr);
     for (size_t i = 0; i < header.items.size(); ++i) {
         const auto column = static_cast<lxw_col_t>(i + 1);
-        worksheet_write_string(m_sheet, 0, column, MetadataCell(header.items[i]).c_str(), nullptr);
+        WriteText(m_sheet, 0, column, MetadataCell(header.items[i]));
     }
-    worksheet_write_string(m_sheet, 1, 0, (header.timeTitle.empty() ? "Date/time" : header.timeTitle).c_str(), nullptr);
+    WriteText(m_sheet, 1, 0, header.timeTitle.empty() ? "Date/time" : header.timeTitle);
     for (size_t i = 0; i < header.items.size(); ++i) {
         const auto column = static_cast<lxw_col_t>(i + 1);
         // An empty name would read back as "Item<n>"; the cell stays blank as the input had it.
         if (!header.items[i].name.empty())
-            worksheet_write_string(m_sheet, 1, column, header.items[i].name.c_str(), nullptr);
+            WriteText(m_sheet, 1, column, header.items[i].name);
     }
     return Status::Ok();
 }
