@@ -4,6 +4,7 @@
 #include "converter/ConversionJob.h"
 #include "converter/Converter.h"
 #include "converter/StampText.h"
+#include "platform/rbx/RbxReader.h"
 #include "templates/AsciiSpecification.h"
 
 #include <gtest/gtest.h>
@@ -90,6 +91,40 @@ void RoundTripThrough(std::initializer_list<Format> formats)
 }
 
 TEST(Conversion, EveryFormatPairRoundTrips) { RoundTripThrough({Format::Rbx0, Format::Ascii, Format::Excel}); }
+
+TEST(Conversion, Rbx0HeaderDescribesAxisAndItems)
+{
+    convtest::ScratchFolder folder;
+    struct Case {
+        std::string text;
+        int axisType;
+        double step;
+    } cases[] = {
+        {kSample, rbx::kEquidistantCalendar, 900},
+        {kSample + "2020/01/01 01:30:00\t1\t2\t3\n", rbx::kNonEquidistantCalendar, 5400},
+    };
+    for (const Case& c : cases) {
+        convtest::WriteFile(folder.Path("in.txt"), c.text);
+        ASSERT_TRUE(Convert(Format::Ascii, folder.Path("in.txt"), Format::Rbx0, folder.Path("out.rbx0")).converted);
+        rbx::CRbxReader reader;
+        ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.Error();
+        const rbx::FileHeader& header = reader.Header();
+        EXPECT_EQ(header.title, "Title");
+        EXPECT_EQ(header.axis.type, c.axisType);
+        EXPECT_EQ(header.axis.unitKey, 1400);
+        EXPECT_EQ(header.axis.startDate, "2020-01-01");
+        EXPECT_EQ(header.axis.startTime, "00:00:00");
+        EXPECT_DOUBLE_EQ(header.axis.step, c.step);
+        ASSERT_EQ(header.items.size(), 3u);
+        EXPECT_EQ(header.items[0].itemTypeKey, 103); // Rainfall
+        EXPECT_EQ(header.items[0].unitKey, 1002);    // millimeter, found by its abbreviation
+        EXPECT_EQ(header.items[0].valueType, rbx::kAccumulated);
+        EXPECT_EQ(header.items[1].itemTypeKey, 100);
+        EXPECT_EQ(header.items[1].unitKey, 1000);
+        EXPECT_EQ(header.items[2].itemTypeKey, 999);
+        EXPECT_EQ(header.items[2].dataType, rbx::kFloat64);
+    }
+}
 
 TEST(Conversion, DamagedWorkbookFailsWithoutOutput)
 {
