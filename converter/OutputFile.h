@@ -20,10 +20,15 @@ public:
     // Renames the temporary file to the final path, replacing what was there.
     Status Commit();
 
+    // Removes every temporary file still being written; safe to call from a signal handler, so an
+    // interrupted run leaves no part files either.
+    static void RemoveAllTemporaries();
+
 private:
     std::string m_final;
     std::string m_temporary;
     bool m_committed = false;
+    int m_slot = -1; // place in the list RemoveAllTemporaries walks; -1 when it did not fit
 };
 
 } // namespace converter

@@ -1,14 +1,24 @@
 // Velmora: the conversion engine program. The plug-in starts it as "Velmora <setupFile> 1" on the
 // temporary setup file and waits; the exit status says whether every file converted.
 #include "converter/ConversionJob.h"
+#include "converter/OutputFile.h"
 #include "platform/ui/UserInterface.h"
 
+#include <csignal>
 #include <cstdio>
 #include <cstring>
+#include <unistd.h>
 #include <exception>
 #include <string>
 
 namespace {
+
+// An interrupted run removes its part files, as a failed conversion does.
+void OnTerminate(int signal)
+{
+    converter::OutputFile::RemoveAllTemporaries();
+    ::_exit(128 + signal);
+}
 
 void PrintUsage(std::FILE* out)
 {
@@ -58,6 +68,9 @@ int main(int argc, char** argv)
         PrintUsage(stderr);
         return converter::kExitUsage;
     }
+
+    for (int signal : {SIGINT, SIGTERM, SIGHUP})
+        std::signal(signal, OnTerminate);
 
     // The engine runs unattended: nothing it calls may wait for a person.
     ui::SilentUserInterface silent;

@@ -10,6 +10,8 @@
 #include <filesystem>
 #include <fstream>
 #include <sstream>
+#include <csignal>
+#include <spawn.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -201,6 +203,44 @@ TEST_F(EndToEnd, DamagedInputsFailWithAClearEntry)
     EXPECT_EQ(RunHost({1, Format::Excel, Path("bad.xlsx").string(), "", "", Format::Ascii, Path("bad.txt").string()}), 1);
     EXPECT_FALSE(fs::exists(Path("bad.txt")));
     EXPECT_NE(Log().find(Path("bad.xlsx").string() + ": "), std::string::npos) << Log();
+}
+
+TEST_F(EndToEnd, InterruptedEngineLeavesNoPartFile)
+{
+    std::string content = kSample.substr(0, kSample.find("2020"));
+    char line[96];
+    for (long long s = 0; s < 1000000; ++s) {
+        std::snprintf(line, sizeof line, "2020/%02lld/%02lld %02lld:%02lld:%02lld\t%lld\t1\t2\n", 1 + s / 2678400,
+                      1 + s / 86400 % 31, s / 3600 % 24, s / 60 % 60, s % 60, s);
+        content += line;
+    }
+    WriteFile(Path("big.txt"), content);
+    WriteFile(Path("engine.wpx"), "wpx 1\ntarget \"VELMORA\"\n section \"INPUT\"\n  File_format = 2\n  File_name = file \"big.txt\"\n"
+                                  " end\n section \"OUTPUT\"\n  File_format = 2\n  File_name = file \"big.out.txt\"\n end\nend\nwpx end\n");
+    const std::string engine = std::string(VELMORA_BIN_DIR) + "/Velmora";
+    const std::string setup = Path("engine.wpx").string();
+    char* argv[] = {const_cast<char*>(engine.c_str()), const_cast<char*>(setup.c_str()), const_cast<char*>("1"),
+                    const_cast<char*>("--quiet"), nullptr};
+    pid_t pid = 0;
+    ASSERT_EQ(posix_spawn(&pid, engine.c_str(), nullptr, nullptr, argv, environ), 0);
+    auto partFiles = [&] {
+        int count = 0;
+        for (const auto& entry : fs::directory_iterator(m_root))
+            count += entry.path().filename().string().find(".part-") != std::string::npos ? 1 : 0;
+        return count;
+    };
+    int status = 0;
+    bool running = true;
+    while (partFiles() == 0 && running)
+        running = waitpid(pid, &status, WNOHANG) == 0;
+    if (!running)
+        GTEST_SKIP() << "the engine finished before it could be interrupted";
+    ::kill(pid, SIGTERM);
+    ASSERT_EQ(waitpid(pid, &status, 0), pid);
+    ASSERT_TRUE(WIFEXITED(status));
+    EXPECT_EQ(WEXITSTATUS(status), 128 + SIGTERM);
+    EXPECT_EQ(partFiles(), 0);
+    EXPECT_FALSE(fs::exists(Path("big.out.txt")));
 }
 
 TEST_F(EndToEnd, EngineProgramHelpAndUsage)
