@@ -57,6 +57,7 @@ protected:
         std::string items; // "0, 2"
         Format out = Format::Rbx0;
         std::string output;
+        bool silent = true;
     };
 
     // Writes the host's document and runs the host program on it; returns its exit status.
@@ -75,8 +76,8 @@ protected:
             << "\"\n      File_title = \"E2E\"\n      Log_file = file \"" << Path("run.log").string() << "\"\n    end\n"
             << "  end\nend\nwpx end\n";
         WriteFile(Path("setup.wpx"), doc.str());
-        const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora run --silent '" + Path("setup.wpx").string() +
-                                    "' >'" + Path("host.out").string() + "' 2>&1";
+        const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora run " + (s.silent ? "--silent '" : "'") +
+                                    Path("setup.wpx").string() + "' >'" + Path("host.out").string() + "' 2>&1";
         const int status = std::system(command.c_str());
         return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
     }
@@ -161,7 +162,10 @@ TEST_F(EndToEnd, FolderWithAMisfitConvertsTheRestAndFails)
     WriteFile(Path("in/b.csv"), kSample);
     WriteFile(Path("in/misfit.txt"), "no template describes this\n");
     WriteFile(Path("out/misfit.rbx0"), "an older output");
-    EXPECT_EQ(RunHost({2, Format::Ascii, Path("in").string(), "", "", Format::Rbx0, Path("out").string()}), 1);
+    EXPECT_EQ(RunHost({2, Format::Ascii, Path("in").string(), "", "", Format::Rbx0, Path("out").string(), false}), 1);
+    EXPECT_NE(ReadFile(Path("host.out")).find("Conversion complete. Some files are skipped because they do not match the template."),
+              std::string::npos)
+        << ReadFile(Path("host.out"));
     EXPECT_EQ(AsText(Format::Rbx0, Path("out/a.rbx0")), kSample.substr(0, kSample.find("Time")) + "Date/time" +
                                                                kSample.substr(kSample.find("Time") + 4));
     EXPECT_TRUE(fs::exists(Path("out/b.rbx0")));
