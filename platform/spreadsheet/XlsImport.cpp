@@ -126,6 +126,8 @@ void CheckCompoundDirectory(const std::string& path)
     }
 
     std::uint32_t next = Le32(&header[48]);
+    if (next >= sectorCount)
+        throw OpenError(path, "the compound file is damaged (its directory lies outside the file).");
     for (std::uint64_t steps = 0; next < 0xFFFFFFFAu; ++steps) {
         if (steps > sectorCount || !readSector(next, sector))
             throw OpenError(path, "the compound file is damaged (its directory chain is broken).");

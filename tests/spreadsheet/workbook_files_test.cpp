@@ -115,6 +115,7 @@ TEST(BadWorkbooks, EachFailsToOpenWithItsReason)
         {"truncated.xls", "damaged"},
         {"no-workbook.xls", "no workbook stream"},
         {"bad-directory.xls", "bad directory entry"},
+        {"lost-directory.xls", "directory lies outside the file"},
         {"truncated.xlsx", "damaged (no central directory)"},
         {"not-a-workbook.xlsx", "xl/workbook.xml is missing"},
         {"broken-xml.xlsx", "damaged"},

@@ -190,6 +190,10 @@ def make_xls_files():
     bad = bytearray(full)
     bad[SECTOR * 2 + 128 + 64:SECTOR * 2 + 128 + 66] = b"\xff\xff"
     write("bad-directory.xls", bytes(bad))
+    # The header points the directory at no sector at all.
+    lost = bytearray(full)
+    lost[48:52] = b"\xff\xff\xff\xff"
+    write("lost-directory.xls", bytes(lost))
     # The compound file is sound but holds no workbook stream.
     write("no-workbook.xls", compound_file([("Something", b"\0" * 4096)]))
 
