@@ -3,6 +3,8 @@
 // NextField's calls for every line.
 #include "converter/AsciiSeriesReader.h"
 #include "converter/FieldSplitter.h"
+#include "converter/StampText.h"
+#include "parsers/DateTimeText.h"
 #include "platform/ui/UserInterface.h"
 #include "templates/AsciiSpecification.h"
 
@@ -40,6 +42,20 @@ void CompareSplits(const CSpecification& spec, const std::string& line)
         __builtin_trap();
 }
 
+// The compiled date format reads a text as the reference reader does.
+void CompareStamps(const std::string& text)
+{
+    for (const char* format : {"YYYY/MM/DD HH:mm:ss", "DD.MM.YYYY hh:mm", "y-M-d"}) {
+        COleDateTime reference;
+        const bool referenceOk = ParseDateTimeText(text, format, reference);
+        converter::StampFields fields;
+        if (converter::DateFormat(format).Read(text, fields) != referenceOk)
+            __builtin_trap();
+        if (referenceOk && converter::StampFromFields(fields).has_value() != reference.IsValid())
+            __builtin_trap();
+    }
+}
+
 } // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
@@ -71,6 +87,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
         if (end == std::string::npos)
             end = text.size();
         CompareSplits(comma, text.substr(start, end - start));
+        CompareStamps(text.substr(start, end - start));
         start = end + 1;
     }
     std::remove(path.c_str());
