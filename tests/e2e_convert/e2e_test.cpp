@@ -141,17 +141,26 @@ TEST_F(EndToEnd, EveryFormatPairSingleFileWithSelection)
         }
 }
 
-TEST_F(EndToEnd, FolderOfWorkbooksToRbx0)
+TEST_F(EndToEnd, EveryFormatPairFolderWithSelection)
 {
-    fs::create_directories(Path("in"));
-    fs::create_directories(Path("out"));
-    MakeInput(Format::Excel, Path("in/one.xlsx"));
-    MakeInput(Format::Excel, Path("in/two.xlsx"));
-    ASSERT_EQ(RunHost({2, Format::Excel, Path("in").string(), "", "1", Format::Rbx0, Path("out").string()}), 0) << Log();
-    const std::string expected = "Water Level[m]:Instantaneous\nDate/time\tLevel\n2020/01/01 00:00:00\t1.25\n"
-                                 "2020/01/01 00:15:00\t1.5\n2020/01/01 00:30:00\t\n";
-    EXPECT_EQ(AsText(Format::Rbx0, Path("out/one.rbx0")), expected);
-    EXPECT_EQ(AsText(Format::Rbx0, Path("out/two.rbx0")), expected);
+    for (Format in : kFormats)
+        for (Format out : kFormats) {
+            SCOPED_TRACE(std::string(converter::FormatName(in)) + " folder to " + converter::FormatName(out));
+            fs::remove_all(Path("in"));
+            fs::remove_all(Path("out"));
+            fs::create_directories(Path("in"));
+            fs::create_directories(Path("out"));
+            const std::string extension = converter::OutputExtension(in);
+            MakeInput(in, Path("in/one" + extension));
+            MakeInput(in, Path("in/two" + extension));
+            ASSERT_EQ(RunHost({2, in, Path("in").string(), "", "1", out, Path("out").string()}), 0) << Log();
+            const std::string title = in == Format::Rbx0 || out == Format::Rbx0 ? "Date/time" : "Time";
+            const std::string expected = "Water Level[m]:Instantaneous\n" + title +
+                                         "\tLevel\n2020/01/01 00:00:00\t1.25\n2020/01/01 00:15:00\t1.5\n"
+                                         "2020/01/01 00:30:00\t\n";
+            for (const char* name : {"one", "two"})
+                EXPECT_EQ(AsText(out, Path(std::string("out/") + name + converter::OutputExtension(out))), expected);
+        }
 }
 
 TEST_F(EndToEnd, FolderWithAMisfitConvertsTheRestAndFails)
@@ -220,7 +229,7 @@ TEST_F(EndToEnd, InterruptedEngineLeavesNoPartFile)
     }
     WriteFile(Path("big.txt"), content);
     WriteFile(Path("engine.wpx"), "wpx 1\ntarget \"VELMORA\"\n section \"INPUT\"\n  File_format = 2\n  File_name = file \"big.txt\"\n"
-                                  " end\n section \"OUTPUT\"\n  File_format = 2\n  File_name = file \"big.out.txt\"\n end\nend\nwpx end\n");
+                                  " end\n section \"OUTPUT\"\n  File_format = 2\n  File_name = file \"big.out.txt\"\n  Log_file = file \"engine.log\"\n end\nend\nwpx end\n");
     const std::string engine = std::string(VELMORA_BIN_DIR) + "/Velmora";
     const std::string setup = Path("engine.wpx").string();
     char* argv[] = {const_cast<char*>(engine.c_str()), const_cast<char*>(setup.c_str()), const_cast<char*>("1"),
