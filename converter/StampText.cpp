@@ -2,7 +2,9 @@
 
 #include "platform/system/OleDateTime.h"
 
+#include <algorithm>
 #include <climits>
+#include <iterator>
 #include <cmath>
 
 namespace converter {
@@ -80,10 +82,43 @@ DateFormat::DateFormat(std::string_view format, Reads reads, std::string_view ex
         while (i < format.size() && !m_separator[static_cast<unsigned char>(format[i])])
             ++i;
     }
+    const Field compact[] = {Field::Year, Field::Month, Field::Day, Field::Hour, Field::Minute, Field::Second};
+    m_compact = m_count == 6 && std::equal(std::begin(compact), std::end(compact), m_fields.begin());
+}
+
+bool DateFormat::ReadCompact(std::string_view text, StampFields& fields) const
+{
+    if (text.size() != 19)
+        return false;
+    const char* t = text.data();
+    for (size_t separator : {4, 7, 10, 13, 16})
+        if (!m_separator[static_cast<unsigned char>(t[separator])])
+            return false;
+    int values[6];
+    const size_t starts[6] = {0, 5, 8, 11, 14, 17};
+    for (int k = 0; k < 6; ++k) {
+        const size_t length = k == 0 ? 4 : 2;
+        int v = 0;
+        for (size_t c = 0; c < length; ++c) {
+            const unsigned digit = static_cast<unsigned char>(t[starts[k] + c]) - '0';
+            if (digit > 9)
+                return false;
+            v = v * 10 + static_cast<int>(digit);
+        }
+        values[k] = v;
+    }
+    // Out-of-range fields take the general path, which reports them.
+    if (values[0] < 100 || values[1] < 1 || values[1] > 12 || values[2] < 1 || values[2] > 31 || values[3] > 23 ||
+        values[4] > 59 || values[5] > 59)
+        return false;
+    fields = StampFields{values[0], values[1], values[2], values[3], values[4], values[5]};
+    return true;
 }
 
 bool DateFormat::Read(std::string_view text, StampFields& fields) const
 {
+    if (m_compact && ReadCompact(text, fields))
+        return true;
     size_t i = 0;
     for (size_t k = 0; k < m_lastUsed; ++k) {
         while (i < text.size() && m_separator[static_cast<unsigned char>(text[i])])

@@ -35,11 +35,14 @@ public:
 
 private:
     enum class Field : unsigned char { None, Year, Month, Day, Hour, Minute, Second };
+    // "dddd?dd?dd?dd?dd?dd" read by a Y M D H m S format, the common case, without tokenizing.
+    bool ReadCompact(std::string_view text, StampFields& fields) const;
     static constexpr size_t kMaxTokens = 32; // tokens past this read nothing, as "other" tokens do
     std::array<Field, kMaxTokens> m_fields{};
     size_t m_count = 0;
     size_t m_lastUsed = 0; // one past the last token that reads a field
     std::array<bool, 256> m_separator{};
+    bool m_compact = false; // the format is Y M D H m S, so ReadCompact may apply
 };
 
 // The stamp of calendar fields; nothing when the calendar has no such day (30 February).

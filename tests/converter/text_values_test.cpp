@@ -82,6 +82,21 @@ TEST(DateFormat, AgreesWithTheReferenceOnRandomTexts)
     }
 }
 
+TEST(DateFormat, CompactStampsAgreeWithTheReference)
+{
+    std::mt19937 random(11);
+    const std::string separators = "/ T:-.|x";
+    for (int n = 0; n < 20000; ++n) {
+        std::string text = "dddd/dd/dd dd:dd:dd";
+        for (char& c : text)
+            c = c == 'd' ? static_cast<char>('0' + random() % 10) : separators[random() % separators.size()];
+        if (n % 2 == 0) // mostly plausible values, so the fast path is taken as well as refused
+            text.replace(0, 4, std::to_string(1900 + random() % 200)), text[5] = '0', text[8] = static_cast<char>('0' + random() % 3);
+        ExpectSameAsReference(text, "YYYY/MM/DD HH:mm:ss");
+        ExpectSameAsReference(text, "YYYY-MM-DDTHH:mm:ss");
+    }
+}
+
 TEST(DateFormat, ExtraSeparatorsSplitJoinedFields)
 {
     StampFields fields;
