@@ -2,6 +2,7 @@
 
 #include "platform/system/FileSystem.h"
 
+#include <algorithm>
 #include <array>
 #include <cstring>
 #include <fstream>
@@ -123,13 +124,21 @@ void CheckZipDirectory(const std::string& path, const ImportLimits& limits)
         if (at + 46 > directory.size() || Read32(&directory[at]) != 0x02014b50u)
             throw OpenError(path, "the zip package is damaged (bad directory entry " + std::to_string(n + 1) + ").");
         const unsigned char* entry = &directory[at];
-        const std::uint64_t compressed = Read32(entry + 20);
-        const std::uint64_t uncompressed = Read32(entry + 24);
         const size_t nameLength = Read16(entry + 28);
         const size_t extra = static_cast<size_t>(Read16(entry + 30)) + Read16(entry + 32);
         if (at + 46 + nameLength > directory.size())
             throw OpenError(path, "the zip package is damaged (bad directory entry " + std::to_string(n + 1) + ").");
         std::string name(reinterpret_cast<const char*>(entry + 46), nameLength);
+        // The unpacking trusts the sizes of the directory entry and of the part's own header
+        // alike: both must fit the file and the limits.
+        const std::uint64_t localOffset = Read32(entry + 42);
+        std::vector<unsigned char> local = ReadAt(in, localOffset, 30);
+        if (local.size() < 30 || Read32(local.data()) != 0x04034b50u)
+            throw OpenError(path, "the zip package is damaged (the part " + name + " is missing).");
+        const std::uint64_t compressed = std::max<std::uint64_t>(Read32(entry + 20), Read32(local.data() + 18));
+        const std::uint64_t uncompressed = std::max<std::uint64_t>(Read32(entry + 24), Read32(local.data() + 22));
+        if (compressed > size - localOffset)
+            throw OpenError(path, "the zip package is damaged (the part " + name + " runs past the end of the file).");
         if (name == "xl/workbook.xml")
             hasWorkbookPart = true;
         if (uncompressed > limits.maxEntryBytes ||

@@ -120,6 +120,7 @@ TEST(BadWorkbooks, EachFailsToOpenWithItsReason)
         {"not-a-workbook.xlsx", "xl/workbook.xml is missing"},
         {"broken-xml.xlsx", "damaged"},
         {"bomb.xlsx", "zip bomb"},
+        {"lying-sizes.xlsx", "runs past the end of the file"},
         {"wide.xlsx", "outside the sheet's grid"},
     };
     for (const Case& c : cases) {
