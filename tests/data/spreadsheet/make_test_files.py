@@ -269,10 +269,8 @@ def make_xlsx_files():
     # A directory entry that claims a part far larger than the file.
     with open(os.path.join(HERE, "errors.xlsx"), "rb") as f:
         lying = bytearray(f.read())
-    directory = lying.rfind(b"PK\x01\x02", 0, lying.rfind(b"PK\x05\x06"))
     first = lying.find(b"PK\x01\x02")
     lying[first + 20:first + 24] = struct.pack("<I", 0xFFFFFD3E)
-    assert directory >= first
     write("lying-sizes.xlsx", bytes(lying))
     write("text.xlsx", b"Date;Value\n2021/05/17;1.5\n")
     write("empty.xls", b"")
