@@ -76,7 +76,9 @@ protected:
             << "\"\n      File_title = \"E2E\"\n      Log_file = file \"" << Path("run.log").string() << "\"\n    end\n"
             << "  end\nend\nwpx end\n";
         WriteFile(Path("setup.wpx"), doc.str());
-        const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora run " + (s.silent ? "--silent '" : "'") +
+        // The engine's setup file is named after the setup in the temporary folder: give each test
+        // its own folder so that tests running side by side never share that file.
+        const std::string command = "TMPDIR='" + m_root.string() + "' " + std::string(VELMORA_BIN_DIR) + "/velmora run " + (s.silent ? "--silent '" : "'") +
                                     Path("setup.wpx").string() + "' >'" + Path("host.out").string() + "' 2>&1";
         const int status = std::system(command.c_str());
         return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
