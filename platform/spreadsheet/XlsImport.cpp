@@ -3,6 +3,8 @@
 // formats of our own (see docs/spreadsheet.md).
 #include "platform/spreadsheet/WorkbookImport.h"
 
+#include "platform/spreadsheet/CompoundFile.h"
+
 #include "platform/system/OleDateTime.h"
 
 #include <freexl.h>
@@ -11,6 +13,7 @@
 #include <cstdio>
 #include <cstring>
 #include <fstream>
+#include <optional>
 #include <vector>
 
 namespace sheet {
@@ -37,29 +40,6 @@ std::string FreeXlWhy(int code)
     }
 }
 
-// The stream names of an encrypted package are stored in UTF-16 in the compound file's directory.
-bool LooksEncrypted(const std::string& path)
-{
-    const std::string name = "EncryptedPackage";
-    std::string wide;
-    for (char c : name) {
-        wide.push_back(c);
-        wide.push_back('\0');
-    }
-    std::ifstream in(path, std::ios::binary);
-    std::string window;
-    std::vector<char> chunk(1 << 16);
-    while (in) {
-        in.read(chunk.data(), static_cast<std::streamsize>(chunk.size()));
-        // Keep the tail of the previous chunk so a name across the boundary is still found.
-        window = window.substr(window.size() > wide.size() ? window.size() - wide.size() : 0);
-        window.append(chunk.data(), static_cast<size_t>(in.gcount()));
-        if (window.find(wide) != std::string::npos)
-            return true;
-    }
-    return false;
-}
-
 class Handle {
 public:
     ~Handle()
@@ -84,61 +64,57 @@ void CheckOpened(int code, const Handle& handle, const std::string& path)
         throw OpenError(path, "the workbook stream is damaged (unexpected records).");
 }
 
-std::uint32_t Le32(const unsigned char* p)
+unsigned Le16(const unsigned char* p) { return p[0] | p[1] << 8; }
+
+// Whether a string of `count` characters starting at `at` (after its option byte, whose bit 0
+// means two bytes per character) fits a record of `length` bytes.
+bool StringFits(const std::vector<unsigned char>& stream, size_t body, unsigned length, unsigned at, unsigned count)
 {
-    return static_cast<std::uint32_t>(p[0]) | static_cast<std::uint32_t>(p[1]) << 8 |
-           static_cast<std::uint32_t>(p[2]) << 16 | static_cast<std::uint32_t>(p[3]) << 24;
+    if (at >= length)
+        return count == 0;
+    const unsigned width = (stream[body + at] & 1) ? 2 : 1;
+    return at + 1 + static_cast<std::uint64_t>(count) * width <= length;
 }
 
-// FreeXL trusts the name lengths of the compound file's directory entries and converts that many
-// bytes from a 64-byte field. Walk the directory first and refuse entries it would overrun.
-void CheckCompoundDirectory(const std::string& path)
+// FreeXL copies records into a buffer of the largest BIFF8 record (8224 bytes) and trusts the
+// string lengths of FORMAT, BOUNDSHEET and LABEL records: check both before it reads.
+void CheckRecords(const std::string& path, const std::vector<unsigned char>& stream)
 {
-    std::ifstream in(path, std::ios::binary | std::ios::ate);
-    const std::uint64_t size = static_cast<std::uint64_t>(in.tellg());
-    std::vector<unsigned char> header(512);
-    in.seekg(0);
-    if (!in.read(reinterpret_cast<char*>(header.data()), 512))
-        throw OpenError(path, "the compound file is damaged (its header is cut short).");
-    const unsigned shift = header[30] | header[31] << 8;
-    if (shift != 9 && shift != 12)
-        throw OpenError(path, "the compound file is damaged (sector size 2^" + std::to_string(shift) + ").");
-    const std::uint64_t sectorSize = 1ull << shift;
-    const std::uint64_t sectorCount = size > sectorSize ? (size - sectorSize) / sectorSize + 1 : 0;
-    auto readSector = [&](std::uint32_t index, std::vector<unsigned char>& out) {
-        out.assign(sectorSize, 0);
-        if (index >= sectorCount)
-            return false;
-        in.clear();
-        in.seekg(static_cast<std::streamoff>((index + 1ull) * sectorSize));
-        return static_cast<bool>(in.read(reinterpret_cast<char*>(out.data()), static_cast<std::streamsize>(sectorSize)));
-    };
-
-    // The FAT: the sectors the header lists (enough for the files FreeXL can read at all).
-    std::vector<std::uint32_t> fat;
-    std::vector<unsigned char> sector;
-    const std::uint32_t fatSectors = Le32(&header[44]);
-    for (std::uint32_t i = 0; i < fatSectors && i < 109; ++i) {
-        if (!readSector(Le32(&header[76 + 4 * i]), sector))
-            throw OpenError(path, "the compound file is damaged (its allocation table lies outside the file).");
-        for (std::uint64_t k = 0; k + 4 <= sectorSize; k += 4)
-            fat.push_back(Le32(&sector[k]));
+    size_t at = 0;
+    for (unsigned n = 1; at + 4 <= stream.size(); ++n) {
+        const unsigned id = Le16(&stream[at]);
+        const unsigned length = Le16(&stream[at + 2]);
+        const size_t body = at + 4;
+        const std::string where = "record " + std::to_string(n) + " at byte " + std::to_string(at);
+        if (length > 8224)
+            throw OpenError(path, "the workbook stream is damaged (" + where + " is longer than a record may be).");
+        if (body + length > stream.size())
+            throw OpenError(path, "the workbook stream is damaged (" + where + " is cut short).");
+        bool fits = true;
+        if (id == 0x041E && length >= 4) // FORMAT: id, count, options, characters
+            fits = StringFits(stream, body, length, 4, Le16(&stream[body + 2]));
+        else if (id == 0x0085 && length >= 7) // BOUNDSHEET: position, state, type, count, options
+            fits = StringFits(stream, body, length, 7, stream[body + 6]);
+        else if (id == 0x0204 && length >= 8) // LABEL: row, column, format, count, options
+            fits = StringFits(stream, body, length, 8, Le16(&stream[body + 6]));
+        if (!fits)
+            throw OpenError(path, "the workbook stream is damaged (" + where + " holds a text longer than itself).");
+        at = body + length;
     }
+}
 
-    std::uint32_t next = Le32(&header[48]);
-    if (next >= sectorCount)
-        throw OpenError(path, "the compound file is damaged (its directory lies outside the file).");
-    for (std::uint64_t steps = 0; next < 0xFFFFFFFAu; ++steps) {
-        if (steps > sectorCount || !readSector(next, sector))
-            throw OpenError(path, "the compound file is damaged (its directory chain is broken).");
-        for (std::uint64_t at = 0; at + 128 <= sectorSize; at += 128) {
-            const unsigned nameLength = sector[at + 64] | sector[at + 65] << 8;
-            const unsigned type = sector[at + 66];
-            if (nameLength > 64 || nameLength % 2 != 0 || type > 5)
-                throw OpenError(path, "the compound file is damaged (bad directory entry).");
-        }
-        next = next < fat.size() ? fat[next] : 0xFFFFFFFEu;
-    }
+// Checks the container and the workbook stream before FreeXL reads them.
+void CheckContainer(const std::string& path)
+{
+    CompoundFile file(path);
+    if (file.Find("EncryptedPackage"))
+        throw OpenError(path, "the workbook is password-protected.");
+    std::optional<CompoundFile::Entry> workbook = file.Find("Workbook");
+    if (!workbook)
+        workbook = file.Find("Book");
+    if (!workbook)
+        throw OpenError(path, "the compound file holds no workbook stream.");
+    CheckRecords(path, file.Read(*workbook));
 }
 
 // FreeXL keeps every cell of a sheet in memory at once: refuse sheets whose grid is too big
@@ -232,9 +208,7 @@ void ImportXls(const std::string& path, ImportSink& sink, StyleTable& styles, co
     if (probe && static_cast<std::uint64_t>(probe.tellg()) > limits.maxFileBytes)
         throw OpenError(path, "the file is larger than " + std::to_string(limits.maxFileBytes >> 20) + " MiB.");
     probe.close();
-    CheckCompoundDirectory(path);
-    if (LooksEncrypted(path))
-        throw OpenError(path, "the workbook is password-protected.");
+    CheckContainer(path);
     CheckDimensions(path, limits);
 
     Handle workbook;

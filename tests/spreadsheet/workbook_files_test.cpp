@@ -116,6 +116,8 @@ TEST(BadWorkbooks, EachFailsToOpenWithItsReason)
         {"no-workbook.xls", "no workbook stream"},
         {"bad-directory.xls", "bad directory entry"},
         {"lost-directory.xls", "directory lies outside the file"},
+        {"long-record.xls", "longer than a record may be"},
+        {"long-text.xls", "holds a text longer than itself"},
         {"truncated.xlsx", "damaged (no central directory)"},
         {"not-a-workbook.xlsx", "xl/workbook.xml is missing"},
         {"broken-xml.xlsx", "damaged"},

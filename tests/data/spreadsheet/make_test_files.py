@@ -194,6 +194,12 @@ def make_xls_files():
     lost = bytearray(full)
     lost[48:52] = b"\xff\xff\xff\xff"
     write("lost-directory.xls", bytes(lost))
+    # Records FreeXL would overrun: one longer than a BIFF8 record may be, one whose text is
+    # longer than the record holding it.
+    long_record = bof(0x0005) + record(0x0087, b"\0" * 9000) + record(0x000A)
+    write("long-record.xls", compound_file([("Workbook", long_record.ljust(MINI_CUTOFF, b"\0"))]))
+    long_text = bof(0x0005) + record(0x041E, struct.pack("<HHB", 164, 0xFFFF, 0) + b"0.00") + record(0x000A)
+    write("long-text.xls", compound_file([("Workbook", long_text.ljust(MINI_CUTOFF, b"\0"))]))
     # The compound file is sound but holds no workbook stream.
     write("no-workbook.xls", compound_file([("Something", b"\0" * 4096)]))
 

@@ -1,0 +1,145 @@
+#include "platform/spreadsheet/CompoundFile.h"
+
+#include "platform/spreadsheet/WorkbookImport.h"
+
+namespace sheet {
+
+namespace {
+
+constexpr std::uint32_t kLastRegularSector = 0xFFFFFFF9u;
+
+std::uint32_t Le32(const unsigned char* p)
+{
+    return static_cast<std::uint32_t>(p[0]) | static_cast<std::uint32_t>(p[1]) << 8 |
+           static_cast<std::uint32_t>(p[2]) << 16 | static_cast<std::uint32_t>(p[3]) << 24;
+}
+
+unsigned Le16(const unsigned char* p) { return p[0] | p[1] << 8; }
+
+} // namespace
+
+void CompoundFile::Fail(const std::string& why) const
+{
+    throw OpenError(m_path, "the compound file is damaged (" + why + ").");
+}
+
+CompoundFile::CompoundFile(const std::string& path) : m_path(path), m_in(path, std::ios::binary | std::ios::ate)
+{
+    if (!m_in)
+        throw OpenError(path, "the file cannot be read.");
+    m_fileSize = static_cast<std::uint64_t>(m_in.tellg());
+    std::vector<unsigned char> header(512);
+    m_in.seekg(0);
+    if (!m_in.read(reinterpret_cast<char*>(header.data()), 512))
+        Fail("its header is cut short");
+    const unsigned shift = Le16(&header[30]);
+    if (shift != 9 && shift != 12)
+        Fail("sector size 2^" + std::to_string(shift));
+    m_sectorSize = 1ull << shift;
+    m_sectorCount = m_fileSize > m_sectorSize ? (m_fileSize - m_sectorSize) / m_sectorSize : 0;
+    m_miniCutoff = Le32(&header[56]);
+
+    // The FAT from the sectors the header lists (the header holds room for 109 of them).
+    std::vector<unsigned char> sector;
+    const std::uint32_t fatSectors = Le32(&header[44]);
+    for (std::uint32_t i = 0; i < fatSectors && i < 109; ++i) {
+        if (!ReadSector(Le32(&header[76 + 4 * i]), sector))
+            Fail("its allocation table lies outside the file");
+        for (std::uint64_t k = 0; k + 4 <= m_sectorSize; k += 4)
+            m_fat.push_back(Le32(&sector[k]));
+    }
+
+    const std::uint32_t directoryStart = Le32(&header[48]);
+    if (directoryStart >= m_sectorCount)
+        Fail("its directory lies outside the file");
+    std::vector<unsigned char> directory = ReadChain(directoryStart, m_fileSize, m_fat, m_sectorSize, false);
+    for (std::uint64_t at = 0; at + 128 <= directory.size(); at += 128) {
+        const unsigned char* e = &directory[at];
+        const unsigned nameLength = Le16(e + 64);
+        Entry entry;
+        entry.type = e[66];
+        if (nameLength > 64 || nameLength % 2 != 0 || entry.type > 5)
+            Fail("bad directory entry");
+        for (unsigned i = 0; i + 2 < nameLength; i += 2) // the length counts the closing zero
+            entry.name.push_back(e[i + 1] == 0 && e[i] >= 0x20 && e[i] < 0x7F ? static_cast<char>(e[i]) : '?');
+        entry.start = Le32(e + 116);
+        entry.size = Le32(e + 120);
+        m_entries.push_back(entry);
+    }
+    if (m_entries.empty() || m_entries[0].type != 5)
+        Fail("no root entry");
+    m_miniFat = ReadTable(Le32(&header[60]), Le32(&header[64]));
+}
+
+std::optional<CompoundFile::Entry> CompoundFile::Find(const std::string& name) const
+{
+    for (const Entry& entry : m_entries)
+        if (entry.type == 2 && entry.name == name)
+            return entry;
+    return std::nullopt;
+}
+
+std::vector<unsigned char> CompoundFile::Read(const Entry& entry)
+{
+    if (entry.size > m_fileSize)
+        Fail("the stream " + entry.name + " is larger than the file");
+    if (entry.size >= m_miniCutoff)
+        return ReadChain(entry.start, entry.size, m_fat, m_sectorSize, false);
+    if (!m_miniStreamRead) {
+        m_miniStream = ReadChain(m_entries[0].start, m_entries[0].size, m_fat, m_sectorSize, false);
+        m_miniStreamRead = true;
+    }
+    return ReadChain(entry.start, entry.size, m_miniFat, 64, true);
+}
+
+bool CompoundFile::ReadSector(std::uint32_t index, std::vector<unsigned char>& out)
+{
+    out.assign(m_sectorSize, 0);
+    if (index >= m_sectorCount)
+        return false;
+    m_in.clear();
+    m_in.seekg(static_cast<std::streamoff>((index + 1ull) * m_sectorSize));
+    return static_cast<bool>(m_in.read(reinterpret_cast<char*>(out.data()), static_cast<std::streamsize>(m_sectorSize)));
+}
+
+std::vector<std::uint32_t> CompoundFile::ReadTable(std::uint32_t start, std::uint32_t count)
+{
+    std::vector<std::uint32_t> table;
+    if (start > kLastRegularSector || count == 0)
+        return table;
+    std::vector<unsigned char> bytes = ReadChain(start, static_cast<std::uint64_t>(count) * m_sectorSize, m_fat, m_sectorSize, false);
+    for (size_t k = 0; k + 4 <= bytes.size(); k += 4)
+        table.push_back(Le32(&bytes[k]));
+    return table;
+}
+
+// Follows a chain through `table`; stops at its end or after `size` bytes, and fails on a chain
+// that leaves the file, loops, or ends before `size` bytes (when `size` is a stream's size).
+std::vector<unsigned char> CompoundFile::ReadChain(std::uint32_t start, std::uint64_t size,
+                                                   const std::vector<std::uint32_t>& table, std::uint64_t unit, bool mini)
+{
+    std::vector<unsigned char> out;
+    std::vector<unsigned char> sector;
+    const std::uint64_t limit = mini ? m_miniStream.size() / unit : m_sectorCount;
+    std::uint32_t next = start;
+    for (std::uint64_t steps = 0; next <= kLastRegularSector && out.size() < size; ++steps) {
+        if (steps > limit || next >= limit)
+            Fail("a sector chain is broken");
+        if (mini) {
+            out.insert(out.end(), m_miniStream.begin() + static_cast<std::ptrdiff_t>(next * unit),
+                       m_miniStream.begin() + static_cast<std::ptrdiff_t>((next + 1) * unit));
+        } else {
+            if (!ReadSector(next, sector))
+                Fail("a sector lies outside the file");
+            out.insert(out.end(), sector.begin(), sector.end());
+        }
+        next = next < table.size() ? table[next] : 0xFFFFFFFEu;
+    }
+    if (size != m_fileSize && out.size() < size && size <= m_fileSize)
+        Fail("a stream is shorter than its directory entry says");
+    if (out.size() > size)
+        out.resize(static_cast<size_t>(size));
+    return out;
+}
+
+} // namespace sheet

@@ -1,0 +1,50 @@
+#pragma once
+// A reader of the compound-file container of .xls workbooks, used to check a file before FreeXL
+// reads it: FreeXL trusts directory name lengths and record lengths and overruns its buffers on
+// damaged files. Every failure throws AutomationError naming the file.
+#include <cstdint>
+#include <fstream>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace sheet {
+
+class CompoundFile {
+public:
+    // Reads the header, the allocation tables and the directory; throws when they are damaged.
+    explicit CompoundFile(const std::string& path);
+
+    struct Entry {
+        std::string name; // ASCII names only; other characters become '?'
+        unsigned type = 0;
+        std::uint32_t start = 0;
+        std::uint64_t size = 0;
+    };
+    const std::vector<Entry>& Entries() const { return m_entries; }
+    std::optional<Entry> Find(const std::string& name) const;
+
+    // The bytes of a stream (from the mini stream when it is small); throws on a broken chain.
+    std::vector<unsigned char> Read(const Entry& entry);
+
+private:
+    bool ReadSector(std::uint32_t index, std::vector<unsigned char>& out);
+    std::vector<unsigned char> ReadChain(std::uint32_t start, std::uint64_t size, const std::vector<std::uint32_t>& table,
+                                         std::uint64_t unit, bool mini);
+    std::vector<std::uint32_t> ReadTable(std::uint32_t start, std::uint32_t count);
+    [[noreturn]] void Fail(const std::string& why) const;
+
+    std::string m_path;
+    std::ifstream m_in;
+    std::uint64_t m_fileSize = 0;
+    std::uint64_t m_sectorSize = 512;
+    std::uint64_t m_sectorCount = 0;
+    std::uint32_t m_miniCutoff = 4096;
+    std::vector<std::uint32_t> m_fat;
+    std::vector<std::uint32_t> m_miniFat;
+    std::vector<Entry> m_entries;
+    std::vector<unsigned char> m_miniStream;
+    bool m_miniStreamRead = false;
+};
+
+} // namespace sheet
