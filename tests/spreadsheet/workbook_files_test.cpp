@@ -65,6 +65,15 @@ TEST(XlsWorkbooks, ValuesTextsAndUsedRangeOfABiffWorkbook)
     EXPECT_TRUE(empty->Value2().IsEmpty());
 }
 
+TEST(XlsWorkbooks, SmallWorkbookStreamIsReadFromTheMiniStream)
+{
+    auto app = StartApplication(ApplicationSettings());
+    auto sheet = OpenSheet(*app, DataFile("small.xls"));
+    EXPECT_EQ(Text(*sheet, "C1"), "Flow station");
+    EXPECT_EQ(Text(*sheet, "E6"), "6000");
+    EXPECT_EQ(sheet->UsedRange()->Count(), 7 * 3);
+}
+
 TEST(XlsWorkbooks, DateTimesAndTimesKeepTheirSeconds)
 {
     auto app = StartApplication(ApplicationSettings());

@@ -31,25 +31,49 @@ def dir_entry(name, kind, start, size, child=NOSTREAM, right=NOSTREAM):
 
 
 def compound_file(streams):
-    """streams: list of (name, bytes); each stream is padded to at least 4096 bytes by the caller."""
-    data_sectors = []
+    """streams: list of (name, bytes). Streams under 4096 bytes go to the mini stream (64-byte
+    mini sectors kept in the root entry's stream), the others to regular sectors."""
+    mini_streams = [(n, p) for n, p in streams if len(p) < MINI_CUTOFF]
+    mini = b""
+    mini_fat = []
+    mini_entries = {}
+    for name, payload in mini_streams:
+        count = max(1, (len(payload) + 63) // 64)
+        first = len(mini_fat)
+        mini_entries[name] = (first, len(payload))
+        mini_fat += [first + i + 1 for i in range(count - 1)] + [ENDOFCHAIN]
+        mini += payload.ljust(count * 64, b"\0")
+
+    # Sector 0: FAT, 1: directory, 2: mini FAT (when used), then the mini stream, then streams.
+    sectors = []
+    fat = [FATSECT, ENDOFCHAIN]
+    next_sector = 2
+    mini_fat_sector = ENDOFCHAIN
+    root_start = ENDOFCHAIN
+    if mini:
+        mini_fat_sector = next_sector
+        fat.append(ENDOFCHAIN)
+        sectors.append(struct.pack("<%dI" % len(mini_fat), *mini_fat).ljust(SECTOR, b"\xff"))
+        next_sector += 1
+        root_start = next_sector
+        count = (len(mini) + SECTOR - 1) // SECTOR
+        fat += [next_sector + i + 1 for i in range(count - 1)] + [ENDOFCHAIN]
+        sectors.append(mini.ljust(count * SECTOR, b"\0"))
+        next_sector += count
     entries = []
-    next_sector = 2  # 0: FAT, 1: directory
     for name, payload in streams:
-        assert len(payload) >= MINI_CUTOFF
+        if name in mini_entries:
+            entries.append((name,) + mini_entries[name])
+            continue
         count = (len(payload) + SECTOR - 1) // SECTOR
         entries.append((name, next_sector, len(payload)))
-        data_sectors.append(payload.ljust(count * SECTOR, b"\0"))
+        fat += [next_sector + i + 1 for i in range(count - 1)] + [ENDOFCHAIN]
+        sectors.append(payload.ljust(count * SECTOR, b"\0"))
         next_sector += count
     assert next_sector <= SECTOR // 4, "one FAT sector is enough for the test files"
-
-    fat = [FATSECT, ENDOFCHAIN]
-    for _, start, size in entries:
-        count = (size + SECTOR - 1) // SECTOR
-        fat += [start + i + 1 for i in range(count - 1)] + [ENDOFCHAIN]
     fat += [FREESECT] * (SECTOR // 4 - len(fat))
 
-    directory = dir_entry("Root Entry", 5, ENDOFCHAIN, 0, child=1)
+    directory = dir_entry("Root Entry", 5, root_start, len(mini), child=1)
     for i, (name, start, size) in enumerate(entries):
         right = i + 2 if i + 1 < len(entries) else NOSTREAM
         directory += dir_entry(name, 2, start, size, right=right)
@@ -58,10 +82,10 @@ def compound_file(streams):
 
     header = (bytes.fromhex("D0CF11E0A1B11AE1") + b"\0" * 16
               + struct.pack("<HHHHH", 0x3E, 3, 0xFFFE, 9, 6) + b"\0" * 6
-              + struct.pack("<IIIIIIIII", 0, 1, 1, 0, MINI_CUTOFF, ENDOFCHAIN, 0, ENDOFCHAIN, 0)
+              + struct.pack("<IIIIIIIII", 0, 1, 1, 0, MINI_CUTOFF, mini_fat_sector, 1 if mini else 0, ENDOFCHAIN, 0)
               + struct.pack("<I", 0) + struct.pack("<I", FREESECT) * 108)
     assert len(header) == SECTOR
-    return header + struct.pack("<%dI" % len(fat), *fat) + directory + b"".join(data_sectors)
+    return header + struct.pack("<%dI" % len(fat), *fat) + directory + b"".join(sectors)
 
 
 # ----------------------------------------------------------------------------------------------
@@ -133,8 +157,8 @@ def sheet_records(cells, strings):
     return out
 
 
-def workbook_stream(sheets):
-    """sheets: list of (name, cells)."""
+def workbook_stream(sheets, pad=True):
+    """sheets: list of (name, cells); padded to 4096 bytes unless `pad` is false."""
     strings = []
     for _, cells in sheets:
         for cell in cells:
@@ -151,7 +175,7 @@ def workbook_stream(sheets):
     stream = globals_records(names, strings, offsets) + b"".join(bodies)
     # Streams under 4096 bytes would belong in the mini stream; readers stop at the last EOF
     # record, so zero bytes after it fill the stream up.
-    return stream.ljust(MINI_CUTOFF, b"\0")
+    return stream.ljust(MINI_CUTOFF, b"\0") if pad else stream
 
 
 def series_cells():
@@ -180,6 +204,8 @@ def write(name, data):
 
 def make_xls_files():
     write("series.xls", compound_file([("Workbook", workbook_stream([("Data", series_cells()), ("Second", [])]))]))
+    # A small workbook stream lives in the mini stream, as real small files have it.
+    write("small.xls", compound_file([("Workbook", workbook_stream([("Data", series_cells())], pad=False))]))
     write("stamps.xls", compound_file([("Workbook", workbook_stream([("Stamps", stamp_cells())]))]))
     # A password-protected .xlsx is a compound file holding the encrypted package.
     write("password.xlsx", compound_file([("EncryptionInfo", b"\4\0\4\0" + b"\0" * 4092),
