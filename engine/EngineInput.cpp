@@ -2,68 +2,19 @@
 // setup record's working objects (the template object and the preview parser of the input format).
 #include "engine/Engine.h"
 
-#include "parsers/AsciiFilePreviewParser.h"
-#include "parsers/ExcelFilePreviewParser.h"
-#include "parsers/RbxPreviewFileParser.h"
+#include "parsers/ParserFactory.h"
 #include "platform/system/Text.h"
-#include "templates/AsciiSpecification.h"
-#include "templates/ExcelSpecification.h"
-
-namespace {
-
-// True when `parser` is of the class that reads `format`.
-bool ParserServesFormat(const CFilePreviewParser* parser, int format)
-{
-    switch (format) {
-    case 1:
-        return dynamic_cast<const CRbxPreviewFileParser*>(parser) != nullptr;
-    case 2:
-        return dynamic_cast<const CAsciiFilePreviewParser*>(parser) != nullptr;
-    case 3:
-        return dynamic_cast<const CExcelFilePreviewParser*>(parser) != nullptr;
-    default:
-        return false;
-    }
-}
-
-std::unique_ptr<CSpecification> NewSpecification(int format)
-{
-    switch (format) {
-    case 2:
-        return std::make_unique<CAsciiSpecification>();
-    case 3:
-        return std::make_unique<CExcelSpecification>();
-    default:
-        return nullptr; // rbx0 files describe themselves
-    }
-}
-
-std::unique_ptr<CFilePreviewParser> NewParser(int format)
-{
-    switch (format) {
-    case 1:
-        return std::make_unique<CRbxPreviewFileParser>(); // prepares the rbx data-file library
-    case 2:
-        return std::make_unique<CAsciiFilePreviewParser>();
-    case 3:
-        return std::make_unique<CExcelFilePreviewParser>();
-    default:
-        return nullptr;
-    }
-}
-
-} // namespace
 
 void CEngine::SetInput(int type, int format, const CString& file, const CString& folder)
 {
     m_nInputType = type;
-    const bool keepObjects = format == m_nInputFormat && ParserServesFormat(m_pParser.get(), format);
+    const bool keepObjects = format == m_nInputFormat && IsParserOfFormat(m_pParser.get(), format);
     if (!keepObjects) {
         // The parser borrows the template, so it goes first.
         m_pParser.reset();
         m_pSpecification.reset();
-        m_pSpecification = NewSpecification(format);
-        m_pParser = NewParser(format);
+        m_pSpecification = MakeSpecification(format);
+        m_pParser = MakeParser(format); // the rbx0 parser prepares the rbx data-file library
     }
     m_nInputFormat = format;
     m_strInputFile = file;

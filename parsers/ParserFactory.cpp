@@ -46,6 +46,20 @@ std::unique_ptr<CFilePreviewParser> MakeParser(int format)
     }
 }
 
+bool IsParserOfFormat(const CFilePreviewParser* parser, int format)
+{
+    switch (format) {
+    case kFormatRbx0:
+        return dynamic_cast<const CRbxPreviewFileParser*>(parser) != nullptr;
+    case kFormatAscii:
+        return dynamic_cast<const CAsciiFilePreviewParser*>(parser) != nullptr;
+    case kFormatExcel:
+        return dynamic_cast<const CExcelFilePreviewParser*>(parser) != nullptr;
+    default:
+        return false;
+    }
+}
+
 int ParseGuarded(CFilePreviewParser& parser, const CString& path, CString* error)
 {
     try {

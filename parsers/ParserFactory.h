@@ -16,6 +16,8 @@ int FormatFromName(const CString& name);
 std::unique_ptr<CSpecification> MakeSpecification(int format);
 // The parser of the format, not yet bound to a file or template; null for an unknown format.
 std::unique_ptr<CFilePreviewParser> MakeParser(int format);
+// True when `parser` is of the class MakeParser makes for `format`; false for null.
+bool IsParserOfFormat(const CFilePreviewParser* parser, int format);
 
 // Parse as the setup record runs it: an exception the parser lets through (a file that exists but
 // cannot be read) makes the parse fail with 0; its text goes to `error` when asked for.
