@@ -62,9 +62,13 @@ CStringList CFilePreviewParser::BuildPreviewTitles() const
 
 int CFilePreviewParser::ShowPreview(const CString& title)
 {
+    // Without a selection the dialog reads the parser's own table; only a selection is built anew.
+    const bool selected = !EffectiveSelection().empty();
+    const ui::Rows picked = selected ? BuildPreviewRows() : ui::Rows();
+    const CStringList headers = BuildPreviewTitles();
     ui::PreviewContent content;
-    content.resultRows = BuildPreviewRows();
-    content.headers = BuildPreviewTitles();
+    content.resultRows = selected ? picked : m_vecRows;
+    content.headers = headers;
     content.inputLines = m_vecRawLines;
     if (content.inputLines.empty() && content.headers.empty() && content.resultRows.empty())
         return 0;

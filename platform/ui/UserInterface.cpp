@@ -11,17 +11,21 @@ ConsoleUserInterface g_console;
 UserInterface* g_process = nullptr;
 thread_local UserInterface* t_scoped = nullptr;
 
-void PrintRows(const Rows& rows)
+void PrintRow(std::span<const std::string> row)
 {
-    for (const Row& row : rows) {
-        std::string line;
-        for (size_t i = 0; i < row.size(); ++i) {
-            if (i)
-                line += '\t';
-            line += row[i];
-        }
-        std::fprintf(stderr, "  %s\n", line.c_str());
+    std::string line;
+    for (size_t i = 0; i < row.size(); ++i) {
+        if (i)
+            line += '\t';
+        line += row[i];
     }
+    std::fprintf(stderr, "  %s\n", line.c_str());
+}
+
+void PrintRows(std::span<const Row> rows)
+{
+    for (const Row& row : rows)
+        PrintRow(row);
 }
 
 } // namespace
@@ -72,7 +76,7 @@ void ConsoleUserInterface::ShowPreview(const PreviewContent& content)
 {
     std::fprintf(stderr, "Preview %s\n", content.title.c_str());
     PrintRows(content.inputLines);
-    PrintRows(Rows{content.headers});
+    PrintRow(content.headers);
     PrintRows(content.resultRows);
 }
 
@@ -94,7 +98,12 @@ int ScriptedUserInterface::MessageBox(const std::string& text, const std::string
     return answer;
 }
 
-void ScriptedUserInterface::ShowPreview(const PreviewContent& content) { previews.push_back(content); }
+void ScriptedUserInterface::ShowPreview(const PreviewContent& content)
+{
+    previews.push_back({content.title, Rows(content.inputLines.begin(), content.inputLines.end()),
+                        std::vector<std::string>(content.headers.begin(), content.headers.end()),
+                        Rows(content.resultRows.begin(), content.resultRows.end())});
+}
 
 bool ScriptedUserInterface::ChooseFile(const FileDialogRequest&, std::string& path)
 {

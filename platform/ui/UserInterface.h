@@ -3,6 +3,7 @@
 // Parsers, pages and the setup record call these functions; which implementation answers is chosen
 // at the edge (Qt in the wizard, console in the host program, scripted in tests, silent in the bridge).
 #include <deque>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -24,12 +25,21 @@ enum : int { IDOK = 1, IDCANCEL = 2, IDYES = 6, IDNO = 7 };
 using Row = std::vector<std::string>;
 using Rows = std::vector<Row>;
 
-// What the file preview dialog shows.
+// What the file preview dialog shows. The lists are borrowed from the caller for the duration of
+// ShowPreview: a preview table can hold millions of rows, so it is never copied on the way.
 struct PreviewContent {
-    std::string title;       // window title; empty keeps the dialog's own
-    Rows inputLines;         // "Input file" list; empty hides it
-    std::vector<std::string> headers; // column titles of "Import result"
-    Rows resultRows;         // "Import result" rows
+    std::string title;                     // window title; empty keeps the dialog's own
+    std::span<const Row> inputLines;       // "Input file" list; empty hides it
+    std::span<const std::string> headers;  // column titles of "Import result"
+    std::span<const Row> resultRows;       // "Import result" rows
+};
+
+// A preview kept after its dialog closed, with its own copy of the lists.
+struct RecordedPreview {
+    std::string title;
+    Rows inputLines;
+    std::vector<std::string> headers;
+    Rows resultRows;
 };
 
 struct FileDialogRequest {
@@ -102,7 +112,7 @@ public:
         unsigned type = 0;
     };
     std::vector<Box> boxes;
-    std::vector<PreviewContent> previews;
+    std::vector<RecordedPreview> previews;
     std::deque<int> answers;            // next message-box answers; default button when empty
     std::deque<std::string> chosenPaths; // next file/folder choices; cancelled when empty
 

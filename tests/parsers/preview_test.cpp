@@ -66,7 +66,7 @@ TEST_F(PreviewTest, ShowPreviewHandsTheBuiltListsToTheDialog)
     EXPECT_EQ(parser.m_strFileTitle, "river.txt");
     ASSERT_EQ(parser.ShowPreview(""), 1);
     ASSERT_EQ(ui.previews.size(), 1u);
-    const ui::PreviewContent& shown = ui.previews.front();
+    const ui::RecordedPreview& shown = ui.previews.front();
     EXPECT_EQ(shown.title, "river.txt");
     EXPECT_EQ(shown.inputLines, parser.m_vecRawLines);
     EXPECT_EQ(shown.headers, (CStringList{"Time", "Q"}));
@@ -91,6 +91,40 @@ TEST_F(PreviewTest, NothingToShowShowsNoDialog)
     parser.m_vecRawLines.clear();
     EXPECT_EQ(parser.ShowPreview("x"), 0);
     EXPECT_TRUE(ui.previews.empty());
+}
+
+// Sees where the lists handed to the dialog live, so a copy on the way is caught.
+class AddressRecorder : public ui::SilentUserInterface {
+public:
+    const ui::Row* resultData = nullptr;
+    const ui::Row* inputData = nullptr;
+    size_t resultCount = 0;
+    void ShowPreview(const ui::PreviewContent& content) override
+    {
+        resultData = content.resultRows.data();
+        inputData = content.inputLines.data();
+        resultCount = content.resultRows.size();
+    }
+};
+
+TEST(PreviewBorrowing, WithoutSelectionTheDialogReadsTheParsersOwnRows)
+{
+    AddressRecorder recorder;
+    ui::ScopedUserInterface scope{recorder};
+    CAsciiFilePreviewParser parser;
+    parser.m_vecItemNames = {"Time", "P", "Q"};
+    parser.m_vecRows = {{"2020/01/01", "1", "2"}, {"2020/01/02", "3", "4"}};
+    parser.m_vecRawLines = {{"raw"}};
+
+    ASSERT_EQ(parser.ShowPreview(""), 1);
+    EXPECT_EQ(recorder.resultData, parser.m_vecRows.data());
+    EXPECT_EQ(recorder.inputData, parser.m_vecRawLines.data());
+    EXPECT_EQ(recorder.resultCount, 2u);
+
+    parser.m_arrItems = {1};
+    ASSERT_EQ(parser.ShowPreview(""), 1);
+    EXPECT_NE(recorder.resultData, parser.m_vecRows.data()); // the picked columns are a table of their own
+    EXPECT_EQ(recorder.resultCount, 2u);
 }
 
 } // namespace
