@@ -13,6 +13,30 @@ void ReadFileName(WPXHANDLE section, const char* key, CString& field)
     wpxGetParamFilename(section, key, &field, 1, 1);
 }
 
+// The keywords the input and the output section share, in the order both write them.
+struct FileChoice {
+    int& format;
+    CString& bridge;
+    CString& file;
+    CString& folder;
+};
+
+void WriteFileChoice(WPXHANDLE document, const FileChoice& choice)
+{
+    wpxPutParam(document, "File_format", choice.format);
+    wpxPutParam(document, "Bridge", choice.bridge);
+    wpxPutParamFilename(document, "File_name", choice.file.c_str());
+    wpxPutParamFilename(document, "Folder_name", choice.folder.c_str());
+}
+
+void ReadFileChoice(WPXHANDLE section, const FileChoice& choice)
+{
+    ReadInt(section, "File_format", choice.format);
+    ReadText(section, "Bridge", choice.bridge);
+    ReadFileName(section, "File_name", choice.file);
+    ReadFileName(section, "Folder_name", choice.folder);
+}
+
 } // namespace
 
 void CEngine::WriteSetupSections(WPXHANDLE document)
@@ -20,10 +44,7 @@ void CEngine::WriteSetupSections(WPXHANDLE document)
     GetBridgeName(m_nInputFormat, m_strInputBridge);
     wpxAddSection(document, "INPUT");
     wpxPutParam(document, "Type", m_nInputType);
-    wpxPutParam(document, "File_format", m_nInputFormat);
-    wpxPutParam(document, "Bridge", m_strInputBridge);
-    wpxPutParamFilename(document, "File_name", m_strInputFile.c_str());
-    wpxPutParamFilename(document, "Folder_name", m_strInputFolder.c_str());
+    WriteFileChoice(document, {m_nInputFormat, m_strInputBridge, m_strInputFile, m_strInputFolder});
     wpxEndSection(document);
 
     wpxAddSection(document, "TEMPLATE");
@@ -38,10 +59,7 @@ void CEngine::WriteSetupSections(WPXHANDLE document)
     CString logFile;
     GetLogFileDir(logFile);
     wpxAddSection(document, "OUTPUT");
-    wpxPutParam(document, "File_format", m_nOutputFormat);
-    wpxPutParam(document, "Bridge", m_strOutputBridge);
-    wpxPutParamFilename(document, "File_name", m_strOutputFile.c_str());
-    wpxPutParamFilename(document, "Folder_name", m_strOutputFolder.c_str());
+    WriteFileChoice(document, {m_nOutputFormat, m_strOutputBridge, m_strOutputFile, m_strOutputFolder});
     wpxPutParam(document, "File_title", m_strOutputTitle);
     wpxPutParamFilename(document, "Log_file", logFile.c_str());
     wpxEndSection(document);
@@ -51,10 +69,7 @@ void CEngine::ReadSetupSections(WPXHANDLE section)
 {
     WPXHANDLE input = wpxSectionByNameNum(section, "INPUT", 1);
     ReadInt(input, "Type", m_nInputType);
-    ReadInt(input, "File_format", m_nInputFormat);
-    ReadText(input, "Bridge", m_strInputBridge);
-    ReadFileName(input, "File_name", m_strInputFile);
-    ReadFileName(input, "Folder_name", m_strInputFolder);
+    ReadFileChoice(input, {m_nInputFormat, m_strInputBridge, m_strInputFile, m_strInputFolder});
 
     WPXHANDLE templ = wpxSectionByNameNum(section, "TEMPLATE", 1);
     ReadInt(templ, "Template_option", m_nTemplateOption);
@@ -68,10 +83,7 @@ void CEngine::ReadSetupSections(WPXHANDLE section)
         m_arrItems.push_back(static_cast<unsigned>(wpxGetInt(wpxParamByNum(items, n))));
 
     WPXHANDLE output = wpxSectionByNameNum(section, "OUTPUT", 1);
-    ReadInt(output, "File_format", m_nOutputFormat);
-    ReadText(output, "Bridge", m_strOutputBridge);
-    ReadFileName(output, "File_name", m_strOutputFile);
-    ReadFileName(output, "Folder_name", m_strOutputFolder);
+    ReadFileChoice(output, {m_nOutputFormat, m_strOutputBridge, m_strOutputFile, m_strOutputFolder});
     ReadText(output, "File_title", m_strOutputTitle);
     CString logFile;
     GetLogFileDir(logFile);

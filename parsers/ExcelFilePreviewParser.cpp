@@ -343,44 +343,46 @@ struct RowTimeParts {
     bool useFormat;
 };
 
-bool GlobalDateWithRowTime(const RowTimeParts& row, const CTimeDescription& td, COleDateTime& stamp)
-{
-    COleDateTime global;
-    const bool globalRead = ReadDateText(td.m_strGlobalDate, DateReading::DateOnly, global);
-    CDateFields date;
-    if (row.useFormat) {
-        CTimeFields time;
-        if (!ParseTimeText(row.joined, td.m_strTimeFormat, time))
-            return false;
-        stamp = globalRead && TakeDate(global, date) ? Combine(date, time) : InvalidDateTime();
-        return true;
-    }
-    if (row.cells.empty() || row.cells.front().IsEmpty() || !globalRead || !TakeDate(global, date))
-        return false;
-    COleDateTime cell;
-    CTimeFields time;
-    stamp = VariantToDate(row.cells.front(), cell) && TakeTimeOfDay(cell, time) ? Combine(date, time)
-                                                                                : InvalidDateTime();
-    return true;
-}
+// The two halves of a stamp: each is read from a text by its format, or taken from a date-time.
+struct DateHalf {
+    using Fields = CDateFields;
+    static constexpr DateReading kGlobalReading = DateReading::DateOnly;
+    static bool Parse(const CString& text, const CString& format, Fields& date) { return ParseDateText(text, format, date); }
+    static bool Take(const COleDateTime& value, Fields& date) { return TakeDate(value, date); }
+};
 
-bool RowDateWithGlobalTime(const RowTimeParts& row, const CTimeDescription& td, COleDateTime& stamp)
+struct TimeHalf {
+    using Fields = CTimeFields;
+    static constexpr DateReading kGlobalReading = DateReading::TimeOnly;
+    static bool Parse(const CString& text, const CString& format, Fields& time) { return ParseTimeText(text, format, time); }
+    static bool Take(const COleDateTime& value, Fields& time) { return TakeTimeOfDay(value, time); }
+};
+
+COleDateTime Combine(const CTimeFields& time, const CDateFields& date) { return Combine(date, time); }
+
+// `GlobalHalf` is one text for all rows (`globalText`); `RowHalf` comes from the row's cells, read by
+// `rowFormat` when the row is taken as text. False when the row holds no stamp; an unreadable global
+// half gives an invalid stamp instead, so the row still shows.
+template <typename GlobalHalf, typename RowHalf>
+bool GlobalWithRowHalf(const RowTimeParts& row, const CString& globalText, const CString& rowFormat,
+                       COleDateTime& stamp)
 {
     COleDateTime global;
-    const bool globalRead = ReadDateText(td.m_strGlobalTime, DateReading::TimeOnly, global);
-    CTimeFields time;
+    const bool globalRead = ReadDateText(globalText, GlobalHalf::kGlobalReading, global);
+    typename GlobalHalf::Fields globalFields;
+    typename RowHalf::Fields rowFields;
     if (row.useFormat) {
-        CDateFields date;
-        if (!ParseDateText(row.joined, td.m_strDateFormat, date))
+        if (!RowHalf::Parse(row.joined, rowFormat, rowFields))
             return false;
-        stamp = globalRead && TakeTimeOfDay(global, time) ? Combine(date, time) : InvalidDateTime();
+        stamp = globalRead && GlobalHalf::Take(global, globalFields) ? Combine(globalFields, rowFields)
+                                                                     : InvalidDateTime();
         return true;
     }
-    if (row.cells.empty() || row.cells.front().IsEmpty() || !globalRead || !TakeTimeOfDay(global, time))
+    if (row.cells.empty() || row.cells.front().IsEmpty() || !globalRead || !GlobalHalf::Take(global, globalFields))
         return false;
     COleDateTime cell;
-    CDateFields date;
-    stamp = VariantToDate(row.cells.front(), cell) && TakeDate(cell, date) ? Combine(date, time) : InvalidDateTime();
+    stamp = VariantToDate(row.cells.front(), cell) && RowHalf::Take(cell, rowFields) ? Combine(globalFields, rowFields)
+                                                                                     : InvalidDateTime();
     return true;
 }
 
@@ -416,11 +418,13 @@ int CExcelFilePreviewParser::ReadRowDateTime(int row, CString& stamp)
         }
         break;
     case 1:
-        if (!GlobalDateWithRowTime({cells, joined, td.m_bUseTFormat == 1}, td, value))
+        if (!GlobalWithRowHalf<DateHalf, TimeHalf>({cells, joined, td.m_bUseTFormat == 1}, td.m_strGlobalDate,
+                                                    td.m_strTimeFormat, value))
             return 0;
         break;
     case 2:
-        if (!RowDateWithGlobalTime({cells, joined, td.m_bUseDFormat == 1}, td, value))
+        if (!GlobalWithRowHalf<TimeHalf, DateHalf>({cells, joined, td.m_bUseDFormat == 1}, td.m_strGlobalTime,
+                                                    td.m_strDateFormat, value))
             return 0;
         break;
     default:

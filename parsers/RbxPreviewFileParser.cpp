@@ -14,6 +14,7 @@
 #include <algorithm>
 #include <charconv>
 #include <exception>
+#include <memory>
 #include <vector>
 
 namespace {
@@ -41,6 +42,17 @@ private:
     rbxFile* m_pFile = nullptr;
     bool m_bOpen = false;
 };
+
+// `path` opened through the library; null when the file is missing or the library refuses it.
+std::unique_ptr<COpenRbxFile> OpenExistingFile(const CString& path)
+{
+    if (!sys::FileExists(path))
+        return nullptr;
+    auto file = std::make_unique<COpenRbxFile>(path);
+    if (!file->IsOpen())
+        return nullptr;
+    return file;
+}
 
 struct AxisValues {
     int type = 0;
@@ -250,11 +262,10 @@ int CRbxPreviewFileParser::Parse(const CString& path)
 int CRbxPreviewFileParser::GetItemNames(CStringList& names)
 {
     names.clear();
-    if (!sys::FileExists(m_strFile))
+    const std::unique_ptr<COpenRbxFile> opened = OpenExistingFile(m_strFile);
+    if (!opened)
         return 0;
-    COpenRbxFile rbxFile(m_strFile);
-    if (!rbxFile.IsOpen())
-        return 0;
+    const COpenRbxFile& rbxFile = *opened;
     try {
         const int fileDataType = rbxGetDataType(rbxFile.Header());
         const int itemCount = rbxGetNoOfItems(rbxFile.Header());
@@ -281,11 +292,10 @@ int CRbxPreviewFileParser::GetItemNames(CStringList& names)
 int CRbxPreviewFileParser::ReadItemTexts(ItemText which, CStringList& texts)
 {
     texts.clear();
-    if (!sys::FileExists(m_strFile))
+    const std::unique_ptr<COpenRbxFile> opened = OpenExistingFile(m_strFile);
+    if (!opened)
         return 0;
-    COpenRbxFile rbxFile(m_strFile);
-    if (!rbxFile.IsOpen())
-        return 0;
+    const COpenRbxFile& rbxFile = *opened;
     try {
         const int itemCount = rbxGetNoOfItems(rbxFile.Header());
         for (int i = 1; i <= itemCount; ++i) {
