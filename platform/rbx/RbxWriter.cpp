@@ -176,6 +176,14 @@ bool CRbxWriter::PackValues(const double* values)
     State& s = *m_state;
     unsigned char* out = s.packed.data();
     for (const ItemInfo& item : s.header.items) {
+        if (item.dataType == kFloat64) {
+            // Doubles are stored as they are: no range to check, only gaps to mark.
+            for (std::uint32_t e = 0; e < item.elementCount; ++e, ++values, out += sizeof(double)) {
+                const double value = std::isnan(*values) ? item.deleteValue : *values;
+                std::memcpy(out, &value, sizeof(double));
+            }
+            continue;
+        }
         const std::size_t width = DataTypeSize(item.dataType);
         for (std::uint32_t e = 0; e < item.elementCount; ++e) {
             const double value = std::isnan(*values) ? item.deleteValue : *values;
