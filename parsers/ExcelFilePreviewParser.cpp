@@ -483,24 +483,13 @@ int CExcelFilePreviewParser::GetItemNames(CStringList& names)
     if (dd.m_nItemTitleOption != 0)
         return 0;
 
-    int columns = 0;
-    CountUsedColumns(columns);
-    int first = 1;
-    if (!GetFirstUsedColumn(first))
-        first = 1;
-    CStringList cells;
-    if (!ReadRowCells(dd.m_nItemDescriptionRow, first, first + columns - 1, cells))
-        return 0;
-    for (size_t i = 0; i < cells.size(); ++i) {
-        if (IsDateTimeCell(static_cast<int>(i), first))
-            continue;
-        names.push_back(cells[i].empty() ? text::Format("Item%d", static_cast<int>(i) + 1) : cells[i]);
-    }
-    return 1;
+    return ReadItemCells(dd.m_nItemDescriptionRow, [&names](size_t index, const CString& cell) {
+        names.push_back(cell.empty() ? text::Format("Item%d", static_cast<int>(index) + 1) : cell);
+        return true;
+    });
 }
 
-int CExcelFilePreviewParser::ReadHeaderRow(int row, CString (*extract)(const CString&), int messageId,
-                                           CStringList& values)
+int CExcelFilePreviewParser::ReadItemCells(int row, const std::function<bool(size_t, const CString&)>& take)
 {
     int columns = 0;
     CountUsedColumns(columns);
@@ -513,14 +502,24 @@ int CExcelFilePreviewParser::ReadHeaderRow(int row, CString (*extract)(const CSt
     for (size_t i = 0; i < cells.size(); ++i) {
         if (IsDateTimeCell(static_cast<int>(i), first))
             continue;
-        CString value = extract(cells[i]);
-        if (value.empty()) {
-            ui::ShowStringMessage(messageId);
+        if (!take(i, cells[i]))
             return 0;
-        }
-        values.push_back(std::move(value));
     }
     return 1;
+}
+
+int CExcelFilePreviewParser::ReadHeaderRow(int row, CString (*extract)(const CString&), int messageId,
+                                           CStringList& values)
+{
+    return ReadItemCells(row, [&](size_t, const CString& cell) {
+        CString value = extract(cell);
+        if (value.empty()) {
+            ui::ShowStringMessage(messageId);
+            return false;
+        }
+        values.push_back(std::move(value));
+        return true;
+    });
 }
 
 int CExcelFilePreviewParser::ReadItemDescriptions(int option, const CString& global, int row,
@@ -576,6 +575,17 @@ int CExcelFilePreviewParser::GetValueTypes(CStringList& valueTypes)
 // ---------------------------------------------------------------------------------------------
 // Parsing
 
+bool CExcelFilePreviewParser::BeginReading(const CString& path)
+{
+    CString message;
+    if (!OpenWorkbook(path.empty() ? m_strFile : path, message))
+        return false;
+    m_vecItemNames.clear();
+    m_vecRows.clear();
+    m_vecRawLines.clear();
+    return true;
+}
+
 int CExcelFilePreviewParser::FailParse()
 {
     CloseWorkbook();
@@ -602,12 +612,8 @@ int CExcelFilePreviewParser::Parse(const CString& path)
 {
     if (!m_pSpecification)
         return 0;
-    CString message;
-    if (!OpenWorkbook(path.empty() ? m_strFile : path, message))
+    if (!BeginReading(path))
         return 0;
-    m_vecItemNames.clear();
-    m_vecRows.clear();
-    m_vecRawLines.clear();
 
     const CDataDescription& dd = m_pSpecification->m_DataDesc;
     if (!m_dispWorksheets || !CheckSheetIndex(dd.m_nExcelSheet))
@@ -670,12 +676,8 @@ int CExcelFilePreviewParser::Parse(const CString& path)
 
 int CExcelFilePreviewParser::ReadRawLines(const CString& path)
 {
-    CString message;
-    if (!OpenWorkbook(path.empty() ? m_strFile : path, message))
+    if (!BeginReading(path))
         return 0;
-    m_vecItemNames.clear();
-    m_vecRows.clear();
-    m_vecRawLines.clear();
     auto sheet = ReachSheet(true);
     if (!sheet)
         return FailParse();

@@ -69,11 +69,16 @@ private:
     bool BoundFileAndTemplate() const;
     // True for the cell positions (counted from the first used column) that hold the date/time.
     bool IsDateTimeCell(int index, int firstUsedColumn) const;
+    // Reads `row` across the used columns and hands every cell that is not a date/time cell, with its
+    // position from the first used column, to `take`; 0 when the row cannot be read or `take` refuses.
+    int ReadItemCells(int row, const std::function<bool(size_t index, const CString& cell)>& take);
     // Reads one header row and cuts a value out of every item cell; 0 (after `messageId`) on an empty one.
     int ReadHeaderRow(int row, CString (*extract)(const CString&), int messageId, CStringList& values);
     // The shared body of GetItemTypes, GetUnits and GetValueTypes.
     int ReadItemDescriptions(int option, const CString& global, int row, CString (*extract)(const CString&),
                              int messageId, CString CItemDefinition::*field, CStringList& values);
+    // Opens the workbook of `path` (else of the bound file) and forgets the last result.
+    bool BeginReading(const CString& path);
     bool ReadDeleteValue(sheet::Worksheet& sheet, CString& deleteValue) const;
     int FailParse();
 };
