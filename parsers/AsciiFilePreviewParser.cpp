@@ -71,6 +71,15 @@ int CAsciiFilePreviewParser::ReadLine(int n, CString& text)
     return 1;
 }
 
+bool CAsciiFilePreviewParser::ReadHeaderLine(int n, int emptyMessageId, CString& line)
+{
+    line = ReadLineOrEmpty(n);
+    if (!line.empty())
+        return true;
+    Show(emptyMessageId);
+    return false;
+}
+
 CString CAsciiFilePreviewParser::ReadLineOrEmpty(int n)
 {
     CString line;
@@ -125,11 +134,9 @@ int CAsciiFilePreviewParser::GetItemCount(int& count)
         return 0;
     }
     if (data.m_nItemTitleOption == 0) {
-        const CString nameLine = ReadLineOrEmpty(data.m_nItemDescriptionRow);
-        if (nameLine.empty()) {
-            Show(res::IDS_ITEM_NAME_LINE_EMPTY);
+        CString nameLine;
+        if (!ReadHeaderLine(data.m_nItemDescriptionRow, res::IDS_ITEM_NAME_LINE_EMPTY, nameLine))
             return 0;
-        }
         int names = 0;
         if (!CountItemFields(nameLine, false, names))
             return 0;
@@ -161,11 +168,9 @@ int CAsciiFilePreviewParser::GetItemNames(CStringList& names)
     }
     if (data.m_nItemTitleOption != 0 || data.m_nItemDescriptionRow < 1)
         return 0;
-    const CString line = ReadLineOrEmpty(data.m_nItemDescriptionRow);
-    if (line.empty()) {
-        Show(res::IDS_ITEM_NAME_LINE_EMPTY);
+    CString line;
+    if (!ReadHeaderLine(data.m_nItemDescriptionRow, res::IDS_ITEM_NAME_LINE_EMPTY, line))
         return 0;
-    }
     const int firstDateTimeField = m_pSpecification->GetDateTimeColumn();
     const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
     CFieldCursor cursor(*m_pSpecification, line);
@@ -215,11 +220,9 @@ int CAsciiFilePreviewParser::GetItemTypes(CStringList& types)
         types.insert(types.end(), static_cast<size_t>(count), data.m_strGlobalUnitType);
         return 1;
     case 1: {
-        const CString line = ReadLineOrEmpty(data.m_nUnitTypeRow);
-        if (line.empty()) {
-            Show(res::IDS_ITEM_TYPE_LINE_EMPTY);
+        CString line;
+        if (!ReadHeaderLine(data.m_nUnitTypeRow, res::IDS_ITEM_TYPE_LINE_EMPTY, line))
             return 0;
-        }
         CStringList fields;
         TakeHeaderFields(line, count, fields);
         for (const CString& field : fields) {
@@ -251,11 +254,9 @@ int CAsciiFilePreviewParser::GetUnits(CStringList& units)
         units.insert(units.end(), static_cast<size_t>(count), data.m_strGlobalUnit);
         return 1;
     case 1: {
-        const CString line = ReadLineOrEmpty(data.m_nUnitRow);
-        if (line.empty()) {
-            Show(res::IDS_UNIT_LINE_EMPTY);
+        CString line;
+        if (!ReadHeaderLine(data.m_nUnitRow, res::IDS_UNIT_LINE_EMPTY, line))
             return 0;
-        }
         CStringList fields;
         TakeHeaderFields(line, count, fields);
         for (const CString& field : fields)
@@ -286,11 +287,9 @@ int CAsciiFilePreviewParser::GetValueTypes(CStringList& valueTypes)
         valueTypes.insert(valueTypes.end(), static_cast<size_t>(count), data.m_strGlobalValueType);
         return 1;
     case 1: {
-        const CString line = ReadLineOrEmpty(data.m_nValueTypeRow);
-        if (line.empty()) {
-            Show(res::IDS_VALUE_TYPE_LINE_EMPTY);
+        CString line;
+        if (!ReadHeaderLine(data.m_nValueTypeRow, res::IDS_VALUE_TYPE_LINE_EMPTY, line))
             return 0;
-        }
         CFieldCursor cursor(*m_pSpecification, line);
         for (int i = 0; i < count; ++i) {
             if (cursor.AtEnd()) {

@@ -33,6 +33,8 @@ private:
 
     bool HasTemplateAndFile() const;
     CString ReadLineOrEmpty(int n);
+    // Line `n` into `line`; false after message `emptyMessageId` when it is missing or empty.
+    bool ReadHeaderLine(int n, int emptyMessageId, CString& line);
     DeleteValue DetermineDeleteValue();
     // The item fields of the data start line or the item name line (its fields minus the date/time
     // fields); false with a message when the line has no delimiter.
