@@ -3,6 +3,7 @@
 #include <charconv>
 #include <cmath>
 #include <cstdint>
+#include <cstring>
 
 namespace converter {
 
@@ -108,23 +109,52 @@ ValueText NumberReader::Read(std::string_view field, double& value) const
 
 namespace {
 
+constexpr char kDigitPairs[] = "00010203040506070809101112131415161718192021222324252627282930313233343536373839"
+                               "40414243444546474849505152535455565758596061626364656667686970717273747576777879"
+                               "8081828384858687888990919293949596979899";
+
 // Writes the integer `digits` with a point before its last `decimals` digits.
 char* WriteScaled(std::uint64_t digits, int decimals, bool negative, char* out)
 {
     char buffer[24];
-    int n = 0;
-    do {
-        buffer[n++] = static_cast<char>('0' + digits % 10);
-        digits /= 10;
-    } while (digits > 0 || n <= decimals);
+    char* p = buffer + sizeof buffer;
+    while (digits >= 100) {
+        p -= 2;
+        std::memcpy(p, kDigitPairs + 2 * (digits % 100), 2);
+        digits /= 100;
+    }
+    if (digits >= 10) {
+        p -= 2;
+        std::memcpy(p, kDigitPairs + 2 * digits, 2);
+    } else {
+        *--p = static_cast<char>('0' + digits);
+    }
+    int length = static_cast<int>(buffer + sizeof buffer - p);
+    while (length <= decimals) {
+        *--p = '0';
+        ++length;
+    }
     if (negative)
         *out++ = '-';
-    while (n > 0) {
-        if (n == decimals)
-            *out++ = '.';
-        *out++ = buffer[--n];
+    const int integers = length - decimals;
+    std::memcpy(out, p, static_cast<size_t>(integers));
+    out += integers;
+    if (decimals > 0) {
+        *out++ = '.';
+        std::memcpy(out, p + integers, static_cast<size_t>(decimals));
+        out += decimals;
     }
     return out;
+}
+
+// The digits of `magnitude` at `decimals` decimals when they divide back to it exactly.
+bool ExactAt(double magnitude, int decimals, std::uint64_t& digits)
+{
+    const double scaled = magnitude * kPowersOfTen[decimals];
+    if (scaled >= static_cast<double>(kExactMantissa))
+        return false;
+    digits = static_cast<std::uint64_t>(scaled + 0.5);
+    return static_cast<double>(digits) / kPowersOfTen[decimals] == magnitude;
 }
 
 } // namespace
@@ -133,20 +163,28 @@ char* FormatValue(double value, char* out)
 {
     if (std::isnan(value))
         return out;
-    // Most measured values have a few decimals: find the fewest that give the value back exactly
-    // (an exact integer over an exact power of ten divides back to it), else the general form.
+    // Most measured values have a few decimals. Scaled to below 10^15 the product is within a
+    // quarter of the integer a short decimal gives, so one rounding finds it (an exact integer
+    // over an exact power of ten divides back to the value), and its trailing zeros give the
+    // fewest decimals. One place further can still hold an exact integer below 2^53.
     const double magnitude = std::fabs(value);
     if (magnitude < 1e15 && magnitude >= 1e-6) {
-        for (int decimals = 0; decimals <= 15; ++decimals) {
-            const double scaled = magnitude * kPowersOfTen[decimals];
-            if (scaled >= static_cast<double>(kExactMantissa))
-                break;
-            const auto digits = static_cast<std::uint64_t>(scaled + 0.5);
-            // Only a near-integer can be the one; the division then decides exactly.
-            if (std::fabs(scaled - static_cast<double>(digits)) <= scaled * 1e-12 &&
-                static_cast<double>(digits) / kPowersOfTen[decimals] == magnitude)
-                return WriteScaled(digits, decimals, std::signbit(value), out);
+        int integerDigits = 0;
+        while (integerDigits < 15 && magnitude >= kPowersOfTen[integerDigits])
+            ++integerDigits;
+        int decimals = 15 - integerDigits;
+        std::uint64_t digits = 0;
+        bool exact = ExactAt(magnitude, decimals, digits);
+        if (exact) {
+            while (decimals > 0 && digits % 10 == 0) {
+                digits /= 10;
+                --decimals;
+            }
+        } else if (decimals < 15) {
+            exact = ExactAt(magnitude, ++decimals, digits);
         }
+        if (exact)
+            return WriteScaled(digits, decimals, std::signbit(value), out);
     }
     return std::to_chars(out, out + 32, value).ptr;
 }

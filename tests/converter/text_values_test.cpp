@@ -209,3 +209,42 @@ TEST(FormatValue, RandomValuesReadBackExactly)
 }
 
 } // namespace
+
+namespace {
+
+// Decimals of up to 15 significant digits come back as their own text: fewest decimals, no
+// trailing zeros, no exponent.
+TEST(FormatValue, ShortDecimalsComeBackAsTheirOwnText)
+{
+    std::mt19937_64 random(17);
+    for (int n = 0; n < 200000; ++n) {
+        const int significant = 1 + static_cast<int>(random() % 15);
+        std::string digits;
+        for (int i = 0; i < significant; ++i)
+            digits += static_cast<char>('0' + random() % 10);
+        const int decimals = static_cast<int>(random() % 16);
+        // The canonical text: integer part without leading zeros, fraction without trailing ones.
+        std::string integer = decimals >= significant ? "" : digits.substr(0, significant - decimals);
+        std::string fraction = decimals >= significant ? std::string(decimals - significant, '0') + digits
+                                                       : digits.substr(significant - decimals);
+        integer.erase(0, integer.find_first_not_of('0'));
+        if (integer.empty())
+            integer = "0";
+        fraction.erase(fraction.find_last_not_of('0') + 1);
+        const std::string text = (n % 2 ? "-" : "") + integer + (fraction.empty() ? "" : "." + fraction);
+        double value = 0;
+        std::from_chars(text.data(), text.data() + text.size(), value);
+        if (value == 0 || std::fabs(value) < 1e-6)
+            continue; // written in the general form
+        char buffer[40];
+        ASSERT_EQ(std::string(buffer, FormatValue(value, buffer)), text);
+    }
+    char buffer[40];
+    EXPECT_EQ(std::string(buffer, FormatValue(999999999999999.0, buffer)), "999999999999999");
+    EXPECT_EQ(std::string(buffer, FormatValue(100000000000000.0, buffer)), "100000000000000");
+    EXPECT_EQ(std::string(buffer, FormatValue(0.000001, buffer)), "0.000001");
+    EXPECT_EQ(std::string(buffer, FormatValue(0.1 + 0.2, buffer)), "0.30000000000000004");
+    EXPECT_EQ(std::string(buffer, FormatValue(1234.5678901234567, buffer)), "1234.5678901234567");
+}
+
+} // namespace
