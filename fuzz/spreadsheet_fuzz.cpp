@@ -41,6 +41,8 @@ void WalkWorkbook(const std::string& path)
     sheet::ApplicationSettings settings;
     settings.maxArrayCells = 100000;
     settings.load.retainedRows = 20;
+    // FreeXL fills a sheet's whole declared grid; keep the grids small so runs stay fast.
+    settings.load.limits.maxXlsSheetCells = 1 << 16;
     auto app = sheet::StartApplication(settings);
     try {
         auto sheets = app->Workbooks()->Open(path)->Worksheets();

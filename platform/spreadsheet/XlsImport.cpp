@@ -14,6 +14,7 @@
 #include <cstring>
 #include <fstream>
 #include <optional>
+#include <utility>
 #include <vector>
 
 namespace sheet {
@@ -66,6 +67,11 @@ void CheckOpened(int code, const Handle& handle, const std::string& path)
 
 unsigned Le16(const unsigned char* p) { return p[0] | p[1] << 8; }
 
+std::uint32_t Le32(const unsigned char* p)
+{
+    return static_cast<std::uint32_t>(Le16(p)) | static_cast<std::uint32_t>(Le16(p + 2)) << 16;
+}
+
 // Whether a string of `count` characters starting at `at` (after its option byte, whose bit 0
 // means two bytes per character) fits a record of `length` bytes.
 bool StringFits(const std::vector<unsigned char>& stream, size_t body, unsigned length, unsigned at, unsigned count)
@@ -76,11 +82,30 @@ bool StringFits(const std::vector<unsigned char>& stream, size_t body, unsigned 
     return at + 1 + static_cast<std::uint64_t>(count) * width <= length;
 }
 
+// A sheet's DIMENSION record: first row, row past the last, first column, column past the last
+// (rows in 32 bits in BIFF8, 16 bits in older streams). FreeXL works through the whole declared
+// grid, so a grid larger than the format allows costs seconds on a tiny file.
+bool DimensionFits(const std::vector<unsigned char>& stream, size_t body, unsigned length)
+{
+    std::uint64_t firstRow = 0, endRow = 0;
+    unsigned firstColumn = 0, endColumn = 0;
+    const unsigned char* p = &stream[body];
+    if (length >= 14) {
+        firstRow = Le32(p), endRow = Le32(p + 4), firstColumn = Le16(p + 8), endColumn = Le16(p + 10);
+    } else if (length >= 8) {
+        firstRow = Le16(p), endRow = Le16(p + 2), firstColumn = Le16(p + 4), endColumn = Le16(p + 6);
+    } else {
+        return false;
+    }
+    return firstRow <= endRow && endRow <= 65536 && firstColumn <= endColumn && endColumn <= 256;
+}
+
 // FreeXL copies records into a buffer of the largest BIFF8 record (8224 bytes) and trusts the
 // string lengths of FORMAT, BOUNDSHEET and LABEL records: check both before it reads.
 void CheckRecords(const std::string& path, const std::vector<unsigned char>& stream)
 {
     size_t at = 0;
+    bool dimensionSeen = false;
     for (unsigned n = 1; at + 4 <= stream.size(); ++n) {
         const unsigned id = Le16(&stream[at]);
         const unsigned length = Le16(&stream[at + 2]);
@@ -99,6 +124,13 @@ void CheckRecords(const std::string& path, const std::vector<unsigned char>& str
             fits = StringFits(stream, body, length, 8, Le16(&stream[body + 6]));
         if (!fits)
             throw OpenError(path, "the workbook stream is damaged (" + where + " holds a text longer than itself).");
+        if (id == 0x0200 && !DimensionFits(stream, body, length))
+            throw OpenError(path, "the workbook stream is damaged (" + where + " sizes its sheet beyond 65536 rows by 256 columns).");
+        // FreeXL allocates a sheet's cells at its DIMENSION record; a second one corrupts its heap.
+        if (id == 0x0809)
+            dimensionSeen = false;
+        else if (id == 0x0200 && std::exchange(dimensionSeen, true))
+            throw OpenError(path, "the workbook stream is damaged (" + where + " sizes its sheet a second time).");
         at = body + length;
     }
 }

@@ -127,6 +127,8 @@ TEST(BadWorkbooks, EachFailsToOpenWithItsReason)
         {"lost-directory.xls", "directory lies outside the file"},
         {"long-record.xls", "longer than a record may be"},
         {"long-text.xls", "holds a text longer than itself"},
+        {"two-dimensions.xls", "sizes its sheet a second time"},
+        {"huge-dimension.xls", "beyond 65536 rows by 256 columns"},
         {"truncated.xlsx", "damaged (no central directory)"},
         {"not-a-workbook.xlsx", "xl/workbook.xml is missing"},
         {"broken-xml.xlsx", "damaged"},

@@ -226,6 +226,14 @@ def make_xls_files():
     write("long-record.xls", compound_file([("Workbook", long_record.ljust(MINI_CUTOFF, b"\0"))]))
     long_text = bof(0x0005) + record(0x041E, struct.pack("<HHB", 164, 0xFFFF, 0) + b"0.00") + record(0x000A)
     write("long-text.xls", compound_file([("Workbook", long_text.ljust(MINI_CUTOFF, b"\0"))]))
+    # A sheet sized twice, and a sheet sized beyond the format's grid.
+    def one_sheet(dimensions):
+        body = bof(0x0010) + b"".join(record(0x0200, d) for d in dimensions) + record(0x000A)
+        head = globals_records(["Data"], [], [0])
+        head = globals_records(["Data"], [], [len(head)])
+        return compound_file([("Workbook", (head + body).ljust(MINI_CUTOFF, b"\0"))])
+    write("two-dimensions.xls", one_sheet([struct.pack("<IIHHH", 0, 1, 0, 1, 0)] * 2))
+    write("huge-dimension.xls", one_sheet([struct.pack("<IIHHH", 0, 0, 0xFFFF, 0xFFFF, 0)]))
     # The compound file is sound but holds no workbook stream.
     write("no-workbook.xls", compound_file([("Something", b"\0" * 4096)]))
 
