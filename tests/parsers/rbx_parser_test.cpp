@@ -1,6 +1,7 @@
 #include "ParserTestSupport.h"
 #include "parsers/RbxPreviewFileParser.h"
 #include "platform/rbx/RbxWriter.h"
+#include "platform/system/Text.h"
 #include "platform/units/Units.h"
 
 #include <gtest/gtest.h>
@@ -122,6 +123,30 @@ TEST_F(RbxParserTest, EveryDataTypeAsText)
     ASSERT_EQ(parser.m_vecRows.size(), 1u);
     EXPECT_EQ(parser.m_vecRows[0], (ui::Row{"2020-01-01 00:00:00", "2.500000", "-0.125000", "A", "7", "3000000000",
                                             "-3", "1099511627776"}));
+}
+
+// The values are formatted without printf for speed; the texts must stay printf's "%f" to the letter,
+// rounding ties, tiny and huge magnitudes, negative zero and infinities included (a NaN is stored
+// as the delete value, so it never reaches the text).
+TEST_F(RbxParserTest, FloatTextsAreExactlyPrintfs)
+{
+    const std::vector<double> values = {
+        0.0, -0.0, 0.5e-6, 1.5e-6, 2.5e-6, 0.1234565, 1e-300, -1e-7, 123456.7890125, 1e15 + 0.3, 1e300,
+        -1.7976931348623157e308, 1.0 / 0.0, -1.0 / 0.0};
+    std::vector<rbx::ItemInfo> items;
+    for (size_t i = 0; i < values.size(); ++i)
+        items.push_back(Item("v", rbx::kFloat64));
+    items.push_back(Item("f", rbx::kFloat32));
+    std::vector<double> step = values;
+    step.push_back(0.1); // read back as the float nearest 0.1, printed through double
+    const std::string path = Write(Calendar(units::kUnitSecond, items), {{0, step}});
+    ASSERT_EQ(parser.Parse(path), 1);
+    ASSERT_EQ(parser.m_vecRows.size(), 1u);
+    const ui::Row& row = parser.m_vecRows[0];
+    ASSERT_EQ(row.size(), values.size() + 2);
+    for (size_t i = 0; i < values.size(); ++i)
+        EXPECT_EQ(row[i + 1], text::Format("%f", values[i])) << i;
+    EXPECT_EQ(row.back(), text::Format("%f", static_cast<double>(0.1f)));
 }
 
 TEST_F(RbxParserTest, ProfileItemFailsAllButTheNames)
