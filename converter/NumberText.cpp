@@ -176,9 +176,12 @@ char* FormatValue(double value, char* out)
         std::uint64_t digits = 0;
         bool exact = ExactAt(magnitude, decimals, digits);
         if (exact) {
-            while (decimals > 0 && digits % 10 == 0) {
-                digits /= 10;
-                --decimals;
+            for (int zeros : {8, 4, 2, 1}) {
+                const auto power = static_cast<std::uint64_t>(kPowersOfTen[zeros]);
+                if (decimals >= zeros && digits % power == 0) {
+                    digits /= power;
+                    decimals -= zeros;
+                }
             }
         } else if (decimals < 15) {
             exact = ExactAt(magnitude, ++decimals, digits);
