@@ -87,7 +87,7 @@ Status AsciiSeriesWriter::Write(const Row& row)
     }
     char* out = m_buffer.data() + m_used;
     char* const begin = out;
-    out = FormatStamp(row.stamp, out);
+    out = m_stamps.Write(row.stamp, out);
     for (double value : row.values) {
         *out++ = '\t';
         out = FormatValue(value, out);

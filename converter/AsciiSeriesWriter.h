@@ -5,6 +5,7 @@
 //   row 2  the date/time title, then the item names
 //   row 3+ "YYYY/MM/DD HH:mm:ss", then one value per item; a missing value is an empty field.
 #include "converter/SeriesWriter.h"
+#include "converter/StampText.h"
 
 #include <cstdio>
 #include <vector>
@@ -28,6 +29,7 @@ private:
     std::string m_path;
     std::vector<char> m_buffer;
     size_t m_used = 0;
+    StampPrinter m_stamps;
 };
 
 } // namespace converter

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <climits>
+#include <cstring>
 #include <iterator>
 #include <cmath>
 
@@ -209,6 +210,31 @@ char* FormatStamp(Stamp stamp, char* out)
     out = TwoDigits(f.minute, out);
     *out++ = ':';
     return TwoDigits(f.second, out);
+}
+
+char* StampPrinter::Write(Stamp stamp, char* out)
+{
+    long long day = stamp / kSecondsPerDay;
+    long long rest = stamp % kSecondsPerDay;
+    if (rest < 0) {
+        rest += kSecondsPerDay;
+        --day;
+    }
+    if (!m_known || day != m_day) {
+        char full[20];
+        FormatStamp(stamp, full);
+        std::memcpy(m_date.data(), full, m_date.size());
+        m_day = day;
+        m_known = true;
+    }
+    std::memcpy(out, m_date.data(), m_date.size());
+    out += m_date.size();
+    const int seconds = static_cast<int>(rest);
+    out = TwoDigits(seconds / 3600, out);
+    *out++ = ':';
+    out = TwoDigits(seconds / 60 % 60, out);
+    *out++ = ':';
+    return TwoDigits(seconds % 60, out);
 }
 
 std::string FormatStamp(Stamp stamp)

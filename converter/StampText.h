@@ -57,4 +57,16 @@ std::optional<Stamp> StampFromSerialDays(double days);
 char* FormatStamp(Stamp stamp, char* out);
 std::string FormatStamp(Stamp stamp);
 
+// FormatStamp for a run of stamps of which most share the day of the one before: the date text
+// is kept from row to row and only the clock is written anew.
+class StampPrinter {
+public:
+    char* Write(Stamp stamp, char* out);
+
+private:
+    long long m_day = 0;
+    bool m_known = false;
+    std::array<char, 11> m_date{}; // "YYYY/MM/DD "
+};
+
 } // namespace converter

@@ -248,3 +248,26 @@ TEST(FormatValue, ShortDecimalsComeBackAsTheirOwnText)
 }
 
 } // namespace
+
+namespace {
+
+// The printer keeps the date between rows: it must still agree with FormatStamp when the day
+// changes forwards, backwards, before 1970 and at the clamped ends of the calendar.
+TEST(StampPrinter, WritesWhatFormatStampWrites)
+{
+    const Stamp start = *StampFromFields({1969, 12, 31, 23, 0, 0});
+    std::vector<Stamp> stamps;
+    for (Stamp s = start; s < start + 3 * 86400; s += 599)
+        stamps.push_back(s);
+    for (Stamp s : {Stamp{0}, Stamp{-1}, Stamp{86399}, Stamp{86400}, Stamp{-86400}, Stamp{-86401}, start, Stamp{0},
+                    *StampFromFields({9999, 12, 31, 23, 59, 59}), *StampFromFields({9999, 12, 31, 23, 59, 59}) + 86400,
+                    *StampFromFields({1, 1, 1, 0, 0, 0}) - 86400, *StampFromFields({2000, 2, 29, 12, 0, 0})})
+        stamps.push_back(s);
+    StampPrinter printer;
+    for (Stamp s : stamps) {
+        char buffer[32];
+        ASSERT_EQ(std::string(buffer, printer.Write(s, buffer)), FormatStamp(s)) << s;
+    }
+}
+
+} // namespace
