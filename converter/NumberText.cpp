@@ -113,38 +113,39 @@ constexpr char kDigitPairs[] = "000102030405060708091011121314151617181920212223
                                "40414243444546474849505152535455565758596061626364656667686970717273747576777879"
                                "8081828384858687888990919293949596979899";
 
-// Writes the integer `digits` with a point before its last `decimals` digits.
+// Writes `value` (below 10^8) as eight digits; the four pairs do not wait on each other.
+void WriteEightDigits(std::uint32_t value, char* out)
+{
+    const std::uint32_t high = value / 10000, low = value % 10000;
+    std::memcpy(out, kDigitPairs + 2 * (high / 100), 2);
+    std::memcpy(out + 2, kDigitPairs + 2 * (high % 100), 2);
+    std::memcpy(out + 4, kDigitPairs + 2 * (low / 100), 2);
+    std::memcpy(out + 6, kDigitPairs + 2 * (low % 100), 2);
+}
+
+// Writes the integer `digits` (below 10^16) with a point before its last `decimals` digits. All
+// copies have a fixed length, so none becomes a library call; `out` has room for 32 characters.
 char* WriteScaled(std::uint64_t digits, int decimals, bool negative, char* out)
 {
-    char buffer[24];
-    char* p = buffer + sizeof buffer;
-    while (digits >= 100) {
-        p -= 2;
-        std::memcpy(p, kDigitPairs + 2 * (digits % 100), 2);
-        digits /= 100;
-    }
-    if (digits >= 10) {
-        p -= 2;
-        std::memcpy(p, kDigitPairs + 2 * digits, 2);
-    } else {
-        *--p = static_cast<char>('0' + digits);
-    }
-    int length = static_cast<int>(buffer + sizeof buffer - p);
-    while (length <= decimals) {
-        *--p = '0';
-        ++length;
-    }
-    if (negative)
-        *out++ = '-';
-    const int integers = length - decimals;
-    std::memcpy(out, p, static_cast<size_t>(integers));
-    out += integers;
+    char buffer[32] = {};
+    WriteEightDigits(static_cast<std::uint32_t>(digits / 100000000), buffer);
+    WriteEightDigits(static_cast<std::uint32_t>(digits % 100000000), buffer + 8);
+    int first = 0;
+    while (first < 15 - decimals && buffer[first] == '0')
+        ++first;
+    char text[48];
+    char* p = text;
+    *p = '-';
+    p += negative;
+    std::memcpy(p, buffer + first, 16);
+    p += 16 - decimals - first;
     if (decimals > 0) {
-        *out++ = '.';
-        std::memcpy(out, p + integers, static_cast<size_t>(decimals));
-        out += decimals;
+        *p++ = '.';
+        std::memcpy(p, buffer + 16 - decimals, 16);
+        p += decimals;
     }
-    return out;
+    std::memcpy(out, text, 32);
+    return out + (p - text);
 }
 
 // The digits of `magnitude` at `decimals` decimals when they divide back to it exactly.

@@ -25,7 +25,8 @@ private:
     char m_other = 0; // the separator that must not appear when "." or "," is in force; 0 for none
 };
 
-// Writes the shortest round-trip text of `value` at `out` (at most 32 characters); returns the end.
+// Writes the shortest round-trip text of `value` at `out` (at most 32 characters; `out` must have
+// room for all 32, which may be overwritten); returns the end.
 char* FormatValue(double value, char* out);
 
 } // namespace converter
