@@ -402,7 +402,9 @@ bool AsciiSeriesReader::ReadStamp(size_t firstCall, Stamp& stamp)
 bool AsciiSeriesReader::ReadDataLine(std::string_view line, Row& row)
 {
     const long lineNumber = m_lines.LineNumber();
-    if (line.find(m_delimiter) == std::string_view::npos)
+    const bool hasDelimiter = m_delimiter.size() == 1 ? line.find(m_delimiter[0]) != std::string_view::npos
+                                                       : line.find(m_delimiter) != std::string_view::npos;
+    if (!hasDelimiter)
         return Fail(m_path, lineNumber, res::LoadString(res::IDS_NO_DELIMITERS));
     m_splitter.Split(line);
     if (m_splitter.QuoteError())

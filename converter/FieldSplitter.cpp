@@ -53,9 +53,11 @@ void FieldSplitter::SplitFast(std::string_view line)
             }
             if (line[at] == '"')
                 break;
-            const void* found = std::memchr(line.data() + at, m_delimiterChar, length - at);
-            const size_t end = found ? static_cast<size_t>(static_cast<const char*>(found) - line.data()) : length;
-            const size_t next = found ? end + 1 : length;
+            // Fields are short: a plain loop beats a library search call per field.
+            size_t end = at;
+            while (end < length && line[end] != m_delimiterChar)
+                ++end;
+            const size_t next = end < length ? end + 1 : length;
             Add(line.substr(at, end - at), static_cast<int>(at), static_cast<int>(next));
             at = next;
         }
