@@ -94,6 +94,24 @@ TEST(FieldSplitter, AgreesWithNextFieldOnRandomLines)
         }
 }
 
+// Long fields and lines, so that delimiters fall on every position of a sixteen-byte block.
+TEST(FieldSplitter, AgreesWithNextFieldOnLongLines)
+{
+    std::mt19937 random(7);
+    const std::string alphabet = "abcdefgh. -0123456789";
+    CAsciiSpecification spec = Spec("Tab", 0, 0);
+    for (int n = 0; n < 3000; ++n) {
+        std::string line;
+        const size_t length = random() % 80;
+        const unsigned spread = 1 + random() % 40; // one delimiter in `spread` characters
+        for (size_t i = 0; i < length; ++i)
+            line += random() % spread == 0 ? '\t' : alphabet[random() % alphabet.size()];
+        if (random() % 8 == 0)
+            line += '"';
+        ExpectSameSplit(spec, line);
+    }
+}
+
 TEST(FieldSplitter, LeadingDelimitersCutShiftTheLine)
 {
     CAsciiSpecification spec = Spec("Comma", 0, 1);
