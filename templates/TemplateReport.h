@@ -14,7 +14,7 @@ struct OpenedTemplate {
     const FileLayout* layout = nullptr; // the kind's file layout; its `kind` is "ascii" or "excel"
 };
 
-// Loads `path` into a template of the kind its root element names. On failure `spec` is null and
+// Loads `path` into a template of the kind its root element names. On failure the template is null and
 // `error` says why.
 OpenedTemplate OpenTemplateFile(const CString& path, CString& error);
 

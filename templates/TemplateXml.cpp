@@ -145,7 +145,7 @@ bool IsTrue(std::string_view value, bool ignoreCase)
 }
 
 bool ReadAttribute(const pugi::xml_attribute& attribute, const AttributeRule& rule, bool flagIgnoresCase,
-                   const CString& name, CSpecification& spec, CString& error)
+                   const CString& name, CSpecification& model, CString& error)
 {
     std::string_view value = attribute.value();
     if (value.size() > kMaxValueBytes) {
@@ -155,7 +155,7 @@ bool ReadAttribute(const pugi::xml_attribute& attribute, const AttributeRule& ru
     switch (rule.form) {
     case ValueForm::Number:
     case ValueForm::NumberLine:
-        if (!ParseWholeNumber(value, *rule.number(spec))) {
+        if (!ParseWholeNumber(value, *rule.number(model))) {
             error = text::Format("%s: the attribute %s must be a whole number from %d to %d, not \"%.40s\"",
                                  name.c_str(), rule.name, INT_MIN, INT_MAX, attribute.value());
             return false;
@@ -163,13 +163,13 @@ bool ReadAttribute(const pugi::xml_attribute& attribute, const AttributeRule& ru
         return true;
     case ValueForm::Flag:
     case ValueForm::FlagWhenOne:
-        *rule.number(spec) = IsTrue(value, flagIgnoresCase) ? 1 : 0;
+        *rule.number(model) = IsTrue(value, flagIgnoresCase) ? 1 : 0;
         return true;
     case ValueForm::Text:
-        rule.text(spec)->assign(value);
+        rule.text(model)->assign(value);
         return true;
     case ValueForm::SelItems:
-        CSpecification::ParseSelItems(CString(value), spec.m_arrSelItems);
+        CSpecification::ParseSelItems(CString(value), model.m_arrSelItems);
         return true;
     }
     return true;
