@@ -42,7 +42,9 @@ struct AsciiSeriesReader::HeaderLines {
 };
 
 AsciiSeriesReader::AsciiSeriesReader(const CSpecification& spec)
-    : m_spec(spec), m_splitter(spec), m_numbers(spec.GetDecimalSeparatorString()), m_delimiter(spec.GetDelimiterString())
+    : m_spec(spec), m_splitter(spec), m_numbers(spec.GetDecimalSeparatorString()), m_delimiter(spec.GetDelimiterString()),
+      m_fusable(m_delimiter.size() == 1 && spec.m_bIgnoreConsecutiveDelimiters == 0 &&
+                spec.m_bIgnoreBegginingOfLineDelimiters == 0)
 {
 }
 
@@ -368,6 +370,8 @@ bool AsciiSeriesReader::Next(Row& row)
     while (m_lines.Next(line)) {
         if (line.empty())
             continue;
+        if (m_fusable && m_fusedOn && ReadDataLineFused(line, row))
+            return true;
         return ReadDataLine(line, row);
     }
     m_status = m_lines.status();
@@ -395,6 +399,113 @@ bool AsciiSeriesReader::ReadStamp(size_t firstCall, Stamp& stamp)
         return Fail(m_path, line, "the date/time " + Quote(text) + " does not exist in the calendar");
     stamp = *value;
     return true;
+}
+
+namespace {
+
+// The fields of a line the splitter would give with a one-character delimiter and both delimiter
+// flags off, one at a time: the text up to the next delimiter and the position after it; a
+// delimiter at the line's end adds an empty field, and the last field ends at -1.
+class FieldCursor {
+public:
+    FieldCursor(std::string_view line, char delimiter) : m_line(line), m_delimiter(delimiter) {}
+
+    // False when the field starts with a quote or the line holds no delimiter: the splitter's case.
+    bool Next(std::string_view& text, int& end)
+    {
+        const size_t length = m_line.size();
+        if (m_trailing) {
+            m_trailing = false;
+            text = {};
+            end = -1;
+            return true;
+        }
+        if (m_at == length) {
+            text = {};
+            m_trailing = length > 0 && m_line[length - 1] == m_delimiter;
+            end = m_trailing ? static_cast<int>(length) + 1 : -1;
+            return true;
+        }
+        if (m_line[m_at] == '"')
+            return false;
+        const size_t found = FindDelimiter(m_line, m_at, m_delimiter);
+        if (m_at == 0 && found == length)
+            return false;
+        text = m_line.substr(m_at, found - m_at);
+        m_at = found < length ? found + 1 : length;
+        end = static_cast<int>(m_at);
+        return true;
+    }
+
+private:
+    std::string_view m_line;
+    char m_delimiter;
+    size_t m_at = 0;
+    bool m_trailing = false;
+};
+
+} // namespace
+
+// The same walk as ReadDataLine, with the fields taken as it goes instead of from a split line.
+bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
+{
+    FieldCursor fields(line, m_delimiter[0]);
+    const int length = static_cast<int>(line.size());
+    row.values.assign(m_selection.size(), kMissing);
+    bool hadStamp = false;
+    int pos = 0;
+    int j = 0;
+    size_t item = 0;
+    std::string_view text;
+    while (pos != -1) {
+        if (j + 1 == m_stampColumn) {
+            std::string_view stampText;
+            for (int w = 0; w < m_formatColumns; ++w) {
+                if (pos == -1 || !fields.Next(text, pos))
+                    return false;
+                if (w == 0) {
+                    stampText = text;
+                } else {
+                    if (w == 1)
+                        m_stampBuffer.assign(stampText);
+                    m_stampBuffer.push_back(' ');
+                    m_stampBuffer.append(text);
+                }
+            }
+            if (m_formatColumns > 1)
+                stampText = m_stampBuffer;
+            StampFields stampFields = m_start;
+            if (!m_format->Read(stampText, stampFields))
+                return false;
+            std::optional<Stamp> stamp = StampFromFields(stampFields);
+            if (!stamp)
+                return false;
+            row.stamp = *stamp;
+            hadStamp = true;
+            j += m_formatColumns - 1;
+            if (pos == length) {
+                pos = -1;
+                ++j;
+            }
+        } else {
+            if (!fields.Next(text, pos))
+                return false;
+            if (pos != -1) {
+                const int slot = item < m_slotOfItem.size() ? m_slotOfItem[item] : -1;
+                ++item;
+                if (slot >= 0 && !IsDeleted(text)) {
+                    double value = kMissing;
+                    const ValueText read = m_numbers.Read(text, value);
+                    if (read == ValueText::Number)
+                        row.values[static_cast<size_t>(slot)] = value;
+                    else if (read != ValueText::Empty)
+                        return false;
+                }
+            }
+        }
+        ++j;
+    }
+    return m_columns == j - m_formatColumns && hadStamp;
 }
 
 // The data line as the preview parser walks it: column j runs over the logical columns, the

@@ -5,10 +5,6 @@
 
 #include <cstring>
 
-#if defined(__SSE2__)
-#include <emmintrin.h>
-#endif
-
 namespace converter {
 
 FieldSplitter::FieldSplitter(const CSpecification& spec)
@@ -36,27 +32,6 @@ bool FieldSplitter::DelimiterAt(int pos) const
     return pos >= 0 && pos < static_cast<int>(m_line.size()) && m_line[static_cast<size_t>(pos)] == m_delimiterChar;
 }
 
-// The first delimiter at or after `at`, or the line's length. Fields are short, so a library
-// search call per field costs more than the search: sixteen bytes are compared at once while
-// they lie inside the line, the rest one by one.
-namespace {
-inline size_t FindDelimiter(std::string_view line, size_t at, char delimiterChar)
-{
-    const size_t length = line.size();
-#if defined(__SSE2__)
-    const __m128i delimiter = _mm_set1_epi8(delimiterChar);
-    for (; at + 16 <= length; at += 16) {
-        const __m128i bytes = _mm_loadu_si128(reinterpret_cast<const __m128i*>(line.data() + at));
-        const int found = _mm_movemask_epi8(_mm_cmpeq_epi8(bytes, delimiter));
-        if (found != 0)
-            return at + static_cast<size_t>(__builtin_ctz(static_cast<unsigned>(found)));
-    }
-#endif
-    while (at < length && line[at] != delimiterChar)
-        ++at;
-    return at;
-}
-} // namespace
 
 void FieldSplitter::SplitFast(std::string_view line)
 {
