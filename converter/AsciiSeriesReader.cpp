@@ -437,6 +437,27 @@ public:
         return true;
     }
 
+    // Next, with a field that is a plain decimal read on the way (`read` then true and `value` set).
+    bool NextReading(std::string_view& text, int& end, double& value, bool& read)
+    {
+        read = false;
+        const size_t length = m_line.size();
+        if (!m_trailing && m_at < length) {
+            const char* const start = m_line.data() + m_at;
+            const char* const lineEnd = m_line.data() + length;
+            const char* const stop = ScanPlainDecimal(start, lineEnd, value);
+            if (stop != nullptr && (stop == lineEnd ? m_at != 0 : *stop == m_delimiter)) {
+                const size_t found = static_cast<size_t>(stop - m_line.data());
+                text = m_line.substr(m_at, found - m_at);
+                m_at = found < length ? found + 1 : length;
+                end = static_cast<int>(m_at);
+                read = true;
+                return true;
+            }
+        }
+        return Next(text, end);
+    }
+
 private:
     std::string_view m_line;
     char m_delimiter;
@@ -450,6 +471,7 @@ private:
 bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
 {
     FieldCursor fields(line, m_delimiter[0]);
+    const bool readsPlain = m_numbers.ReadsPlainDecimals();
     const int length = static_cast<int>(line.size());
     row.values.assign(m_selection.size(), kMissing);
     bool hadStamp = false;
@@ -488,14 +510,17 @@ bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
                 ++j;
             }
         } else {
-            if (!fields.Next(text, pos))
+            const int slot = item < m_slotOfItem.size() ? m_slotOfItem[item] : -1;
+            double value = kMissing;
+            bool scanned = false;
+            const bool taken =
+                slot >= 0 && readsPlain ? fields.NextReading(text, pos, value, scanned) : fields.Next(text, pos);
+            if (!taken)
                 return false;
             if (pos != -1) {
-                const int slot = item < m_slotOfItem.size() ? m_slotOfItem[item] : -1;
                 ++item;
                 if (slot >= 0 && !IsDeleted(text)) {
-                    double value = kMissing;
-                    const ValueText read = m_numbers.Read(text, value);
+                    const ValueText read = scanned ? ValueText::Number : m_numbers.Read(text, value);
                     if (read == ValueText::Number)
                         row.values[static_cast<size_t>(slot)] = value;
                     else if (read != ValueText::Empty)

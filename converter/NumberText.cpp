@@ -8,20 +8,15 @@
 namespace converter {
 
 namespace {
-bool IsBlank(char c) { return c == ' ' || c == '\t' || c == '\r' || c == '\n'; }
-constexpr size_t kLongestNumber = 128;
-
 // Powers of ten a double holds exactly.
 constexpr double kPowersOfTen[] = {1e0,  1e1,  1e2,  1e3,  1e4,  1e5,  1e6,  1e7,  1e8,  1e9,  1e10, 1e11,
                                    1e12, 1e13, 1e14, 1e15, 1e16, 1e17, 1e18, 1e19, 1e20, 1e21, 1e22};
-constexpr std::uint64_t kExactMantissa = 1ull << 53;
+} // namespace
 
 // Plain decimals ("-12.345", at most 15 digits, no exponent) as one exact integer divided by an
 // exact power of ten: IEEE division rounds correctly, so this is the value from_chars gives.
-bool ReadPlainDecimal(std::string_view text, double& value)
+const char* ScanPlainDecimal(const char* p, const char* end, double& value)
 {
-    const char* p = text.data();
-    const char* const end = p + text.size();
     const bool negative = p < end && *p == '-';
     if (negative)
         ++p;
@@ -39,11 +34,27 @@ bool ReadPlainDecimal(std::string_view text, double& value)
         decimals = static_cast<size_t>(p - fractionStart);
         digits += decimals;
     }
-    if (p != end || digits == 0 || digits > 15)
-        return false;
+    if (digits == 0 || digits > 15)
+        return nullptr;
     value = static_cast<double>(mantissa) / kPowersOfTen[decimals];
     if (negative)
         value = -value;
+    return p;
+}
+
+namespace {
+bool IsBlank(char c) { return c == ' ' || c == '\t' || c == '\r' || c == '\n'; }
+constexpr size_t kLongestNumber = 128;
+
+constexpr std::uint64_t kExactMantissa = 1ull << 53;
+
+bool ReadPlainDecimal(std::string_view text, double& value)
+{
+    const char* const end = text.data() + text.size();
+    double read = 0;
+    if (ScanPlainDecimal(text.data(), end, read) != end)
+        return false;
+    value = read;
     return true;
 }
 } // namespace

@@ -18,12 +18,18 @@ public:
     // `decimalSeparator` as the template gives it ("." or "," or a locale's text).
     explicit NumberReader(std::string_view decimalSeparator);
     ValueText Read(std::string_view field, double& value) const;
+    // True when a plain decimal read by ScanPlainDecimal is the value Read gives its whole text.
+    bool ReadsPlainDecimals() const { return m_pointSeparator; }
 
 private:
     std::string m_separator;
     bool m_pointSeparator = false;
     char m_other = 0; // the separator that must not appear when "." or "," is in force; 0 for none
 };
+
+// Reads "-12.345" (an optional minus, at most 15 digits, an optional point, no exponent) from the
+// start of [p, end); returns where it stopped, or nullptr when there is no such number there.
+const char* ScanPlainDecimal(const char* p, const char* end, double& value);
 
 // Writes the shortest round-trip text of `value` at `out` (at most 32 characters; `out` must have
 // room for all 32, which may be overwritten); returns the end.
