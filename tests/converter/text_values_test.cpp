@@ -185,6 +185,31 @@ TEST(NumberReader, FastDecimalsAgreeWithFromChars)
     }
 }
 
+TEST(ScanPlainDecimal, StopsAtTheFirstCharacterAfterTheNumberWithFromCharsValue)
+{
+    std::mt19937_64 random(17);
+    const char followers[] = {'\t', ';', ',', ' ', 'e', '/', ':', '"', 'x'};
+    for (int n = 0; n < 100000; ++n) {
+        const int digits = 1 + static_cast<int>(random() % 15);
+        std::string number = (random() % 4 == 0) ? "-" : "";
+        const int point = static_cast<int>(random() % (digits + 1));
+        for (int i = 0; i < digits; ++i) {
+            if (i == point && i > 0)
+                number += '.';
+            number += static_cast<char>('0' + random() % 10);
+        }
+        const std::string line = number + followers[random() % std::size(followers)] + "12345678.25";
+        double scanned = 0, reference = 0;
+        const char* stop = ScanPlainDecimal(line.data(), line.data() + line.size(), scanned);
+        ASSERT_EQ(stop, line.data() + number.size()) << line;
+        std::from_chars(number.data(), number.data() + number.size(), reference);
+        ASSERT_EQ(scanned, reference) << line;
+    }
+    double value = 0;
+    for (const char* refused : {"", "-", ".", "-.", "1234567890123456", "x1", "\"1\""})
+        EXPECT_EQ(ScanPlainDecimal(refused, refused + std::strlen(refused), value), nullptr) << refused;
+}
+
 TEST(FormatValue, RandomValuesReadBackExactly)
 {
     std::mt19937_64 random(5);
