@@ -18,7 +18,7 @@ namespace converter {
 
 class AsciiSeriesReader : public SeriesReader {
 public:
-    // `spec` must outlive the reader.
+    // The template must outlive the reader.
     explicit AsciiSeriesReader(const CSpecification& spec);
 
     Status Open(const std::string& path) override;

@@ -32,7 +32,7 @@ bool AcceptsExtension(Format format, const std::string& path);
 // `path` is empty; null with `status` set when the file cannot be loaded. Null for rbx0.
 std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& path, Status& status);
 
-// A reader of `format`; `spec` (ASCII and Excel) must outlive it.
+// A reader of `format`; its template (ASCII and Excel) must outlive it.
 std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* spec);
 std::unique_ptr<SeriesWriter> MakeWriter(Format format);
 

@@ -45,7 +45,7 @@ public:
         int end = 0;           // the position after it; -1 after the last field
     };
 
-    // Takes the delimiter and the two delimiter flags from `spec` (which must outlive the splitter).
+    // Takes the delimiter and the two delimiter flags from the template (which must outlive the splitter).
     explicit FieldSplitter(const CSpecification& spec);
 
     // Splits `line`. The calls and the line they index stay valid until the next Split.
