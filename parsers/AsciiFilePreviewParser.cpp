@@ -38,6 +38,9 @@ bool IsKnownValueType(const CString& name)
 // end of the line when the fields ran to it.
 CString DateTimeTextOf(const CString& line, int start, int end)
 {
+    // After a line's trailing delimiter the position stands one past its end: nothing is left.
+    if (start >= static_cast<int>(line.size()))
+        return CString();
     if (end < 0 || end >= static_cast<int>(line.size()))
         return line.substr(static_cast<size_t>(start));
     if (end - 1 <= start)

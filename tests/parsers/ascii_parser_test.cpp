@@ -479,3 +479,15 @@ TEST_F(AsciiParserTest, FailureKeepsWhatWasFilled)
 }
 
 } // namespace
+
+TEST_F(AsciiParserTest, DateTimeColumnPastATrailingDelimiterFailsWithoutReadingPastTheLine)
+{
+    // The trailing delimiter yields a last empty field and leaves the position one past the end;
+    // a date/time column after it must not take text from beyond the line.
+    spec.m_TimeDesc.m_nDateTimeCol = 3;
+    Bind("head\nA\tB\tTime\n1.5\t\n");
+    int result = -1;
+    EXPECT_NO_THROW(result = parser.Parse(""));
+    ASSERT_EQ(result, 1);
+    EXPECT_EQ(parser.m_vecRows.back(), (ui::Row{"", "1.5", ""}));
+}
