@@ -4,6 +4,9 @@ set -euo pipefail
 cd "$(dirname "$0")/.."
 seconds="${1:-20}"
 status=0
+# Crashing inputs are kept here for inspection, outside the source tree.
+artifacts=build-fuzz/artifacts
+mkdir -p "$artifacts"
 for target in build-fuzz/bin/*_fuzz build-fuzz/fuzz/*_fuzz; do
   [ -x "$target" ] || continue
   name=$(basename "$target")
@@ -11,7 +14,7 @@ for target in build-fuzz/bin/*_fuzz build-fuzz/fuzz/*_fuzz; do
   work=$(mktemp -d)
   [ -d "$corpus" ] && cp -r "$corpus"/. "$work"/ 2>/dev/null || true
   echo "fuzz: $name for ${seconds}s"
-  if ! "$target" -max_total_time="$seconds" -max_len=65536 -rss_limit_mb=2048 -timeout=10 "$work" >"$work.log" 2>&1; then
+  if ! "$target" -max_total_time="$seconds" -max_len=65536 -rss_limit_mb=2048 -timeout=10 -artifact_prefix="$artifacts/$name-" "$work" >"$work.log" 2>&1; then
     echo "fuzz: $name FAILED"; tail -n 40 "$work.log"; status=1
   else
     tail -n 1 "$work.log"
