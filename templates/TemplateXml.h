@@ -42,11 +42,11 @@ bool ParseDocument(std::string_view bytes, const CString& name, pugi::xml_docume
 // The first element called `name` anywhere in the document, in document order; null when none.
 pugi::xml_node FindElement(const pugi::xml_document& document, const char* name);
 
-// Fills `spec` from the document by `layout`; false with `error` set (and `spec` partly filled) on a bad value.
+// Fills the template from the document by `layout`; false with `error` set (and the template partly filled) on a bad value.
 bool ReadTemplate(const pugi::xml_document& document, const FileLayout& layout, const CString& name,
                   CSpecification& spec, CString& error);
 
-// Writes `spec` by `layout` as UTF-16 (little endian, with byte-order mark) to `path`.
+// Writes the template by `layout` as UTF-16 (little endian, with byte-order mark) to `path`.
 bool WriteTemplate(CSpecification& spec, const FileLayout& layout, const CString& path, CString& error);
 
 // The file contents WriteTemplate would write, for callers that store them elsewhere; throws
