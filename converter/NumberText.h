@@ -1,10 +1,17 @@
 #pragma once
-// Values as text on the hot path: reading a field with the template's decimal separator, and
-// writing a double in the shortest text that reads back to the same double.
+// Values as text on the hot path: reading a field with the template's decimal separator
+// (NumberText.cpp), and writing a double in the shortest text that reads back to the same double
+// (ValueFormat.cpp).
 #include <string>
 #include <string_view>
 
 namespace converter {
+
+// Powers of ten a double holds exactly.
+inline constexpr double kPowersOfTen[] = {1e0,  1e1,  1e2,  1e3,  1e4,  1e5,  1e6,  1e7,  1e8,  1e9,  1e10, 1e11,
+                                          1e12, 1e13, 1e14, 1e15, 1e16, 1e17, 1e18, 1e19, 1e20, 1e21, 1e22};
+// Integers below this are exact in a double.
+inline constexpr unsigned long long kExactMantissa = 1ull << 53;
 
 enum class ValueText {
     Number,          // `value` holds it

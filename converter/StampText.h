@@ -12,6 +12,8 @@
 
 namespace converter {
 
+inline constexpr long long kSecondsPerDay = 86400;
+
 // The six calendar fields of a stamp.
 struct StampFields {
     int year = 1900, month = 1, day = 1, hour = 0, minute = 0, second = 0;
