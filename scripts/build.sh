@@ -9,7 +9,7 @@ case "$flavour" in
   release)  dir=build;          opts=(-DCMAKE_BUILD_TYPE=RelWithDebInfo -DVELMORA_WERROR=ON) ;;
   sanitize) dir=build-sanitize; opts=(-DCMAKE_BUILD_TYPE=Debug -DVELMORA_WERROR=ON -DVELMORA_SANITIZE=ON -DVELMORA_BENCH=OFF) ;;
   fuzz)     dir=build-fuzz;     opts=(-DCMAKE_BUILD_TYPE=RelWithDebInfo -DCMAKE_C_COMPILER=clang -DCMAKE_CXX_COMPILER=clang++
-                                      -DVELMORA_FUZZ=ON -DVELMORA_SANITIZE=ON -DVELMORA_BENCH=OFF -DVELMORA_WIZARD=OFF) ;;
+                                      -DVELMORA_FUZZ=ON -DVELMORA_SANITIZE=ON -DVELMORA_BENCH=OFF) ;;
   *) echo "usage: build.sh [release|sanitize|fuzz]" >&2; exit 2 ;;
 esac
 cmake -S . -B "$dir" -G Ninja "${launcher[@]}" "${opts[@]}" >/dev/null
