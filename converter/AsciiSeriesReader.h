@@ -30,6 +30,9 @@ public:
     // starting with a quote) are split and read in one pass unless this is turned off; the results
     // are the same either way.
     void UseFusedPass(bool on) { m_fusedOn = on; }
+    // Of those, lines of a template whose date/time is the first field alone are read by
+    // delimiter positions found in blocks, unless this is turned off; the results are the same.
+    void UseBlockPass(bool on) { m_blockOn = on; }
 
 private:
     struct HeaderLines; // the lines the header rows name, read before the data
@@ -45,6 +48,10 @@ private:
     // The data line in one pass over its text; false, with nothing reported, when the line needs
     // the splitter or does not read cleanly (ReadDataLine then reads it and reports the fault).
     bool ReadDataLineFused(std::string_view line, Row& row);
+    // The data line with the date/time as its first field, by its delimiter positions; false, with
+    // nothing reported, when it is not of that shape or does not read cleanly.
+    bool ReadDataLineByBlocks(std::string_view line, Row& row);
+    bool ReadFieldValue(const char* field, size_t size, double& value) const;
 
     const CSpecification& m_spec;
     std::string m_path;
@@ -55,6 +62,9 @@ private:
     std::string m_delimiter;
     bool m_fusable = false; // the template allows the one-pass reading of data lines
     bool m_fusedOn = true;
+    bool m_blockOn = true;
+    bool m_pointDecimals = false;    // "." is the decimal separator
+    bool m_everySlotFilled = false;  // each data line sets every value of the row
     int m_formatColumns = 1; // W: fields the date/time spans
     int m_stampColumn = 1;   // K: field where it starts
     int m_columns = 0;       // N: logical columns of a data line, the date/time counting as one
@@ -63,6 +73,7 @@ private:
     std::string m_deleteValue;
 
     std::unique_ptr<DateFormat> m_format;
+    std::unique_ptr<StampReader> m_stamps; // reads with m_format from m_start
     StampFields m_start;           // starting fields: the global date or time where one applies
     std::string m_stampBuffer;     // the date/time fields joined by blanks
     std::vector<int> m_slotOfItem; // item position -> place in the row, -1 when not selected

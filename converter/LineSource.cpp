@@ -17,7 +17,7 @@ Status LineSource::Open(const std::string& path)
     m_file = std::fopen(path.c_str(), "rb");
     if (!m_file)
         return m_status = Status::Fail(path, 0, std::string("cannot open the file: ") + std::strerror(errno));
-    m_buffer.resize(kDefaultBuffer);
+    m_buffer.resize(kDefaultBuffer + kReadableAfterLine);
     return m_status;
 }
 
@@ -30,16 +30,16 @@ bool LineSource::Refill()
         m_end -= m_begin;
         m_begin = 0;
     }
-    if (m_end == m_buffer.size()) {
-        if (m_buffer.size() >= kMaxLineLength) {
+    if (m_end == Capacity()) {
+        if (Capacity() >= kMaxLineLength) {
             m_status = Status::Fail(m_path, m_lineNumber + 1,
                                     "the line is longer than " + std::to_string(kMaxLineLength) +
                                         " bytes; this is not a delimited text file");
             return false;
         }
-        m_buffer.resize(m_buffer.size() * 2);
+        m_buffer.resize(Capacity() * 2 + kReadableAfterLine);
     }
-    const size_t got = std::fread(m_buffer.data() + m_end, 1, m_buffer.size() - m_end, m_file);
+    const size_t got = std::fread(m_buffer.data() + m_end, 1, Capacity() - m_end, m_file);
     if (got == 0) {
         if (std::ferror(m_file))
             m_status = Status::Fail(m_path, m_lineNumber + 1, std::string("read error: ") + std::strerror(errno));

@@ -15,6 +15,9 @@ class LineSource {
 public:
     static constexpr size_t kDefaultBuffer = 256 * 1024;
     static constexpr size_t kMaxLineLength = 4 * 1024 * 1024;
+    // Bytes past the end of every line that may be read, so that a line can be scanned in wide
+    // blocks; what they hold is unspecified.
+    static constexpr size_t kReadableAfterLine = 64;
 
     LineSource() = default;
     ~LineSource();
@@ -32,6 +35,7 @@ public:
 
 private:
     bool Refill();
+    size_t Capacity() const { return m_buffer.size() - kReadableAfterLine; }
 
     std::FILE* m_file = nullptr;
     std::string m_path;

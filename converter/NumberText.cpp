@@ -5,6 +5,10 @@
 #include <cstdint>
 #include <cstring>
 
+#if defined(__SSE2__)
+#include <emmintrin.h>
+#endif
+
 namespace converter {
 
 // Plain decimals ("-12.345", at most 15 digits, no exponent) as one exact integer divided by an
@@ -34,6 +38,61 @@ const char* ScanPlainDecimal(const char* p, const char* end, double& value)
     if (negative)
         value = -value;
     return p;
+}
+
+namespace {
+
+constexpr std::uint64_t kIntegerPowersOfTen[] = {1, 10, 100, 1000, 10000, 100000, 1000000, 10000000, 100000000};
+
+// The value of the `count` (0 to 8) decimal digits at `digits`; the 8 bytes from there are read.
+std::uint32_t EightDigitsValue(const char* digits, unsigned count)
+{
+    std::uint64_t word;
+    std::memcpy(&word, digits, sizeof word);
+    // Bytes after the digits may borrow from the ones above them only, which the shift drops; the
+    // digits move to the top, below them come zeros that read as leading zeros.
+    word -= 0x3030303030303030ull;
+    word = count == 0 ? 0 : word << (8 * (8 - count));
+    // Neighbouring digits joined into pairs, pairs into fours, fours into the eight.
+    word = ((word * (10 * 256 + 1)) >> 8) & 0x00FF00FF00FF00FFull;
+    word = ((word * (100 * 65536 + 1)) >> 16) & 0x0000FFFF0000FFFFull;
+    return static_cast<std::uint32_t>((word * (10000 * (1ull << 32) + 1)) >> 32);
+}
+
+} // namespace
+
+bool ReadPlainField(const char* field, size_t length, double& value)
+{
+#if defined(__SSE2__)
+    const bool negative = length > 0 && field[0] == '-';
+    const char* const text = field + (negative ? 1 : 0);
+    const size_t count = length - (negative ? 1 : 0);
+    if (count == 0 || count > 16)
+        return false;
+    const __m128i bytes = _mm_loadu_si128(reinterpret_cast<const __m128i*>(text));
+    const __m128i digit = _mm_and_si128(_mm_cmpgt_epi8(bytes, _mm_set1_epi8('0' - 1)),
+                                        _mm_cmplt_epi8(bytes, _mm_set1_epi8('9' + 1)));
+    const unsigned inField = (1u << count) - 1;
+    const unsigned digits = static_cast<unsigned>(_mm_movemask_epi8(digit)) & inField;
+    const unsigned points = static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi8(bytes, _mm_set1_epi8('.')))) & inField;
+    // Every byte a digit or the one point.
+    if ((digits | points) != inField || (points & (points - 1)) != 0)
+        return false;
+    const unsigned integerDigits = points != 0 ? static_cast<unsigned>(__builtin_ctz(points)) : static_cast<unsigned>(count);
+    const unsigned decimals = points != 0 ? static_cast<unsigned>(count) - integerDigits - 1 : 0;
+    if (integerDigits > 8 || decimals > 8 || integerDigits + decimals == 0 || integerDigits + decimals > 15)
+        return false;
+    const std::uint64_t mantissa = EightDigitsValue(text, integerDigits) * kIntegerPowersOfTen[decimals] +
+                                   EightDigitsValue(text + integerDigits + 1, decimals);
+    // The same exact division as ScanPlainDecimal.
+    value = static_cast<double>(mantissa) / kPowersOfTen[decimals];
+    if (negative)
+        value = -value;
+    return true;
+#else
+    const char* const end = field + length;
+    return ScanPlainDecimal(field, end, value) == end && length > 0;
+#endif
 }
 
 namespace {

@@ -38,6 +38,16 @@ private:
 // start of [p, end); returns where it stopped, or nullptr when there is no such number there.
 const char* ScanPlainDecimal(const char* p, const char* end, double& value);
 
+// Bytes from a field's start that ReadPlainField reads, however short the field.
+inline constexpr size_t kPlainFieldReach = 32;
+
+// Reads a whole field of the form "-12.345" (an optional minus, at most 15 digits of which at most
+// 8 on either side of an optional point) with the value ScanPlainDecimal gives it, looking at its
+// bytes in blocks rather than one by one. False for a field of any other form, which the caller
+// then reads in general. Reads kPlainFieldReach bytes from `field`, past its end too: the caller's
+// buffer must have them.
+bool ReadPlainField(const char* field, size_t length, double& value);
+
 // Writes the shortest round-trip text of `value` at `out` (at most 32 characters; `out` must have
 // room for all 32, which may be overwritten); returns the end.
 char* FormatValue(double value, char* out);

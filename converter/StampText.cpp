@@ -147,6 +147,39 @@ bool DateFormat::Read(std::string_view text, StampFields& fields) const
     return true;
 }
 
+bool StampReader::ReadClock(std::string_view text, Stamp& stamp) const
+{
+    const char* t = text.data();
+    if (!m_format.IsSeparator(t[10]) || !m_format.IsSeparator(t[13]) || !m_format.IsSeparator(t[16]))
+        return false;
+    auto digit = [t](size_t at) { return static_cast<unsigned>(static_cast<unsigned char>(t[at])) - unsigned{'0'}; };
+    const unsigned d[6] = {digit(11), digit(12), digit(14), digit(15), digit(17), digit(18)};
+    const bool allDigits = (d[0] <= 9) & (d[1] <= 9) & (d[2] <= 9) & (d[3] <= 9) & (d[4] <= 9) & (d[5] <= 9);
+    const unsigned hour = d[0] * 10 + d[1], minute = d[2] * 10 + d[3], second = d[4] * 10 + d[5];
+    if (!allDigits || hour > 23 || minute > 59 || second > 59)
+        return false;
+    stamp = m_dayStart + hour * 3600LL + minute * 60LL + second;
+    return true;
+}
+
+bool StampReader::ReadWhole(std::string_view text, Stamp& stamp)
+{
+    StampFields fields = m_start;
+    const bool compact = m_format.IsCompact() && m_format.ReadCompact(text, fields);
+    if (!compact && !m_format.Read(text, fields))
+        return false;
+    const std::optional<Stamp> value = StampFromFields(fields);
+    if (!value)
+        return false;
+    stamp = *value;
+    if (compact) {
+        std::memcpy(m_date.data(), text.data(), m_date.size());
+        m_dayStart = stamp - (fields.hour * 3600LL + fields.minute * 60LL + fields.second);
+        m_known = true;
+    }
+    return true;
+}
+
 std::optional<Stamp> StampFromFields(const StampFields& f)
 {
     if (!IsValidCalendarDate(f.year, f.month, f.day) || f.hour < 0 || f.hour > 23 || f.minute < 0 ||

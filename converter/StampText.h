@@ -6,6 +6,7 @@
 #include "converter/TimeSeries.h"
 
 #include <array>
+#include <cstring>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -35,10 +36,15 @@ public:
     // How many tokens the format has.
     size_t TokenCount() const { return m_count; }
 
+    // True for a Y M D H m S format, which reads "dddd?dd?dd?dd?dd?dd" by position (ReadCompact).
+    bool IsCompact() const { return m_compact; }
+    bool IsSeparator(char c) const { return m_separator[static_cast<unsigned char>(c)]; }
+    // "dddd?dd?dd?dd?dd?dd" read by a compact format without tokenizing; false for any other text
+    // (Read then reads it in general) and for fields out of their ranges.
+    bool ReadCompact(std::string_view text, StampFields& fields) const;
+
 private:
     enum class Field : unsigned char { None, Year, Month, Day, Hour, Minute, Second };
-    // "dddd?dd?dd?dd?dd?dd" read by a Y M D H m S format, the common case, without tokenizing.
-    bool ReadCompact(std::string_view text, StampFields& fields) const;
     static constexpr size_t kMaxTokens = 32; // tokens past this read nothing, as "other" tokens do
     std::array<Field, kMaxTokens> m_fields{};
     size_t m_count = 0;
@@ -49,6 +55,35 @@ private:
 
 // The stamp of calendar fields; nothing when the calendar has no such day (30 February).
 std::optional<Stamp> StampFromFields(const StampFields& fields);
+
+// Reads the stamps of a run of rows with one format. Most rows share the date of the row before:
+// when a compact stamp's ten date characters are the previous compact stamp's, only its clock is
+// read. The stamps are those Read and StampFromFields give.
+class StampReader {
+public:
+    // `format` must outlive the reader; `start` holds the fields the format does not read.
+    StampReader(const DateFormat& format, const StampFields& start) : m_format(format), m_start(start) {}
+
+    // False when the text does not read or names a day the calendar does not have.
+    bool Read(std::string_view text, Stamp& stamp)
+    {
+        if (m_known && text.size() == kCompactLength && std::memcmp(text.data(), m_date.data(), m_date.size()) == 0 &&
+            ReadClock(text, stamp))
+            return true;
+        return ReadWhole(text, stamp);
+    }
+
+private:
+    static constexpr size_t kCompactLength = 19; // "YYYY/MM/DD HH:mm:ss"
+    bool ReadClock(std::string_view text, Stamp& stamp) const;
+    bool ReadWhole(std::string_view text, Stamp& stamp);
+
+    const DateFormat& m_format;
+    StampFields m_start;
+    bool m_known = false;
+    std::array<char, 10> m_date{}; // the date characters of the last compact stamp
+    Stamp m_dayStart = 0;          // its midnight
+};
 StampFields FieldsFromStamp(Stamp stamp);
 
 // Days since 30 December 1899 (the spreadsheet's and OLE's date serial) and back, to the second.

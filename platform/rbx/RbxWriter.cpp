@@ -6,6 +6,7 @@
 #include "platform/system/Text.h"
 #include "platform/units/Units.h"
 
+#include <algorithm>
 #include <cmath>
 #include <cstring>
 
@@ -59,8 +60,14 @@ struct CRbxWriter::State {
     CString path;
     FileHeader header;
     std::vector<unsigned char> headerBytes;
-    std::vector<unsigned char> buffer;
+    // Records waiting to be written: `used` bytes of room for kFlushBytes and one record more.
+    std::unique_ptr<unsigned char[]> buffer;
+    std::size_t used = 0;
     std::vector<unsigned char> packed;
+    // Every item is 64-bit floating point, so a step's values go into the record as they are,
+    // each gap as its item's delete value (one per value).
+    bool allFloat64 = false;
+    std::vector<double> deleteValues;
     std::uint32_t crc = 0;
     std::uint64_t steps = 0;
     double firstTime = 0.0;
@@ -141,7 +148,11 @@ bool CRbxWriter::Open(const CString& path, const FileDefinition& definition)
     }
     s.headerBytes = EncodeHeader(h);
     s.packed.resize(h.recordSize - 8);
-    s.buffer.reserve(kFlushBytes + h.recordSize);
+    s.buffer = std::make_unique<unsigned char[]>(kFlushBytes + h.recordSize);
+    s.allFloat64 = std::all_of(h.items.begin(), h.items.end(), [](const ItemInfo& item) { return item.dataType == kFloat64; });
+    if (s.allFloat64)
+        for (const ItemInfo& item : h.items)
+            s.deleteValues.insert(s.deleteValues.end(), item.elementCount, item.deleteValue);
 
     s.file.reset(std::fopen(path.c_str(), "wb"));
     if (!s.file)
@@ -200,30 +211,48 @@ bool CRbxWriter::PackValues(const double* values)
 bool CRbxWriter::AppendRecord(double time)
 {
     State& s = *m_state;
-    const auto* t = reinterpret_cast<const unsigned char*>(&time);
-    s.buffer.insert(s.buffer.end(), t, t + sizeof(time));
-    s.buffer.insert(s.buffer.end(), s.packed.begin(), s.packed.end());
+    unsigned char* const record = s.buffer.get() + s.used;
+    std::memcpy(record, &time, sizeof time);
+    std::memcpy(record + sizeof time, s.packed.data(), s.packed.size());
+    return RecordAppended(time);
+}
+
+bool CRbxWriter::RecordAppended(double time)
+{
+    State& s = *m_state;
+    s.used += s.header.recordSize;
     s.lastTime = time;
     ++s.steps;
-    return s.buffer.size() < kFlushBytes || FlushBuffer();
+    return s.used < kFlushBytes || FlushBuffer();
 }
 
 bool CRbxWriter::FlushBuffer()
 {
     State& s = *m_state;
-    if (s.buffer.empty())
+    if (s.used == 0)
         return true;
-    s.crc = Crc32(s.crc, s.buffer.data(), s.buffer.size());
-    const bool ok = std::fwrite(s.buffer.data(), 1, s.buffer.size(), s.file.get()) == s.buffer.size();
-    s.buffer.clear();
+    s.crc = Crc32(s.crc, s.buffer.get(), s.used);
+    const bool ok = std::fwrite(s.buffer.get(), 1, s.used, s.file.get()) == s.used;
+    s.used = 0;
     return ok || Fail("cannot write the data (disk full?)");
 }
 
 bool CRbxWriter::WriteStep(double time, const double* values)
 {
-    if (!IsOpen() || m_state->failed)
+    if (!IsOpen() || m_state->failed || !CheckTime(time))
         return false;
-    return CheckTime(time) && PackValues(values) && AppendRecord(time);
+    State& s = *m_state;
+    if (!s.allFloat64)
+        return PackValues(values) && AppendRecord(time);
+    unsigned char* record = s.buffer.get() + s.used;
+    std::memcpy(record, &time, sizeof time);
+    record += sizeof time;
+    const std::size_t count = s.deleteValues.size();
+    for (std::size_t i = 0; i < count; ++i) {
+        const double value = std::isnan(values[i]) ? s.deleteValues[i] : values[i];
+        std::memcpy(record + i * sizeof value, &value, sizeof value);
+    }
+    return RecordAppended(time);
 }
 
 bool CRbxWriter::WriteRawStep(double time, const void* packedValues)

@@ -62,6 +62,8 @@ private:
     bool CheckTime(double time);
     bool PackValues(const double* values);
     bool AppendRecord(double time);
+    // Counts the record just placed in the buffer and writes the buffer out when it is full.
+    bool RecordAppended(double time);
     bool FlushBuffer();
     bool PatchHeader();
 
