@@ -15,18 +15,24 @@ __extension__ typedef unsigned __int128 Digits16;
 
 constexpr std::uint64_t kAsciiZeros = 0x3030303030303030ull;
 
+// The four-digit texts of 0 to 9999, the first digit in the lowest byte (40 KB: looking up two
+// of them was measured faster than splitting the digits arithmetically, even with the table
+// mostly outside the first-level cache).
+struct FourDigitTexts {
+    std::uint32_t text[10000];
+    constexpr FourDigitTexts() : text()
+    {
+        for (std::uint32_t n = 0; n < 10000; ++n)
+            text[n] = (0x30u + n / 1000) | (0x30u + n / 100 % 10) << 8 | (0x30u + n / 10 % 10) << 16 | (0x30u + n % 10) << 24;
+    }
+};
+constexpr FourDigitTexts kFourDigits;
+
 // The eight decimal digits of `value` (below 10^8) as ASCII in one word, the first digit in the
-// lowest byte. The digits are split within the word (four, two, one at a time in parallel lanes),
-// so there is no table lookup and no byte store that a later wide load would have to wait for.
+// lowest byte.
 [[gnu::always_inline]] inline std::uint64_t EightDigits(std::uint32_t value)
 {
-    // Lanes of 32 bits: the high and low four digits. n * 10486 >> 20 == n / 100 for n < 10^4.
-    const std::uint64_t fours = (value / 10000) | (static_cast<std::uint64_t>(value % 10000) << 32);
-    const std::uint64_t hundreds = ((fours * 10486) >> 20) & 0x0000007F0000007Full;
-    // Lanes of 16 bits: four pairs. n * 103 >> 10 == n / 10 for n < 100.
-    const std::uint64_t pairs = hundreds | ((fours - hundreds * 100) << 16);
-    const std::uint64_t tens = ((pairs * 103) >> 10) & 0x000F000F000F000Full;
-    return (tens | ((pairs - tens * 10) << 8)) + kAsciiZeros;
+    return kFourDigits.text[value / 10000] | static_cast<std::uint64_t>(kFourDigits.text[value % 10000]) << 32;
 }
 
 Digits16 SixteenDigits(std::uint64_t value)
