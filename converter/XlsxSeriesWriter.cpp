@@ -1,12 +1,26 @@
 #include "converter/XlsxSeriesWriter.h"
 
+#include "converter/NumberText.h"
 #include "converter/StampText.h"
+#include "converter/XlsxParts.h"
 
-#include <xlsxwriter.h>
+#include <algorithm>
+#include <charconv>
+#include <cmath>
+#include <cstring>
+#include <unordered_map>
 
 namespace converter {
 
 namespace {
+
+constexpr size_t kSheetBufferBytes = 256 * 1024;
+// Room for one cell: opening, row number, style, the longest value text, closing.
+constexpr size_t kCellBytes = 80;
+constexpr size_t kRowBytes = 64;
+// Fixed-size copies may write this far past the text they copy.
+constexpr size_t kSlack = 32;
+constexpr int kNoString = -1;
 
 std::string MetadataCell(const ItemInfo& item)
 {
@@ -21,82 +35,186 @@ std::string MetadataCell(const ItemInfo& item)
            part(item.valueType, "Instantaneous");
 }
 
-// Header texts go in as formulas with their text result: in constant-memory mode a plain string
-// becomes an inline string, which the workbook reader (liborcus 0.17) passes over, while a
-// formula's cached text result is read by it and shown by every spreadsheet program.
-void WriteText(lxw_worksheet* sheet, lxw_row_t row, lxw_col_t column, const std::string& text)
+template <size_t N>
+char* Copy(char* out, const char (&text)[N])
 {
-    std::string formula = "=\"";
-    for (char c : text)
-        formula += c == '"' ? std::string("\"\"") : std::string(1, c);
-    formula += '"';
-    worksheet_write_formula_str(sheet, row, column, formula.c_str(), nullptr, text.c_str());
+    std::memcpy(out, text, N - 1);
+    return out + N - 1;
 }
 
 } // namespace
 
-XlsxSeriesWriter::~XlsxSeriesWriter()
-{
-    // A workbook that was never finished is closed here so the library frees it; the file it leaves
-    // is the temporary one, which the caller removes.
-    if (m_workbook)
-        workbook_close(m_workbook);
-}
+// The header texts as shared-string indexes, each distinct text stored once.
+struct XlsxSeriesWriter::HeaderCells {
+    std::vector<std::string> strings;
+    size_t references = 0;
+    std::vector<int> metadata; // per item
+    int timeTitle = kNoString;
+    std::vector<int> names; // per item; kNoString for a blank cell
+
+    explicit HeaderCells(const SeriesHeader& header)
+    {
+        for (const ItemInfo& item : header.items)
+            metadata.push_back(Intern(MetadataCell(item)));
+        timeTitle = Intern(header.timeTitle.empty() ? "Date/time" : header.timeTitle);
+        // An empty name would read back as "Item<n>"; the cell stays blank as the input had it.
+        for (const ItemInfo& item : header.items)
+            names.push_back(item.name.empty() ? kNoString : Intern(item.name));
+    }
+
+private:
+    int Intern(const std::string& text)
+    {
+        ++references;
+        auto [it, added] = m_index.try_emplace(text, static_cast<int>(strings.size()));
+        if (added)
+            strings.push_back(text);
+        return it->second;
+    }
+    std::unordered_map<std::string, int> m_index;
+};
 
 Status XlsxSeriesWriter::Begin(const std::string& path, const SeriesHeader& header, const std::string& title)
 {
     m_path = path;
-    m_title = title;
     if (header.items.size() + 1 > kMaxColumns)
         return Status::Fail(path, 0, std::to_string(header.items.size()) + " items do not fit the " +
                                          std::to_string(kMaxColumns - 1) + " value columns of a worksheet");
-    lxw_workbook_options options{};
-    options.constant_memory = LXW_TRUE;
-    m_workbook = workbook_new_opt(path.c_str(), &options);
-    if (!m_workbook)
-        return Status::Fail(path, 0, "cannot create the workbook");
-    m_sheet = workbook_add_worksheet(m_workbook, nullptr);
-    m_dateFormat = workbook_add_format(m_workbook);
-    format_set_num_format(m_dateFormat, "yyyy/mm/dd hh:mm:ss");
-    if (!m_title.empty()) {
-        lxw_doc_properties properties{};
-        properties.title = m_title.data(); // the library keeps its own copy
-        workbook_set_properties(m_workbook, &properties);
+    if (Status opened = m_zip.Open(path); !opened)
+        return opened;
+    m_sheet.resize(kSheetBufferBytes);
+    m_cellOpenings.clear();
+    for (unsigned column = 1; column <= header.items.size() + 1; ++column) {
+        const std::string opening = "<c r=\"" + xlsx::ColumnName(column);
+        CellOpening slot{};
+        std::memcpy(slot.text, opening.data(), opening.size());
+        slot.length = opening.size();
+        m_cellOpenings.push_back(slot);
     }
-    worksheet_set_column(m_sheet, 0, 0, 20, nullptr);
-    for (size_t i = 0; i < header.items.size(); ++i) {
-        const auto column = static_cast<lxw_col_t>(i + 1);
-        WriteText(m_sheet, 0, column, MetadataCell(header.items[i]));
-    }
-    WriteText(m_sheet, 1, 0, header.timeTitle.empty() ? "Date/time" : header.timeTitle);
-    for (size_t i = 0; i < header.items.size(); ++i) {
-        const auto column = static_cast<lxw_col_t>(i + 1);
-        // An empty name would read back as "Item<n>"; the cell stays blank as the input had it.
-        if (!header.items[i].name.empty())
-            WriteText(m_sheet, 1, column, header.items[i].name);
+    const HeaderCells cells(header);
+    if (Status parts = WritePackageParts(cells, title); !parts)
+        return parts;
+    return WriteHeaderRows(cells);
+}
+
+Status XlsxSeriesWriter::WritePackageParts(const HeaderCells& cells, const std::string& title)
+{
+    const std::pair<const char*, std::string> parts[] = {
+        {"[Content_Types].xml", xlsx::ContentTypes()},
+        {"_rels/.rels", xlsx::PackageRelationships()},
+        {"docProps/core.xml", xlsx::CoreProperties(title)},
+        {"docProps/app.xml", xlsx::AppProperties()},
+        {"xl/workbook.xml", xlsx::Workbook()},
+        {"xl/_rels/workbook.xml.rels", xlsx::WorkbookRelationships()},
+        {"xl/styles.xml", xlsx::Styles()},
+        {"xl/sharedStrings.xml", xlsx::SharedStrings(cells.strings, cells.references)},
+    };
+    for (const auto& [name, text] : parts)
+        if (Status added = m_zip.AddEntry(name, text); !added)
+            return added;
+    // The used range is not known before the last row: a placeholder of the same length for now.
+    return m_zip.BeginEntry("xl/worksheets/sheet1.xml", xlsx::SheetHead(LastCell()));
+}
+
+Status XlsxSeriesWriter::WriteHeaderRows(const HeaderCells& cells)
+{
+    auto textCell = [this](unsigned column, const char* row, int index) {
+        if (index == kNoString)
+            return;
+        std::string cell(m_cellOpenings[column].text, m_cellOpenings[column].length);
+        cell += row;
+        cell += "\" t=\"s\"><v>" + std::to_string(index) + "</v></c>";
+        std::memcpy(m_sheet.data() + m_used, cell.data(), cell.size());
+        m_used += cell.size();
+    };
+    for (unsigned row = 1; row <= 2; ++row) {
+        if (Status room = Reserve(kRowBytes + m_cellOpenings.size() * kCellBytes); !room)
+            return room;
+        const char* number = row == 1 ? "1" : "2";
+        const std::string open = std::string("<row r=\"") + number + "\">";
+        std::memcpy(m_sheet.data() + m_used, open.data(), open.size());
+        m_used += open.size();
+        if (row == 2)
+            textCell(0, number, cells.timeTitle);
+        for (size_t item = 0; item < cells.metadata.size(); ++item)
+            textCell(static_cast<unsigned>(item + 1), number, row == 1 ? cells.metadata[item] : cells.names[item]);
+        m_used = static_cast<size_t>(Copy(m_sheet.data() + m_used, "</row>") - m_sheet.data());
     }
     return Status::Ok();
+}
+
+Status XlsxSeriesWriter::Reserve(size_t bytes)
+{
+    if (m_used + bytes + kSlack <= m_sheet.size())
+        return Status::Ok();
+    if (Status flushed = FlushSheet(); !flushed)
+        return flushed;
+    if (bytes + kSlack > m_sheet.size())
+        m_sheet.resize(bytes + kSlack);
+    return Status::Ok();
+}
+
+Status XlsxSeriesWriter::FlushSheet()
+{
+    const std::string_view pending(m_sheet.data(), m_used);
+    m_used = 0;
+    return m_zip.Append(pending);
 }
 
 Status XlsxSeriesWriter::Write(const Row& row)
 {
     if (m_row >= kMaxRows)
         return Status::Fail(m_path, 0, "more rows than a worksheet holds (" + std::to_string(kMaxRows) + ")");
-    worksheet_write_number(m_sheet, m_row, 0, StampToSerialDays(row.stamp), m_dateFormat);
-    for (size_t i = 0; i < row.values.size(); ++i)
-        if (!IsMissing(row.values[i]))
-            worksheet_write_number(m_sheet, m_row, static_cast<lxw_col_t>(i + 1), row.values[i], nullptr);
+    if (Status room = Reserve(kRowBytes + m_cellOpenings.size() * kCellBytes); !room)
+        return room;
+    char number[16] = {};
+    const size_t digits = static_cast<size_t>(std::to_chars(number, number + sizeof number, m_row + 1).ptr - number);
+
+    char* out = m_sheet.data() + m_used;
+    auto openCell = [&](unsigned column) {
+        std::memcpy(out, m_cellOpenings[column].text, sizeof m_cellOpenings[column].text);
+        out += m_cellOpenings[column].length;
+        std::memcpy(out, number, 8); // a row number has at most 7 digits
+        out += digits;
+    };
+    out = Copy(out, "<row r=\"");
+    std::memcpy(out, number, 8);
+    out += digits;
+    out = Copy(out, "\">");
+    openCell(0);
+    out = Copy(out, "\" s=\"1\"><v>");
+    out = FormatValue(StampToSerialDays(row.stamp), out);
+    out = Copy(out, "</v></c>");
+    const size_t count = std::min(row.values.size(), m_cellOpenings.size() - 1);
+    for (size_t i = 0; i < count; ++i) {
+        // A cell holds finite numbers only: missing and infinite values stay blank.
+        if (!std::isfinite(row.values[i]))
+            continue;
+        openCell(static_cast<unsigned>(i + 1));
+        out = Copy(out, "\"><v>");
+        out = FormatValue(row.values[i], out);
+        out = Copy(out, "</v></c>");
+    }
+    out = Copy(out, "</row>");
+    m_used = static_cast<size_t>(out - m_sheet.data());
     ++m_row;
     return Status::Ok();
 }
 
+std::string XlsxSeriesWriter::LastCell() const
+{
+    return xlsx::ColumnName(static_cast<unsigned>(m_cellOpenings.size())) + std::to_string(m_row);
+}
+
 Status XlsxSeriesWriter::Finish()
 {
-    const lxw_error error = workbook_close(m_workbook);
-    m_workbook = nullptr;
-    if (error != LXW_NO_ERROR)
-        return Status::Fail(m_path, 0, std::string("cannot write the workbook: ") + lxw_strerror(error));
-    return Status::Ok();
+    if (Status flushed = FlushSheet(); !flushed)
+        return flushed;
+    if (Status tail = m_zip.Append(xlsx::SheetTail()); !tail)
+        return tail;
+    if (Status ended = m_zip.EndEntry(xlsx::SheetHead(LastCell())); !ended)
+        return ended;
+    return m_zip.Close();
 }
 
 } // namespace converter

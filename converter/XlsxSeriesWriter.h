@@ -1,21 +1,21 @@
 #pragma once
 // Writes an .xlsx workbook of one sheet in the layout a new Excel template reads with its defaults:
 //   row 1  column A empty, then per item "Type[unit]:ValueType"
-//   row 2  the date/time title, then the item names
+//   row 2  the date/time title, then the item names (an empty name stays a blank cell)
 //   row 3+ a date cell ("yyyy/mm/dd hh:mm:ss"), then one number per item; a missing value is a
 //          blank cell.
-// Rows stream to disk as they come (constant-memory mode).
+// Header texts are shared strings. The sheet's XML is built in a buffer and deflated into the
+// package as the buffer fills, so memory stays the same whatever the row count.
 #include "converter/SeriesWriter.h"
+#include "converter/ZipWriter.h"
 
-struct lxw_workbook;
-struct lxw_worksheet;
-struct lxw_format;
+#include <string>
+#include <vector>
 
 namespace converter {
 
 class XlsxSeriesWriter : public SeriesWriter {
 public:
-    ~XlsxSeriesWriter() override;
     Status Begin(const std::string& path, const SeriesHeader& header, const std::string& title) override;
     Status Write(const Row& row) override;
     Status Finish() override;
@@ -24,12 +24,25 @@ public:
     static constexpr unsigned kMaxColumns = 16384;
 
 private:
-    lxw_workbook* m_workbook = nullptr;
-    lxw_worksheet* m_sheet = nullptr;
-    lxw_format* m_dateFormat = nullptr;
+    struct HeaderCells;
+    Status WritePackageParts(const HeaderCells& cells, const std::string& title);
+    Status WriteHeaderRows(const HeaderCells& cells);
+    // Makes room for `bytes` more in the sheet buffer, handing what it holds to the package.
+    Status Reserve(size_t bytes);
+    Status FlushSheet();
+    std::string LastCell() const;
+
+    ZipWriter m_zip;
     std::string m_path;
-    std::string m_title;
-    unsigned m_row = 2;
+    // "<c r=\"B" per column from A, in fixed-size slots so copying one needs no length.
+    struct CellOpening {
+        char text[16];
+        size_t length;
+    };
+    std::vector<CellOpening> m_cellOpenings;
+    std::vector<char> m_sheet;               // sheet XML not yet handed to the package
+    size_t m_used = 0;
+    unsigned m_row = 2; // rows written so far, the two header rows included
 };
 
 } // namespace converter

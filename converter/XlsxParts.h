@@ -1,0 +1,33 @@
+#pragma once
+// The text of the small parts of a one-sheet .xlsx package, and the XML text of cell contents.
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace converter::xlsx {
+
+// `text` as XML character data, safe inside elements and quoted attributes. Bytes that are not
+// UTF-8 are taken as Latin-1 characters; control characters XML 1.0 cannot carry become blanks.
+std::string XmlText(std::string_view text);
+
+// "A", "B", ..., "Z", "AA", ... for columns from 1.
+std::string ColumnName(unsigned column);
+
+std::string ContentTypes();
+std::string PackageRelationships();
+std::string CoreProperties(const std::string& title);
+std::string AppProperties();
+std::string Workbook();
+std::string WorkbookRelationships();
+// Cell style 1 is the date format "yyyy/mm/dd hh:mm:ss".
+std::string Styles();
+// `strings` in index order; `references` counts the cells that use them.
+std::string SharedStrings(const std::vector<std::string>& strings, size_t references);
+
+// The opening of the worksheet up to and including <sheetData>, with the used range `lastCell`
+// (e.g. "K1002"). The text has the same length for every `lastCell`, so a placeholder can be
+// replaced once the row count is known.
+std::string SheetHead(const std::string& lastCell);
+std::string SheetTail();
+
+} // namespace converter::xlsx
