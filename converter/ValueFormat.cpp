@@ -102,6 +102,26 @@ char* WriteEightOrFewer(std::uint64_t text, int integerDigits, bool negative, ch
     return out + integerDigits + 1 + fractionDigits;
 }
 
+// Writes "iiii.ffff" from its eight digits without the leading zeros of the integer part (one
+// digit stays) and the trailing zeros of the fraction (the point goes with the last of them).
+char* WriteFourDecimals(std::uint64_t text, bool negative, char* out)
+{
+    *out = '-';
+    out += negative;
+    const std::uint64_t values = text - kAsciiZeros; // not 0: the value is not
+    const int leading = std::min(std::countr_zero(values) / 8, 3);
+    const int fractionDigits = 4 - std::min(std::countl_zero(values) / 8, 4);
+    const std::uint64_t integer = text >> (8 * leading);
+    std::memcpy(out, &integer, 8);
+    const int integerDigits = 4 - leading;
+    if (fractionDigits == 0)
+        return out + integerDigits;
+    out[integerDigits] = '.';
+    const std::uint64_t fraction = text >> 32;
+    std::memcpy(out + integerDigits + 1, &fraction, 8);
+    return out + integerDigits + 1 + fractionDigits;
+}
+
 // Digits before the point of `magnitude` in [1e-6, 1e15): 0 below 1. A loop of comparisons: its
 // branches are predicted where the count of a column varies little, which computing the count from
 // the binary exponent (a longer chain of dependent steps) was measured to lose to.
@@ -156,9 +176,14 @@ char* FormatValue(double value, char* out)
     const double magnitude = std::fabs(value);
     if (!(magnitude < 1e15 && magnitude >= 1e-6))
         return FormatOtherwise(value, 15, out);
+    std::uint64_t digits = 0;
+    // Below 10^4 with at most four decimals, the commonest measured values: exact at four places,
+    // these are the one decimal of at most fifteen places that reads back, the same the scaling
+    // below finds, so their eight digits are written without counting integer digits first.
+    if (magnitude < 1e4 && ExactAt(magnitude, 4, digits))
+        return WriteFourDecimals(EightDigits(static_cast<std::uint32_t>(digits)), std::signbit(value), out);
     const int integerDigits = IntegerDigits(magnitude);
     const int decimals = 15 - integerDigits;
-    std::uint64_t digits = 0;
     if (!ExactAt(magnitude, decimals, digits))
         return FormatOtherwise(value, decimals, out);
     // The common case: eight significant digits or fewer, all in one word. The digits fill
