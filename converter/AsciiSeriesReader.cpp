@@ -362,6 +362,11 @@ void AsciiSeriesReader::Select(const std::vector<size_t>& items)
     const size_t filled = static_cast<size_t>(
         std::count_if(m_slotOfItem.begin(), m_slotOfItem.end(), [](int slot) { return slot >= 0; }));
     m_everySlotFilled = filled == items.size();
+    m_selectedInFileOrder = m_everySlotFilled && std::is_sorted(items.begin(), items.end()) &&
+                            std::adjacent_find(items.begin(), items.end()) == items.end();
+    m_spans.resize(m_itemCount);
+    m_spanItems.resize(m_itemCount);
+    m_scratch.resize(m_itemCount);
 }
 
 bool AsciiSeriesReader::IsDeleted(std::string_view field) const
@@ -562,11 +567,10 @@ bool AsciiSeriesReader::ReadDataLineByBlocks(std::string_view line, Row& row)
         return false;
     if (!m_stamps->Read(line.substr(0, stampEnd), row.stamp))
         return false;
-    if (m_everySlotFilled)
-        row.values.resize(m_selection.size());
-    else
-        row.values.assign(m_selection.size(), kMissing);
-    double* const values = row.values.data();
+
+    // The fields of the selected items, in the file's order.
+    FieldSpan* const spans = m_spans.data();
+    size_t count = 0;
     const size_t lastItem = m_itemCount - 1;
     size_t start = stampEnd + 1;
     for (size_t item = 0; item <= lastItem; ++item) {
@@ -574,15 +578,34 @@ bool AsciiSeriesReader::ReadDataLineByBlocks(std::string_view line, Row& row)
         // Every item but the last ends at a delimiter, the last at the line's end.
         if ((end == length) != (item == lastItem))
             return false;
-        const char* const field = line.data() + start;
-        const size_t size = end - start;
-        if (size > 0 && field[0] == '"')
+        if (end > start && line[start] == '"')
             return false;
-        const int slot = m_slotOfItem[item];
-        if (slot >= 0 && !ReadFieldValue(field, size, values[slot]))
-            return false;
+        if (m_slotOfItem[item] >= 0) {
+            m_spanItems[count] = item;
+            spans[count++] = FieldSpan{static_cast<std::uint32_t>(start), static_cast<std::uint32_t>(end - start)};
+        }
         start = end + 1;
     }
+
+    if (m_everySlotFilled)
+        row.values.resize(m_selection.size());
+    else
+        row.values.assign(m_selection.size(), kMissing);
+    // In file order the values go straight into the row, else through the scratch row.
+    double* const values = m_selectedInFileOrder ? row.values.data() : m_scratch.data();
+    const bool plainFirst = m_pointDecimals && !m_deleteInUse;
+    for (size_t done = 0; done < count; ++done) {
+        if (plainFirst) {
+            done += m_readPlain(line.data(), spans + done, count - done, values + done);
+            if (done == count)
+                break;
+        }
+        if (!ReadFieldValue(line.data() + spans[done].start, spans[done].length, values[done]))
+            return false;
+    }
+    if (!m_selectedInFileOrder)
+        for (size_t i = 0; i < count; ++i)
+            row.values[static_cast<size_t>(m_slotOfItem[m_spanItems[i]])] = values[i];
     return true;
 }
 

@@ -64,6 +64,11 @@ private:
     bool m_fusedOn = true;
     bool m_blockOn = true;
     bool m_pointDecimals = false;    // "." is the decimal separator
+    bool m_selectedInFileOrder = false; // and the selected items are in the file's order
+    PlainFieldsReader m_readPlain = FastestPlainFieldsReader();
+    std::vector<FieldSpan> m_spans;     // the selected fields of the line being read
+    std::vector<size_t> m_spanItems;    // their items
+    std::vector<double> m_scratch;      // their values, in file order
     bool m_everySlotFilled = false;  // each data line sets every value of the row
     int m_formatColumns = 1; // W: fields the date/time spans
     int m_stampColumn = 1;   // K: field where it starts

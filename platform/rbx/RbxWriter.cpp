@@ -148,7 +148,7 @@ bool CRbxWriter::Open(const CString& path, const FileDefinition& definition)
     }
     s.headerBytes = EncodeHeader(h);
     s.packed.resize(h.recordSize - 8);
-    s.buffer = std::make_unique<unsigned char[]>(kFlushBytes + h.recordSize);
+    s.buffer = std::make_unique_for_overwrite<unsigned char[]>(kFlushBytes + h.recordSize);
     s.allFloat64 = std::all_of(h.items.begin(), h.items.end(), [](const ItemInfo& item) { return item.dataType == kFloat64; });
     if (s.allFloat64)
         for (const ItemInfo& item : h.items)
