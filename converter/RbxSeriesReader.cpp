@@ -1,11 +1,14 @@
 #include "converter/RbxSeriesReader.h"
 
 #include "converter/StampText.h"
+#include "platform/rbx/RbxBytes.h"
 #include "platform/rbx/RbxReader.h"
+#include "platform/rbx/RbxValueCodec.h"
 #include "platform/units/Units.h"
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
 
 namespace converter {
 
@@ -18,6 +21,17 @@ std::string WithoutPath(const std::string& message, const std::string& path)
 {
     const std::string prefix = path + ": ";
     return message.compare(0, prefix.size(), prefix) == 0 ? message.substr(prefix.size()) : message;
+}
+
+// std::llround without the library call where the fraction is exact (below 2^52 the integer part
+// of a double and what remains are exact); the same result everywhere.
+long long RoundHalfAway(double x)
+{
+    if (!(std::fabs(x) < 4503599627370496.0))
+        return std::llround(x);
+    const auto whole = static_cast<long long>(x);
+    const double rest = x - static_cast<double>(whole);
+    return whole + (rest >= 0.5) - (rest <= -0.5);
 }
 } // namespace
 
@@ -48,9 +62,11 @@ Status RbxSeriesReader::Open(const std::string& path)
         return m_status = Status::Fail(path, 0, "the time axis unit " + std::to_string(axis.unitKey) +
                                                     " is not a unit of time in the unit catalogue");
     // The start offset counts in the axis unit from the start date and time.
-    m_start += static_cast<Stamp>(std::llround(axis.startOffset * m_secondsPerUnit));
+    m_start += static_cast<Stamp>(RoundHalfAway(axis.startOffset * m_secondsPerUnit));
 
     m_header = SeriesHeader();
+    m_columns.clear();
+    size_t offset = 8; // after the step's time
     for (const rbx::ItemInfo& item : header.items) {
         if (item.axisType != rbx::kScalarItem || item.elementCount != 1)
             return m_status = Status::Fail(path, 0, "item '" + item.name +
@@ -61,14 +77,14 @@ Status RbxSeriesReader::Open(const std::string& path)
         info.unit = item.unitText;
         info.valueType = rbx::ValueTypeName(item.valueType);
         m_header.items.push_back(info);
-        m_deleteValues.push_back(header.fileType == rbx::kSharedDeleteValue ? header.deleteValue : item.deleteValue);
-        m_singlePrecision.push_back(item.dataType == rbx::kFloat32);
+        const double deleted = header.fileType == rbx::kSharedDeleteValue ? header.deleteValue : item.deleteValue;
+        m_columns.push_back({offset, item.dataType, deleted});
+        offset += rbx::DataTypeSize(item.dataType);
     }
     m_recordSize = header.recordSize;
     const size_t items = std::max<size_t>(1, header.items.size());
     m_blockSteps = std::max<size_t>(1, kValuesPerBlock / items);
-    m_times.resize(m_blockSteps);
-    m_values.resize(m_blockSteps * header.items.size());
+    m_records.resize(m_blockSteps * m_recordSize);
 
     std::vector<size_t> all(header.items.size());
     for (size_t i = 0; i < all.size(); ++i)
@@ -77,10 +93,23 @@ Status RbxSeriesReader::Open(const std::string& path)
     return m_status;
 }
 
+void RbxSeriesReader::Select(const std::vector<size_t>& items)
+{
+    SeriesReader::Select(items);
+    m_selected.clear();
+    for (size_t item : items) {
+        if (item >= m_columns.size() || m_columns[item].dataType != rbx::kFloat64) {
+            m_selected.clear();
+            return;
+        }
+        m_selected.push_back(m_columns[item]);
+    }
+}
+
 bool RbxSeriesReader::FillBlock()
 {
     size_t got = 0;
-    if (!m_reader->ReadSteps(m_blockSteps, m_times.data(), m_values.data(), got)) {
+    if (!m_reader->ReadRawSteps(m_blockSteps, m_records.data(), got)) {
         m_status = Status::Fail(m_path, 0, WithoutPath(m_reader->Error(), m_path) + " (after " + std::to_string(m_stepIndex) + " time steps)");
         return false;
     }
@@ -89,28 +118,39 @@ bool RbxSeriesReader::FillBlock()
     return got > 0;
 }
 
+double RbxSeriesReader::ValueOf(size_t item, const unsigned char* record) const
+{
+    if (item >= m_columns.size())
+        return kMissing;
+    const Column& column = m_columns[item];
+    const double value = rbx::DecodeValue(column.dataType, record + column.offset);
+    // A 32-bit item holds its delete value rounded to float.
+    const bool deleted = column.dataType == rbx::kFloat32
+                             ? static_cast<float>(value) == static_cast<float>(column.deleted)
+                             : value == column.deleted;
+    return deleted ? kMissing : value;
+}
+
 bool RbxSeriesReader::Next(Row& row)
 {
     if (!m_status)
         return false;
     if (m_next == m_inBlock && !FillBlock())
         return false;
-    const size_t itemCount = m_header.items.size();
-    const double* values = m_values.data() + m_next * itemCount;
-    row.stamp = m_start + static_cast<Stamp>(std::llround(m_times[m_next] * m_secondsPerUnit));
+    const unsigned char* record = m_records.data() + m_next * m_recordSize;
+    row.stamp = m_start + static_cast<Stamp>(RoundHalfAway(rbx::bytes::Get<double>(record) * m_secondsPerUnit));
     row.values.resize(m_selection.size());
-    for (size_t slot = 0; slot < m_selection.size(); ++slot) {
-        const size_t item = m_selection[slot];
-        double value = item < itemCount ? values[item] : kMissing;
-        if (item < itemCount) {
-            const double deleted = m_deleteValues[item];
-            const bool isDeleted = m_singlePrecision[item]
-                                       ? static_cast<float>(value) == static_cast<float>(deleted)
-                                       : value == deleted;
-            if (isDeleted)
-                value = kMissing;
+    double* out = row.values.data();
+    if (!m_selected.empty()) {
+        // Every selected item is a 64-bit value: copied, no conversion.
+        for (const Column& column : m_selected) {
+            double value;
+            std::memcpy(&value, record + column.offset, sizeof value);
+            *out++ = value == column.deleted ? kMissing : value;
         }
-        row.values[slot] = value;
+    } else {
+        for (size_t item : m_selection)
+            *out++ = ValueOf(item, record);
     }
     ++m_next;
     ++m_stepIndex;
