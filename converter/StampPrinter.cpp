@@ -1,5 +1,6 @@
 #include "converter/StampText.h"
 
+#include <cstdint>
 #include <cstring>
 
 namespace converter {
@@ -11,6 +12,17 @@ char* TwoDigits(int v, char* out)
     out[1] = static_cast<char>('0' + v % 10);
     return out + 2;
 }
+
+// The texts "00" to "59", the first digit in the lower byte.
+struct ClockPairs {
+    std::uint16_t text[60];
+    constexpr ClockPairs() : text()
+    {
+        for (int n = 0; n < 60; ++n)
+            text[n] = static_cast<std::uint16_t>(('0' + n / 10) | ('0' + n % 10) << 8);
+    }
+};
+constexpr ClockPairs kClockPairs;
 } // namespace
 
 char* FormatStamp(Stamp stamp, char* out)
@@ -48,12 +60,13 @@ char* StampPrinter::Write(Stamp stamp, char* out)
     }
     std::memcpy(out, m_date.data(), m_date.size());
     out += m_date.size();
-    const int seconds = static_cast<int>(rest);
-    out = TwoDigits(seconds / 3600, out);
-    *out++ = ':';
-    out = TwoDigits(seconds / 60 % 60, out);
-    *out++ = ':';
-    return TwoDigits(seconds % 60, out);
+    // "HH:mm:ss" put together in one word and stored at once.
+    const auto seconds = static_cast<unsigned>(rest);
+    const std::uint64_t clock = kClockPairs.text[seconds / 3600] | std::uint64_t{':'} << 16 |
+                                std::uint64_t{kClockPairs.text[seconds / 60 % 60]} << 24 | std::uint64_t{':'} << 40 |
+                                std::uint64_t{kClockPairs.text[seconds % 60]} << 48;
+    std::memcpy(out, &clock, sizeof clock);
+    return out + sizeof clock;
 }
 
 std::string FormatStamp(Stamp stamp)
