@@ -167,7 +167,8 @@ __attribute__((always_inline)) inline size_t ReadPlainFieldsWith(const char* tex
             if (!TakePlainShape(text + span.start, span.length, shape) || !digits(shape, mantissa))
                 break;
             // A minus before the division gives the same value as after it: rounding is symmetric.
-            const double magnitude = static_cast<double>(mantissa);
+            // Below 2^53, so the signed conversion is exact and spares the unsigned one's checks.
+            const double magnitude = static_cast<double>(static_cast<std::int64_t>(mantissa));
             numerators[read] = shape.negative ? -magnitude : magnitude;
             divisors[read] = kPowersOfTen[shape.decimals];
         }
