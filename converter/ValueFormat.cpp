@@ -10,9 +10,6 @@
 namespace converter {
 
 namespace {
-// Sixteen ASCII digits, the first in the lowest byte (__extension__: a 128-bit integer is a GNU one).
-__extension__ typedef unsigned __int128 Digits16;
-
 constexpr std::uint64_t kAsciiZeros = 0x3030303030303030ull;
 
 // The four-digit texts of 0 to 9999, the first digit in the lowest byte (40 KB: looking up two
@@ -33,54 +30,6 @@ constexpr FourDigitTexts kFourDigits;
 [[gnu::always_inline]] inline std::uint64_t EightDigits(std::uint32_t value)
 {
     return kFourDigits.text[value / 10000] | static_cast<std::uint64_t>(kFourDigits.text[value % 10000]) << 32;
-}
-
-Digits16 SixteenDigits(std::uint64_t value)
-{
-    return static_cast<Digits16>(EightDigits(static_cast<std::uint32_t>(value / 100000000))) |
-           static_cast<Digits16>(EightDigits(static_cast<std::uint32_t>(value % 100000000))) << 64;
-}
-
-// How many of the sixteen digits lead with '0' (at least one digit is not '0').
-int LeadingZeros(Digits16 text)
-{
-    const Digits16 values = text - ((static_cast<Digits16>(kAsciiZeros) << 64) | kAsciiZeros);
-    const auto low = static_cast<std::uint64_t>(values);
-    return low ? std::countr_zero(low) / 8 : 8 + std::countr_zero(static_cast<std::uint64_t>(values >> 64)) / 8;
-}
-
-// How many of the sixteen digits end with '0' (at least one digit is not '0').
-int TrailingZeros(Digits16 text)
-{
-    const Digits16 values = text - ((static_cast<Digits16>(kAsciiZeros) << 64) | kAsciiZeros);
-    const auto high = static_cast<std::uint64_t>(values >> 64);
-    return high ? std::countl_zero(high) / 8 : 8 + std::countl_zero(static_cast<std::uint64_t>(values)) / 8;
-}
-
-void Store(Digits16 text, char* out) { std::memcpy(out, &text, sizeof text); }
-
-// Writes the sixteen digits `text` with a point before their last `decimals` digits, without the
-// leading zeros before the integer digit(s) and without the last `decimals - kept` digits (zeros).
-// Built in registers and stored whole; `out` has room for 32 characters.
-char* WriteDigits(Digits16 text, int decimals, int kept, bool negative, char* out)
-{
-    const int first = std::min(LeadingZeros(text), 15 - decimals);
-    *out = '-';
-    out += negative;
-    const Digits16 shown = text >> (8 * first);
-    const int integerDigits = 16 - decimals - first;
-    if (decimals == 0) {
-        Store(shown, out);
-        return out + integerDigits;
-    }
-    // The fraction moves up one place for the point; shifted in two steps as a shift by the full
-    // width is undefined. Sixteen digits and a point are one more than a store: the last digit
-    // follows on its own (past the end when there are fewer).
-    const Digits16 integer = shown & ((static_cast<Digits16>(1) << (8 * integerDigits)) - 1);
-    const Digits16 fraction = ((shown >> (8 * integerDigits)) << 8) << (8 * integerDigits);
-    Store(integer | static_cast<Digits16>('.') << (8 * integerDigits) | fraction, out);
-    out[16] = static_cast<char>(text >> 120);
-    return out + integerDigits + (kept > 0 ? 1 + kept : 0);
 }
 
 // Writes a value of at most eight significant digits: `text` holds them (ASCII, the first in the
@@ -145,23 +94,57 @@ bool ExactAt(double magnitude, int decimals, std::uint64_t& digits)
     return static_cast<double>(rounded) / kPowersOfTen[decimals] == magnitude;
 }
 
-// The value at `decimals` decimals, exactly, from the digits of the fifteen-place scaling: the
-// trailing zeros are counted in the text itself. Beside the common case, and apart from it so that
-// it keeps few registers.
-[[gnu::noinline]] char* WriteFifteenPlaces(std::uint64_t digits, int decimals, bool negative, char* out)
+// Writes fifteen or sixteen places of digits, in two words (the first eight, then the rest), with
+// `integerDigits` (0 to 15) of them before the point and `fractionDigits` after it; with none
+// before the point "0" leads. Each word is stored where it belongs around the point; `out` has
+// room for 32 characters. Apart from the common case, so that the common case keeps few registers.
+[[gnu::noinline]] char* WritePlaces(std::uint64_t first, std::uint64_t rest, int integerDigits, int fractionDigits,
+                                    bool negative, char* out)
 {
-    const Digits16 text = SixteenDigits(digits);
-    return WriteDigits(text, decimals, decimals - std::min(TrailingZeros(text), decimals), negative, out);
+    *out = '-';
+    out += negative;
+    *out = '0';
+    out += integerDigits == 0;
+    std::memcpy(out, &first, 8);
+    if (integerDigits <= 8) {
+        out[integerDigits] = '.';
+        const std::uint64_t tail = integerDigits < 8 ? first >> (8 * integerDigits) : 0;
+        std::memcpy(out + integerDigits + 1, &tail, 8);
+        std::memcpy(out + 9, &rest, 8);
+    } else {
+        std::memcpy(out + 8, &rest, 8);
+        out[integerDigits] = '.';
+        const std::uint64_t tail = rest >> (8 * (integerDigits - 8));
+        std::memcpy(out + integerDigits + 1, &tail, 8);
+    }
+    return out + integerDigits + (fractionDigits > 0 ? 1 + fractionDigits : 0);
+}
+
+// The digits of the fifteen-place scaling (below 10^15), `integerDigits` of them before the
+// point, without the trailing zeros of the fraction.
+char* WriteFifteenPlaces(std::uint64_t digits, int integerDigits, bool negative, char* out)
+{
+    constexpr std::uint64_t kSevenPlaces = 10000000;
+    const std::uint64_t low = digits % kSevenPlaces;
+    const std::uint64_t first = EightDigits(static_cast<std::uint32_t>(digits / kSevenPlaces));
+    const std::uint64_t lowDigits = EightDigits(static_cast<std::uint32_t>(low)); // '0' and seven places
+    const int trailingZeros = low != 0 ? std::countl_zero(lowDigits - kAsciiZeros) / 8
+                                       : 7 + std::countl_zero(first - kAsciiZeros) / 8;
+    return WritePlaces(first, lowDigits >> 8, integerDigits, std::max(0, 15 - integerDigits - trailingZeros), negative,
+                       out);
 }
 
 // NaN, values outside [1e-6, 1e15), and those whose fifteen-place scaling does not divide back.
 [[gnu::noinline]] char* FormatOtherwise(double value, int decimals, char* out)
 {
-    std::uint64_t digits = 0;
-    if (!std::isnan(value) && decimals < 15 && ExactAt(std::fabs(value), ++decimals, digits))
-        return WriteDigits(SixteenDigits(digits), decimals, decimals, std::signbit(value), out);
     if (std::isnan(value))
         return out;
+    // Sixteen places, all of them written: no fifteen-place decimal reads back, so none ends in 0.
+    std::uint64_t digits = 0;
+    if (decimals < 15 && ExactAt(std::fabs(value), ++decimals, digits))
+        return WritePlaces(EightDigits(static_cast<std::uint32_t>(digits / 100000000)),
+                           EightDigits(static_cast<std::uint32_t>(digits % 100000000)), 16 - decimals, decimals,
+                           std::signbit(value), out);
     return std::to_chars(out, out + 32, value).ptr;
 }
 
@@ -186,13 +169,13 @@ char* FormatValue(double value, char* out)
     const int decimals = 15 - integerDigits;
     if (!ExactAt(magnitude, decimals, digits))
         return FormatOtherwise(value, decimals, out);
-    // The common case: eight significant digits or fewer, all in one word. The digits fill
-    // fifteen places, from the first integer digit or from the point.
+    // Eight significant digits or fewer: all in one word. The digits fill fifteen places, from the
+    // first integer digit or from the point.
     constexpr std::uint64_t kSevenPlaces = 10000000;
     if (digits % kSevenPlaces == 0 && integerDigits <= 8)
         return WriteEightOrFewer(EightDigits(static_cast<std::uint32_t>(digits / kSevenPlaces)), integerDigits,
                                  std::signbit(value), out);
-    return WriteFifteenPlaces(digits, decimals, std::signbit(value), out);
+    return WriteFifteenPlaces(digits, integerDigits, std::signbit(value), out);
 }
 
 } // namespace converter
