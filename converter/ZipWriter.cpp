@@ -15,7 +15,6 @@ namespace converter {
 
 namespace {
 
-constexpr size_t kOutputBytes = 256 * 1024;
 constexpr std::uint64_t kZipLimit = 0xFFFFFFFFu;
 constexpr size_t kLocalHeaderBytes = 30;
 constexpr size_t kCentralHeaderBytes = 46;
@@ -54,7 +53,7 @@ void DosNow(std::uint16_t& time, std::uint16_t& date)
 
 } // namespace
 
-ZipWriter::ZipWriter() : m_zip(std::make_unique<z_stream>()) {}
+ZipWriter::ZipWriter(size_t bufferBytes) : m_zip(std::make_unique<z_stream>()), m_out(std::max<size_t>(bufferBytes, 1)) {}
 
 ZipWriter::~ZipWriter()
 {
@@ -86,7 +85,6 @@ Status ZipWriter::Open(const std::string& path)
     if (deflateInit2(m_zip.get(), kLevel, Z_DEFLATED, -15, 8, Z_DEFAULT_STRATEGY) != Z_OK)
         return Fail("cannot start the compressor");
     m_zipReady = true;
-    m_out.resize(kOutputBytes);
     DosNow(m_dosTime, m_dosDate);
     return Status::Ok();
 }

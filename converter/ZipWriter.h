@@ -19,7 +19,8 @@ namespace converter {
 
 class ZipWriter {
 public:
-    ZipWriter();
+    // `bufferBytes`: how much packed output is gathered before each write to the file.
+    explicit ZipWriter(size_t bufferBytes = 256 * 1024);
     ~ZipWriter(); // closes the file if Close was not reached; the caller removes what it left
     ZipWriter(const ZipWriter&) = delete;
     ZipWriter& operator=(const ZipWriter&) = delete;

@@ -34,9 +34,10 @@ std::string Repetitive(size_t size)
 }
 
 // Writes the parts in order; a part whose name ends in '+' is streamed in pieces of 100,000 bytes.
-Status WritePackage(const std::string& path, const std::vector<std::pair<std::string, std::string>>& parts)
+Status WritePackage(const std::string& path, const std::vector<std::pair<std::string, std::string>>& parts,
+                    size_t bufferBytes = 256 * 1024)
 {
-    ZipWriter zip;
+    ZipWriter zip(bufferBytes);
     if (Status opened = zip.Open(path); !opened)
         return opened;
     for (const auto& [name, data] : parts) {
@@ -81,6 +82,32 @@ TEST(ZipWriter, PartsUnpackToWhatWasWritten)
         EXPECT_TRUE(contents.parts.at(stored) == data) << stored;
     }
     EXPECT_LT(bytes.size(), 700000 + 1000003 + 3000000 / 5) << "the repetitive part is packed";
+}
+
+TEST(ZipWriter, SmallOutputBuffersSplitHeadersAndTheirPatchesAcrossWrites)
+{
+    // Over these sizes every header, and every patch of its sizes and CRC, lands partly in the
+    // file and partly in the buffer for some of them.
+    convtest::ScratchFolder folder;
+    const std::vector<std::pair<std::string, std::string>> parts = {
+        {"a", "x"}, {"b+", Repetitive(2000)}, {"c", RandomBytes(1000, 6)}, {"d+", ""}, {"e", Repetitive(777)}, {"f", ""}};
+    for (size_t buffer = 1; buffer <= 64; ++buffer) {
+        const std::string path = folder.Path("small-" + std::to_string(buffer) + ".zip");
+        ASSERT_TRUE(WritePackage(path, parts, buffer)) << buffer;
+        const convtest::ZipContents contents = convtest::Unzip(convtest::ReadFile(path));
+        ASSERT_EQ(contents.error, "") << buffer;
+        EXPECT_TRUE(contents.parts.at("b") == parts[1].second) << buffer;
+        EXPECT_TRUE(contents.parts.at("c") == parts[2].second) << buffer;
+        EXPECT_EQ(contents.parts.at("e"), parts[4].second) << buffer;
+    }
+    ZipWriter zip(5);
+    const std::string path = folder.Path("head.zip");
+    ASSERT_TRUE(zip.Open(path));
+    ASSERT_TRUE(zip.BeginEntry("h", "0123456789"));
+    ASSERT_TRUE(zip.Append(Repetitive(100)));
+    ASSERT_TRUE(zip.EndEntry("abcdefghij"));
+    ASSERT_TRUE(zip.Close());
+    EXPECT_EQ(convtest::Unzip(convtest::ReadFile(path)).parts.at("h"), "abcdefghij" + Repetitive(100));
 }
 
 TEST(ZipWriter, PythonZipfileAcceptsThePackage)
