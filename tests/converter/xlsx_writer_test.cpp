@@ -6,6 +6,7 @@
 #include "converter/ConversionJob.h"
 #include "converter/Converter.h"
 #include "converter/StampText.h"
+#include "converter/XlsxParts.h"
 #include "converter/XlsxSeriesWriter.h"
 #include "platform/spreadsheet/Spreadsheet.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
@@ -339,4 +340,29 @@ TEST(XlsxWriter, WriteFailuresNameTheCauseAndLeaveNoOutput)
     EXPECT_FALSE(report.converted);
     EXPECT_NE(report.problem.message.find("No such file or directory"), std::string::npos) << report.problem.message;
     EXPECT_FALSE(std::filesystem::exists(folder.Path("missing")));
+}
+
+TEST(XlsxWriter, TextsBecomeWellFormedXmlCharacters)
+{
+    const std::pair<std::string, std::string> cases[] = {
+        {"a<b>&\"c'", "a&lt;b&gt;&amp;&quot;c&apos;"},
+        {"tab\tline\nbell\x07nul" + std::string(1, '\0') + "cr\r", "tab\tline\nbell nul cr "},
+        {"caf\xC3\xA9 \xE2\x82\xAC \xF0\x9F\x8C\xA7", "caf\xC3\xA9 \xE2\x82\xAC \xF0\x9F\x8C\xA7"}, // UTF-8 kept
+        {"caf\xE9", "caf\xC3\xA9"},                    // a Latin-1 byte
+        {"\xC0\xAF", "\xC3\x80\xC2\xAF"},              // an overlong form is not UTF-8
+        {"\xED\xA0\x80", "\xC3\xAD\xC2\xA0\xC2\x80"},  // nor is a surrogate
+        {"\xF4\x90\x80\x80", "\xC3\xB4\xC2\x90\xC2\x80\xC2\x80"}, // nor a code point past U+10FFFF
+        {"\xE2\x82", "\xC3\xA2\xC2\x82"},              // a sequence cut short
+        {"\xEF\xBF\xBE\xEF\xBF\xBF\xEF\xBF\xBD", "  \xEF\xBF\xBD"}, // U+FFFE, U+FFFF are no characters
+    };
+    for (const auto& [text, xml] : cases)
+        EXPECT_EQ(xlsx::XmlText(text), xml) << text;
+}
+
+TEST(XlsxWriter, ColumnNamesRunFromAToXFD)
+{
+    const std::pair<unsigned, const char*> cases[] = {{1, "A"},    {26, "Z"},    {27, "AA"},  {52, "AZ"},
+                                                      {53, "BA"},  {702, "ZZ"},  {703, "AAA"}, {16384, "XFD"}};
+    for (const auto& [column, name] : cases)
+        EXPECT_EQ(xlsx::ColumnName(column), name) << column;
 }
