@@ -1,7 +1,9 @@
 // Conversion speed: a generated time-series text (a "YYYY/MM/DD HH:mm:ss" stamp and 10 values a
-// row) converted to rbx0 and back, and to .xlsx, with MB/s, rows/s and the process's peak memory.
+// row) converted to rbx0 and back, and to .xlsx, with MB/s, rows/s and the process's peak memory;
+// and the reading of its values alone.
 // Rows: VELMORA_BENCH_ROWS (default 1,000,000; the .xlsx case takes a tenth).
 #include "converter/Converter.h"
+#include "converter/NumberText.h"
 #include "converter/StampText.h"
 #include "templates/Specification.h"
 
@@ -109,6 +111,66 @@ void TextToXlsx(benchmark::State& state)
     Run(state, converter::Format::Ascii, MakeText(rows), converter::Format::Excel, rows);
 }
 
+// Reading the benchmark's values ("%.4f" of 0 to 1000), ten fields a line: each plain field reader
+// this processor has (argument: its place in the list, the fastest last), and the digit loop.
+struct ValueLines {
+    std::string text;
+    std::vector<converter::FieldSpan> spans;
+};
+
+const ValueLines& MakeValueLines()
+{
+    static const ValueLines lines = [] {
+        ValueLines made;
+        std::mt19937 random(1);
+        std::uniform_real_distribution<double> value(0, 1000);
+        char field[32];
+        for (size_t i = 0; i < 10 * 100000; ++i) {
+            const int length = std::snprintf(field, sizeof field, "%.4f", value(random));
+            made.spans.push_back({static_cast<std::uint32_t>(made.text.size()), static_cast<std::uint32_t>(length)});
+            made.text.append(field, static_cast<size_t>(length));
+            made.text.push_back('\t');
+        }
+        made.text.append(converter::kPlainFieldReach, ' ');
+        return made;
+    }();
+    return lines;
+}
+
+void PlainFields(benchmark::State& state)
+{
+    const ValueLines& lines = MakeValueLines();
+    const auto readers = converter::PlainFieldsReadersOfThisProcessor();
+    const auto choice = static_cast<size_t>(state.range(0));
+    if (choice >= readers.size()) {
+        state.SkipWithError("this processor has no such reader");
+        return;
+    }
+    std::vector<double> values(10);
+    for (auto _ : state)
+        for (size_t line = 0; line < lines.spans.size(); line += 10) {
+            if (readers[choice](lines.text.data(), lines.spans.data() + line, 10, values.data()) != 10)
+                state.SkipWithError("a value did not read");
+            benchmark::DoNotOptimize(values.data());
+        }
+    state.counters["values/s"] = benchmark::Counter(static_cast<double>(lines.spans.size()), benchmark::Counter::kIsIterationInvariantRate);
+}
+
+void DigitLoop(benchmark::State& state)
+{
+    const ValueLines& lines = MakeValueLines();
+    for (auto _ : state)
+        for (const converter::FieldSpan& span : lines.spans) {
+            double value = 0;
+            const char* const field = lines.text.data() + span.start;
+            benchmark::DoNotOptimize(converter::ScanPlainDecimal(field, field + span.length, value));
+            benchmark::DoNotOptimize(value);
+        }
+    state.counters["values/s"] = benchmark::Counter(static_cast<double>(lines.spans.size()), benchmark::Counter::kIsIterationInvariantRate);
+}
+
+BENCHMARK(PlainFields)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
+BENCHMARK(DigitLoop)->Unit(benchmark::kMillisecond);
 BENCHMARK(TextToRbx0)->Unit(benchmark::kMillisecond)->Iterations(3)->UseRealTime();
 BENCHMARK(Rbx0ToText)->Unit(benchmark::kMillisecond)->Iterations(3)->UseRealTime();
 BENCHMARK(TextToXlsx)->Unit(benchmark::kMillisecond)->Iterations(1)->UseRealTime();
