@@ -569,7 +569,10 @@ bool AsciiSeriesReader::ReadDataLineByBlocks(std::string_view line, Row& row)
         return false;
 
     // The fields of the selected items, in the file's order.
+    // (Locals, so that the stores into the spans need not reload them.)
     FieldSpan* const spans = m_spans.data();
+    size_t* const spanItems = m_spanItems.data();
+    const int* const slotOfItem = m_slotOfItem.data();
     size_t count = 0;
     const size_t lastItem = m_itemCount - 1;
     size_t start = stampEnd + 1;
@@ -580,8 +583,8 @@ bool AsciiSeriesReader::ReadDataLineByBlocks(std::string_view line, Row& row)
             return false;
         if (end > start && line[start] == '"')
             return false;
-        if (m_slotOfItem[item] >= 0) {
-            m_spanItems[count] = item;
+        if (slotOfItem[item] >= 0) {
+            spanItems[count] = item;
             spans[count++] = FieldSpan{static_cast<std::uint32_t>(start), static_cast<std::uint32_t>(end - start)};
         }
         start = end + 1;
