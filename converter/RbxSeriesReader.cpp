@@ -33,6 +33,17 @@ long long RoundHalfAway(double x)
     const double rest = x - static_cast<double>(whole);
     return whole + (rest >= 0.5) - (rest <= -0.5);
 }
+
+// Axis time in whole seconds; false beyond 10^17 s (three billion years, far outside any calendar),
+// where a stamp would overflow.
+bool ToSeconds(double time, double secondsPerUnit, Stamp& seconds)
+{
+    const double value = time * secondsPerUnit;
+    if (!(std::fabs(value) <= 1e17))
+        return false;
+    seconds = RoundHalfAway(value);
+    return true;
+}
 } // namespace
 
 RbxSeriesReader::RbxSeriesReader() : m_reader(std::make_unique<rbx::CRbxReader>()) {}
@@ -62,7 +73,10 @@ Status RbxSeriesReader::Open(const std::string& path)
         return m_status = Status::Fail(path, 0, "the time axis unit " + std::to_string(axis.unitKey) +
                                                     " is not a unit of time in the unit catalogue");
     // The start offset counts in the axis unit from the start date and time.
-    m_start += static_cast<Stamp>(RoundHalfAway(axis.startOffset * m_secondsPerUnit));
+    Stamp startOffset = 0;
+    if (!ToSeconds(axis.startOffset, m_secondsPerUnit, startOffset))
+        return m_status = Status::Fail(path, 0, "the time axis start offset lies too far from its start date for a time stamp");
+    m_start += startOffset;
 
     m_header = SeriesHeader();
     m_columns.clear();
@@ -138,7 +152,11 @@ bool RbxSeriesReader::Next(Row& row)
     if (m_next == m_inBlock && !FillBlock())
         return false;
     const unsigned char* record = m_records.data() + m_next * m_recordSize;
-    row.stamp = m_start + static_cast<Stamp>(RoundHalfAway(rbx::bytes::Get<double>(record) * m_secondsPerUnit));
+    Stamp offset = 0;
+    if (!ToSeconds(rbx::bytes::Get<double>(record), m_secondsPerUnit, offset))
+        return Fail(m_path, 0, "the time of step " + std::to_string(m_stepIndex + 1) +
+                                   " lies too far from the start of the time axis for a time stamp");
+    row.stamp = m_start + offset;
     row.values.resize(m_selection.size());
     double* out = row.values.data();
     if (!m_selected.empty()) {

@@ -119,6 +119,30 @@ TEST(RbxSeriesReader, StampsRoundAxisTimesHalfAwayFromZero)
     }
 }
 
+// Times no calendar holds (found by fuzzing: they overflowed the stamp) fail the file, at Open for
+// the axis start and at the step otherwise.
+TEST(RbxSeriesReader, TimesTooFarFromTheAxisStartFail)
+{
+    rbxtest::TempFolder folder;
+    const std::string farStep = folder.File("far_step.rbx0");
+    rbxtest::WriteFile(farStep, rbxtest::Definition({Item("A", rbx::kFloat64)}), {0, 1e17, 2e17}, {{1}, {2}, {3}});
+    RbxSeriesReader reader;
+    ASSERT_TRUE(reader.Open(farStep)) << reader.status().problem().Describe();
+    EXPECT_EQ(ReadAll(reader).size(), 2u);
+    ASSERT_FALSE(reader.status());
+    EXPECT_EQ(reader.status().problem().message,
+              "the time of step 3 lies too far from the start of the time axis for a time stamp");
+
+    rbx::FileDefinition definition = rbxtest::Definition({Item("A", rbx::kFloat64)});
+    definition.startOffset = -1e18;
+    const std::string farStart = folder.File("far_start.rbx0");
+    rbxtest::WriteFile(farStart, definition, {0}, {{1}});
+    RbxSeriesReader atOpen;
+    EXPECT_FALSE(atOpen.Open(farStart));
+    EXPECT_EQ(atOpen.status().problem().message,
+              "the time axis start offset lies too far from its start date for a time stamp");
+}
+
 // Large enough that the checksum is checked at the end, so a damaged step is found while rows come.
 TEST(RbxSeriesReader, RowsCrossBlocksInOrderUntilADamagedStep)
 {
