@@ -1,5 +1,6 @@
 #pragma once
 // What went wrong while converting a file: which file, where in it, and what was expected.
+#include <memory>
 #include <string>
 
 namespace converter {
@@ -14,26 +15,37 @@ struct Problem {
     std::string Describe() const;
 };
 
-// The outcome of a step that can fail: ok, or the first problem found.
+// The outcome of a step that can fail: ok, or the first problem found. An ok status holds no
+// strings, so the steps run once per row (a writer's Write) create and drop it for nothing.
 class Status {
 public:
     Status() = default;
+    Status(const Status& other) : m_problem(other.m_problem ? std::make_unique<Problem>(*other.m_problem) : nullptr) {}
+    Status& operator=(const Status& other)
+    {
+        if (this != &other)
+            m_problem = other.m_problem ? std::make_unique<Problem>(*other.m_problem) : nullptr;
+        return *this;
+    }
+    Status(Status&&) noexcept = default;
+    Status& operator=(Status&&) noexcept = default;
+
     static Status Ok() { return Status(); }
     static Status Fail(std::string file, long line, std::string message, int column = 0)
     {
         Status status;
-        status.m_failed = true;
-        status.m_problem = Problem{std::move(file), line, column, std::move(message)};
+        status.m_problem = std::make_unique<Problem>(Problem{std::move(file), line, column, std::move(message)});
         return status;
     }
 
-    bool ok() const { return !m_failed; }
+    bool ok() const { return !m_problem; }
     explicit operator bool() const { return ok(); }
-    const Problem& problem() const { return m_problem; }
+    // The problem of a failed status; an empty one for an ok status.
+    const Problem& problem() const { return m_problem ? *m_problem : kNoProblem; }
 
 private:
-    bool m_failed = false;
-    Problem m_problem;
+    static inline const Problem kNoProblem{};
+    std::unique_ptr<Problem> m_problem;
 };
 
 } // namespace converter
