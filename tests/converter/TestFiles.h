@@ -1,5 +1,7 @@
 #pragma once
-// Scratch folders and small files for the converter tests.
+// Scratch folders, small files and templates for the converter tests.
+#include "templates/AsciiSpecification.h"
+
 #include <filesystem>
 #include <fstream>
 #include <sstream>
@@ -37,6 +39,18 @@ inline std::string ReadFile(const std::string& path)
     std::stringstream s;
     s << in.rdbuf();
     return s.str();
+}
+
+// A template whose items are described globally, so only names and data come from the file.
+inline CAsciiSpecification GlobalSpec()
+{
+    CAsciiSpecification spec;
+    spec.m_DataDesc.m_nUnitTypeOption = 0;
+    spec.m_DataDesc.m_nUnitOption = 0;
+    spec.m_DataDesc.m_nValueTypeOption = 0;
+    spec.m_DataDesc.m_nItemDescriptionRow = 1;
+    spec.m_DataDesc.m_nStartRow = 2;
+    return spec;
 }
 
 } // namespace convtest

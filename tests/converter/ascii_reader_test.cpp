@@ -35,17 +35,7 @@ Read ReadAll(const CSpecification& spec, const std::string& content)
     return result;
 }
 
-// A template whose items are described globally, so only names and data come from the file.
-CAsciiSpecification GlobalSpec()
-{
-    CAsciiSpecification spec;
-    spec.m_DataDesc.m_nUnitTypeOption = 0;
-    spec.m_DataDesc.m_nUnitOption = 0;
-    spec.m_DataDesc.m_nValueTypeOption = 0;
-    spec.m_DataDesc.m_nItemDescriptionRow = 1;
-    spec.m_DataDesc.m_nStartRow = 2;
-    return spec;
-}
+using convtest::GlobalSpec;
 
 TEST(AsciiSeriesReader, ReadsTheDefaultLayout)
 {

@@ -233,12 +233,7 @@ void ExpectPassesAgree(const CSpecification& spec, const std::string& content,
 
 CAsciiSpecification Spec(const char* delimiter, const char* separator, const char* deleteValue)
 {
-    CAsciiSpecification spec;
-    spec.m_DataDesc.m_nUnitTypeOption = 0;
-    spec.m_DataDesc.m_nUnitOption = 0;
-    spec.m_DataDesc.m_nValueTypeOption = 0;
-    spec.m_DataDesc.m_nItemDescriptionRow = 1;
-    spec.m_DataDesc.m_nStartRow = 2;
+    CAsciiSpecification spec = convtest::GlobalSpec();
     spec.m_strDelimiter = delimiter;
     spec.m_strDefDelimiter = "|";
     spec.m_strDecimalSeparator = separator;

@@ -68,12 +68,7 @@ struct Layout {
 
 CAsciiSpecification MakeSpec(const Layout& layout)
 {
-    CAsciiSpecification spec;
-    spec.m_DataDesc.m_nUnitTypeOption = 0;
-    spec.m_DataDesc.m_nUnitOption = 0;
-    spec.m_DataDesc.m_nValueTypeOption = 0;
-    spec.m_DataDesc.m_nItemDescriptionRow = 1;
-    spec.m_DataDesc.m_nStartRow = 2;
+    CAsciiSpecification spec = convtest::GlobalSpec();
     spec.m_strDelimiter = layout.delimiterName;
     spec.m_strDecimalSeparator = layout.separatorName;
     if (layout.deleteValue) {
