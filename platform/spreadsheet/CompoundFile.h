@@ -1,7 +1,7 @@
 #pragma once
-// A reader of the compound-file container of .xls workbooks, used to check a file before FreeXL
-// reads it: FreeXL trusts directory name lengths and record lengths and overruns its buffers on
-// damaged files. Every failure throws AutomationError naming the file.
+// A reader of the compound-file container of .xls workbooks: the header, the allocation tables,
+// the directory and the streams, every length and sector number checked against the file.
+// Every failure throws AutomationError naming the file.
 #include <cstdint>
 #include <fstream>
 #include <optional>

@@ -1,5 +1,5 @@
 #pragma once
-// Reading workbook files into a stream of cells: .xlsx through liborcus, .xls through FreeXL,
+// Reading workbook files into a stream of cells: .xlsx through liborcus, .xls by our own reader,
 // chosen by the file's content. Every failure is an AutomationError naming the file and why.
 #include "platform/spreadsheet/NumberFormat.h"
 #include "platform/spreadsheet/Spreadsheet.h"
@@ -16,7 +16,6 @@ struct ImportLimits {
     std::uint64_t maxEntryBytes = 512ull << 20;       // one uncompressed part of an .xlsx
     std::uint64_t maxUncompressedBytes = 1024ull << 20; // all parts together
     std::uint64_t maxCompressionRatio = 400;          // beyond this a large part is a zip bomb
-    std::uint64_t maxXlsSheetCells = 4u << 20;        // rows x columns of one .xls sheet
     int maxColumns = 16384;                           // XFD
     int maxRows = 1048576;
 };

@@ -1,18 +1,14 @@
-// .xls (BIFF8 in a compound file) through FreeXL. FreeXL gives each cell's value and tells dates,
-// date-times and times apart, but not the number format itself; those three show with fixed
-// formats of our own (see docs/spreadsheet.md).
+// .xls workbooks: BIFF5 or BIFF8 record streams in a compound file, read record by record. The
+// globals come first (code page, date system, number formats, cell styles, sheet list, shared
+// texts); each sheet's cells follow in its own part of the stream, which the sheet list points to.
 #include "platform/spreadsheet/WorkbookImport.h"
 
+#include "platform/spreadsheet/BiffStream.h"
 #include "platform/spreadsheet/CompoundFile.h"
 
-#include "platform/system/OleDateTime.h"
-
-#include <freexl.h>
-
 #include <cstdint>
-#include <cstdio>
-#include <cstring>
 #include <fstream>
+#include <map>
 #include <optional>
 #include <utility>
 #include <vector>
@@ -21,122 +17,356 @@ namespace sheet {
 
 namespace {
 
-const char* const kDateCode = "m/d/yyyy";
-const char* const kDateTimeCode = "m/d/yyyy h:mm:ss";
-const char* const kTimeCode = "h:mm:ss";
-
-std::string FreeXlWhy(int code)
-{
-    switch (code) {
-    case FREEXL_FILE_NOT_FOUND: return "the file does not exist.";
-    case FREEXL_INSUFFICIENT_MEMORY: return "not enough memory to read the workbook.";
-    case FREEXL_BIFF_WORKBOOK_NOT_FOUND: return "the compound file holds no workbook stream.";
-    case FREEXL_BIFF_INVALID_BOF: return "the workbook stream is damaged (bad BOF record).";
-    case FREEXL_BIFF_INVALID_SST:
-    case FREEXL_BIFF_ILLEGAL_SST_INDEX: return "the workbook's shared string table is damaged.";
-    case FREEXL_UNSUPPORTED_CHARSET:
-    case FREEXL_INVALID_CHARACTER: return "the workbook's text uses a character set that cannot be read.";
-    case FREEXL_CRAFTED_FILE: return "the workbook is damaged (inconsistent records).";
-    default: return "the compound file is damaged (error " + std::to_string(code) + ").";
-    }
-}
-
-class Handle {
-public:
-    ~Handle()
-    {
-        if (m_handle != nullptr)
-            freexl_close(m_handle);
-    }
-    const void* m_handle = nullptr;
+enum RecordId : unsigned {
+    kFormula = 0x0006,
+    kEof = 0x000A,
+    kDateMode = 0x0022,
+    kFilePass = 0x002F,
+    kCodePage = 0x0042,
+    kBoundSheet = 0x0085,
+    kMulRk = 0x00BD,
+    kMulBlank = 0x00BE,
+    kSst = 0x00FC,
+    kLabelSst = 0x00FD,
+    kRString = 0x00D6,
+    kXf = 0x00E0,
+    kBlank = 0x0201,
+    kNumber = 0x0203,
+    kLabel = 0x0204,
+    kBoolErr = 0x0205,
+    kString = 0x0207,
+    kRk = 0x027E,
+    kFormat = 0x041E,
+    kBof = 0x0809,
 };
 
-void Check(int code, const std::string& path)
+// BOF records of Excel 4.0 and older, whose cell records differ from these.
+bool IsOldBof(unsigned id) { return id == 0x0009 || id == 0x0209 || id == 0x0409; }
+
+// Days from 30 December 1899 to 1 January 1904, where the 1904 date system counts from.
+constexpr double k1904Offset = 1462;
+
+struct SheetEntry {
+    std::string name;
+    std::uint32_t offset = 0; // of the sheet's BOF record
+};
+
+class XlsReader {
+public:
+    XlsReader(const std::string& path, BiffStream& stream, ImportSink& sink, StyleTable& styles, const ImportLimits& limits)
+        : m_path(path), m_stream(stream), m_sink(sink), m_styles(styles), m_limits(limits) {}
+
+    void ReadGlobals();
+    void ReadSheets();
+
+private:
+    void ReadGlobalRecord(const BiffRecord& record);
+    void ReadSharedTexts(const BiffRecord& record);
+    void SetStyles();
+    void ReadSheet(int index);
+    void ReadCellRecord(const BiffRecord& record, int sheet);
+    void ReadFormula(BiffCursor& body, ImportedCell& cell, int sheet);
+    ImportedCell CellAt(BiffCursor& body, const BiffRecord& record);
+    void Emit(int sheet, ImportedCell& cell);
+
+    // Runs `read` over a record, turning a short record into a message that locates it.
+    template <typename Read>
+    void Guarded(const BiffRecord& record, Read read);
+
+    const std::string& m_path;
+    BiffStream& m_stream;
+    ImportSink& m_sink;
+    StyleTable& m_styles;
+    const ImportLimits& m_limits;
+
+    BiffTextForm m_textForm;
+    bool m_date1904 = false;
+    std::map<unsigned, std::string> m_formatCodes; // by format id
+    std::vector<unsigned> m_xfFormats;             // format id of each cell style
+    std::vector<bool> m_dateStyles;
+    std::vector<std::string> m_sharedTexts;
+    std::vector<SheetEntry> m_sheets;
+    std::optional<ImportedCell> m_formulaAwaitingText;
+};
+
+template <typename Read>
+void XlsReader::Guarded(const BiffRecord& record, Read read)
 {
-    if (code != FREEXL_OK)
-        throw OpenError(path, FreeXlWhy(code));
+    try {
+        read();
+    } catch (const BiffCursor::Short& s) {
+        m_stream.Fail(record, s.inText ? "holds a text longer than itself" : "is shorter than its content");
+    } catch (const BiffCursor::ForeignCodePage& c) {
+        throw OpenError(m_path, "the workbook's texts are in code page " + std::to_string(c.codePage) +
+                                    ", which cannot be read; save it as .xlsx.");
+    }
 }
 
-// FreeXL answers some damaged streams with success and no handle.
-void CheckOpened(int code, const Handle& handle, const std::string& path)
+void XlsReader::ReadGlobals()
 {
-    Check(code, path);
-    if (handle.m_handle == nullptr)
-        throw OpenError(path, "the workbook stream is damaged (unexpected records).");
+    BiffRecord record;
+    const bool any = m_stream.Next(record);
+    if (any && IsOldBof(record.id))
+        throw OpenError(m_path, "the workbook is in the format of Excel 4.0 or older, which is not read; save it as .xlsx.");
+    if (!any || record.id != kBof)
+        m_stream.Fail("it does not start with a BOF record");
+    Guarded(record, [&] {
+        BiffCursor body(record.body);
+        m_textForm.biff8 = body.U16() != 0x0500;
+    });
+    while (m_stream.Next(record)) {
+        if (record.id == kEof) {
+            SetStyles();
+            return;
+        }
+        Guarded(record, [&] { ReadGlobalRecord(record); });
+    }
+    m_stream.Fail("it ends before the workbook's globals do");
 }
 
-unsigned Le16(const unsigned char* p) { return p[0] | p[1] << 8; }
-
-std::uint32_t Le32(const unsigned char* p)
+void XlsReader::ReadGlobalRecord(const BiffRecord& record)
 {
-    return static_cast<std::uint32_t>(Le16(p)) | static_cast<std::uint32_t>(Le16(p + 2)) << 16;
+    BiffCursor body(record.body);
+    switch (record.id) {
+    case kFilePass:
+        throw OpenError(m_path, "the workbook is password-protected.");
+    case kCodePage:
+        m_textForm.codePage = body.U16();
+        break;
+    case kDateMode:
+        m_date1904 = body.U16() == 1;
+        break;
+    case kFormat: {
+        const unsigned id = body.U16();
+        m_formatCodes[id] = body.Text(m_textForm, m_textForm.biff8 ? 2 : 1);
+        break;
+    }
+    case kXf:
+        body.U16(); // font
+        m_xfFormats.push_back(body.U16());
+        break;
+    case kBoundSheet: {
+        SheetEntry sheet;
+        sheet.offset = body.U32();
+        body.U8(); // visibility: hidden sheets are read too
+        const unsigned type = body.U8();
+        sheet.name = body.Text(m_textForm, 1);
+        if (type == 0) // charts, macro sheets and modules hold no cells
+            m_sheets.push_back(std::move(sheet));
+        break;
+    }
+    case kSst:
+        ReadSharedTexts(record);
+        break;
+    default:
+        break;
+    }
 }
 
-// Whether a string of `count` characters starting at `at` (after its option byte, whose bit 0
-// means two bytes per character) fits a record of `length` bytes.
-bool StringFits(const std::vector<unsigned char>& stream, size_t body, unsigned length, unsigned at, unsigned count)
+void XlsReader::ReadSharedTexts(const BiffRecord& record)
 {
-    if (at >= length)
-        return count == 0;
-    const unsigned width = (stream[body + at] & 1) ? 2 : 1;
-    return at + 1 + static_cast<std::uint64_t>(count) * width <= length;
+    BiffCursor body = m_stream.Continued(record);
+    body.U32(); // references to the texts in the workbook
+    const std::uint32_t count = body.U32();
+    // Every text takes at least three bytes, so a damaged count cannot reserve much.
+    m_sharedTexts.reserve(std::min<std::size_t>(count, record.body.size() / 3 + 1));
+    for (std::uint32_t i = 0; i < count; ++i)
+        m_sharedTexts.push_back(body.Text(m_textForm, 2));
 }
 
-// A sheet's DIMENSION record: first row, row past the last, first column, column past the last
-// (rows in 32 bits in BIFF8, 16 bits in older streams). FreeXL works through the whole declared
-// grid, so a grid larger than the format allows costs seconds on a tiny file.
-bool DimensionFits(const std::vector<unsigned char>& stream, size_t body, unsigned length)
+// Each cell style shows numbers with its format: a FORMAT record's code, else a built-in one.
+void XlsReader::SetStyles()
 {
-    std::uint64_t firstRow = 0, endRow = 0;
-    unsigned firstColumn = 0, endColumn = 0;
-    const unsigned char* p = &stream[body];
-    if (length >= 14) {
-        firstRow = Le32(p), endRow = Le32(p + 4), firstColumn = Le16(p + 8), endColumn = Le16(p + 10);
-    } else if (length >= 8) {
-        firstRow = Le16(p), endRow = Le16(p + 2), firstColumn = Le16(p + 4), endColumn = Le16(p + 6);
+    std::map<unsigned, NumberFormat> formats;
+    m_dateStyles.assign(m_xfFormats.size(), false);
+    for (std::size_t xf = 0; xf < m_xfFormats.size(); ++xf) {
+        const unsigned id = m_xfFormats[xf];
+        auto known = formats.find(id);
+        if (known == formats.end()) {
+            auto code = m_formatCodes.find(id);
+            known = formats.emplace(id, NumberFormat(code != m_formatCodes.end() ? code->second : NumberFormat::BuiltinCode(static_cast<int>(id)))).first;
+        }
+        m_styles.Set(static_cast<unsigned>(xf), known->second);
+        m_dateStyles[xf] = known->second.IsDateTime();
+    }
+}
+
+void XlsReader::ReadSheets()
+{
+    for (const SheetEntry& sheet : m_sheets)
+        m_sink.AddSheet(sheet.name);
+    for (std::size_t s = 0; s < m_sheets.size(); ++s) {
+        ReadSheet(static_cast<int>(s));
+        m_sink.EndSheet(static_cast<int>(s));
+    }
+}
+
+void XlsReader::ReadSheet(int index)
+{
+    const SheetEntry& sheet = m_sheets[static_cast<std::size_t>(index)];
+    BiffRecord record;
+    if (!m_stream.Seek(sheet.offset) || !m_stream.Next(record) || record.id != kBof)
+        m_stream.Fail("the sheet '" + sheet.name + "' does not start at byte " + std::to_string(sheet.offset) +
+                      " as the sheet list says");
+    m_formulaAwaitingText.reset();
+    // Charts embedded in a sheet bring their own BOF ... EOF inside it.
+    int depth = 1;
+    while (m_stream.Next(record)) {
+        if (record.id == kBof) {
+            ++depth;
+        } else if (record.id == kEof) {
+            if (--depth == 0)
+                return;
+        } else if (depth == 1) {
+            ReadCellRecord(record, index);
+        }
+    }
+    m_stream.Fail("the sheet '" + sheet.name + "' ends without its EOF record");
+}
+
+ImportedCell XlsReader::CellAt(BiffCursor& body, const BiffRecord& record)
+{
+    ImportedCell cell;
+    cell.row = body.U16() + 1;
+    cell.column = body.U16() + 1;
+    if (cell.column > m_limits.maxColumns)
+        m_stream.Fail(record, "places a cell in column " + std::to_string(cell.column) + ", outside the sheet's grid");
+    cell.style = body.U16();
+    return cell;
+}
+
+void XlsReader::Emit(int sheet, ImportedCell& cell)
+{
+    if (cell.type == Variant::Number && m_date1904 && cell.style < m_dateStyles.size() && m_dateStyles[cell.style])
+        cell.number += k1904Offset;
+    m_sink.AddCell(sheet, cell);
+}
+
+void XlsReader::ReadCellRecord(const BiffRecord& record, int sheet)
+{
+    if (record.id == kString) {
+        if (m_formulaAwaitingText) {
+            ImportedCell cell = *std::exchange(m_formulaAwaitingText, std::nullopt);
+            Guarded(record, [&] { cell.text = m_stream.Continued(record).Text(m_textForm, 2); });
+            Emit(sheet, cell);
+        }
+        return;
+    }
+    Guarded(record, [&] {
+        BiffCursor body(record.body);
+        switch (record.id) {
+        case kNumber: {
+            ImportedCell cell = CellAt(body, record);
+            cell.type = Variant::Number;
+            cell.number = body.F64();
+            Emit(sheet, cell);
+            break;
+        }
+        case kRk: {
+            ImportedCell cell = CellAt(body, record);
+            cell.type = Variant::Number;
+            cell.number = RkValue(body.U32());
+            Emit(sheet, cell);
+            break;
+        }
+        case kMulRk:
+        case kMulBlank: {
+            // Row, first column, then a run of cells (style and RK value, or style only), last column.
+            const bool blank = record.id == kMulBlank;
+            const std::size_t each = blank ? 2 : 6;
+            const std::size_t count = record.body.size() >= 6 ? (record.body.size() - 6) / each : 0;
+            ImportedCell cell = CellAt(body, record);
+            for (std::size_t i = 0; i < count; ++i, ++cell.column) {
+                if (cell.column > m_limits.maxColumns)
+                    m_stream.Fail(record, "places a cell in column " + std::to_string(cell.column) + ", outside the sheet's grid");
+                if (i > 0)
+                    cell.style = body.U16();
+                cell.type = blank ? Variant::Empty : Variant::Number;
+                if (!blank)
+                    cell.number = RkValue(body.U32());
+                Emit(sheet, cell);
+            }
+            break;
+        }
+        case kBlank: {
+            ImportedCell cell = CellAt(body, record);
+            Emit(sheet, cell);
+            break;
+        }
+        case kLabelSst: {
+            ImportedCell cell = CellAt(body, record);
+            const std::uint32_t index = body.U32();
+            if (index >= m_sharedTexts.size())
+                m_stream.Fail(record, "refers to shared text " + std::to_string(index) + " of " +
+                                          std::to_string(m_sharedTexts.size()));
+            cell.type = Variant::Text;
+            cell.text = m_sharedTexts[index];
+            Emit(sheet, cell);
+            break;
+        }
+        case kLabel:
+        case kRString: {
+            ImportedCell cell = CellAt(body, record);
+            cell.type = Variant::Text;
+            cell.text = body.Text(m_textForm, 2);
+            Emit(sheet, cell);
+            break;
+        }
+        case kBoolErr: {
+            ImportedCell cell = CellAt(body, record);
+            const unsigned value = body.U8();
+            if (body.U8() != 0) {
+                cell.type = Variant::Error;
+                cell.text = BiffErrorText(value);
+            } else {
+                cell.type = Variant::Boolean;
+                cell.number = value != 0 ? 1 : 0;
+            }
+            Emit(sheet, cell);
+            break;
+        }
+        case kFormula: {
+            ImportedCell cell = CellAt(body, record);
+            ReadFormula(body, cell, sheet);
+            break;
+        }
+        default:
+            break;
+        }
+    });
+}
+
+// A formula cell shows its last result: a number, or when the top two bytes are FF FF a typed
+// result; a text result comes in the STRING record that follows.
+void XlsReader::ReadFormula(BiffCursor& body, ImportedCell& cell, int sheet)
+{
+    unsigned char result[8];
+    for (unsigned char& b : result)
+        b = body.U8();
+    m_formulaAwaitingText.reset();
+    if (result[6] != 0xFF || result[7] != 0xFF) {
+        BiffCursor number(std::span<const unsigned char>(result, 8));
+        cell.type = Variant::Number;
+        cell.number = number.F64();
+    } else if (result[0] == 0) {
+        cell.type = Variant::Text;
+        m_formulaAwaitingText = cell;
+        return;
+    } else if (result[0] == 1) {
+        cell.type = Variant::Boolean;
+        cell.number = result[2] != 0 ? 1 : 0;
+    } else if (result[0] == 2) {
+        cell.type = Variant::Error;
+        cell.text = BiffErrorText(result[2]);
+    } else if (result[0] == 3) {
+        cell.type = Variant::Text;
     } else {
-        return false;
+        return;
     }
-    return firstRow <= endRow && endRow <= 65536 && firstColumn <= endColumn && endColumn <= 256;
+    Emit(sheet, cell);
 }
 
-// FreeXL copies records into a buffer of the largest BIFF8 record (8224 bytes) and trusts the
-// string lengths of FORMAT, BOUNDSHEET and LABEL records: check both before it reads.
-void CheckRecords(const std::string& path, const std::vector<unsigned char>& stream)
-{
-    size_t at = 0;
-    bool dimensionSeen = false;
-    for (unsigned n = 1; at + 4 <= stream.size(); ++n) {
-        const unsigned id = Le16(&stream[at]);
-        const unsigned length = Le16(&stream[at + 2]);
-        const size_t body = at + 4;
-        const std::string where = "record " + std::to_string(n) + " at byte " + std::to_string(at);
-        if (length > 8224)
-            throw OpenError(path, "the workbook stream is damaged (" + where + " is longer than a record may be).");
-        if (body + length > stream.size())
-            throw OpenError(path, "the workbook stream is damaged (" + where + " is cut short).");
-        bool fits = true;
-        if (id == 0x041E && length >= 4) // FORMAT: id, count, options, characters
-            fits = StringFits(stream, body, length, 4, Le16(&stream[body + 2]));
-        else if (id == 0x0085 && length >= 7) // BOUNDSHEET: position, state, type, count, options
-            fits = StringFits(stream, body, length, 7, stream[body + 6]);
-        else if (id == 0x0204 && length >= 8) // LABEL: row, column, format, count, options
-            fits = StringFits(stream, body, length, 8, Le16(&stream[body + 6]));
-        if (!fits)
-            throw OpenError(path, "the workbook stream is damaged (" + where + " holds a text longer than itself).");
-        if (id == 0x0200 && !DimensionFits(stream, body, length))
-            throw OpenError(path, "the workbook stream is damaged (" + where + " sizes its sheet beyond 65536 rows by 256 columns).");
-        // FreeXL allocates a sheet's cells at its DIMENSION record; a second one corrupts its heap.
-        if (id == 0x0809)
-            dimensionSeen = false;
-        else if (id == 0x0200 && std::exchange(dimensionSeen, true))
-            throw OpenError(path, "the workbook stream is damaged (" + where + " sizes its sheet a second time).");
-        at = body + length;
-    }
-}
-
-// Checks the container and the workbook stream before FreeXL reads them.
-void CheckContainer(const std::string& path)
+std::vector<unsigned char> WorkbookStream(const std::string& path)
 {
     CompoundFile file(path);
     if (file.Find("EncryptedPackage"))
@@ -146,90 +376,7 @@ void CheckContainer(const std::string& path)
         workbook = file.Find("Book");
     if (!workbook)
         throw OpenError(path, "the compound file holds no workbook stream.");
-    CheckRecords(path, file.Read(*workbook));
-}
-
-// FreeXL keeps every cell of a sheet in memory at once: refuse sheets whose grid is too big
-// before it allocates them. The metadata-only open reads no cells.
-void CheckDimensions(const std::string& path, const ImportLimits& limits)
-{
-    Handle info;
-    CheckOpened(freexl_open_info(path.c_str(), &info.m_handle), info, path);
-    unsigned sheets = 0;
-    Check(freexl_get_info(info.m_handle, FREEXL_BIFF_SHEET_COUNT, &sheets), path);
-    for (unsigned s = 0; s < sheets; ++s) {
-        unsigned rows = 0;
-        unsigned short columns = 0;
-        if (freexl_select_active_worksheet(info.m_handle, static_cast<unsigned short>(s)) != FREEXL_OK ||
-            freexl_worksheet_dimensions(info.m_handle, &rows, &columns) != FREEXL_OK)
-            continue;
-        if (static_cast<std::uint64_t>(rows) * columns > limits.maxXlsSheetCells)
-            throw OpenError(path, "sheet " + std::to_string(s + 1) + " spans " + std::to_string(rows) + " rows by " +
-                                      std::to_string(columns) + " columns, more cells than a workbook preview reads.");
-    }
-}
-
-bool ParseIsoDate(const char* text, int& year, int& month, int& day)
-{
-    return text != nullptr && std::sscanf(text, "%d-%d-%d", &year, &month, &day) == 3;
-}
-
-bool ParseIsoTime(const char* text, int& hour, int& minute, int& second)
-{
-    return text != nullptr && std::sscanf(text, "%d:%d:%d", &hour, &minute, &second) == 3;
-}
-
-double SerialOf(int year, int month, int day) { return static_cast<double>(DaysFromCivil(year, month, day)); }
-double FractionOf(int hour, int minute, int second) { return (hour * 3600.0 + minute * 60.0 + second) / 86400.0; }
-
-struct DateStyles {
-    unsigned date, dateTime, time;
-};
-
-// Fills `cell` from FreeXL's value; false for an empty cell.
-bool ToCell(const FreeXL_CellValue& value, const DateStyles& styles, ImportedCell& cell)
-{
-    int y = 0, mo = 0, d = 0, h = 0, mi = 0, s = 0;
-    switch (value.type) {
-    case FREEXL_CELL_INT:
-        cell.type = Variant::Number;
-        cell.number = value.value.int_value;
-        return true;
-    case FREEXL_CELL_DOUBLE:
-        cell.type = Variant::Number;
-        cell.number = value.value.double_value;
-        return true;
-    case FREEXL_CELL_TEXT:
-    case FREEXL_CELL_SST_TEXT:
-        cell.type = Variant::Text;
-        cell.text = value.value.text_value != nullptr ? value.value.text_value : "";
-        return true;
-    case FREEXL_CELL_DATE:
-        if (!ParseIsoDate(value.value.text_value, y, mo, d))
-            return false;
-        cell.type = Variant::Number;
-        cell.number = SerialOf(y, mo, d);
-        cell.style = styles.date;
-        return true;
-    case FREEXL_CELL_DATETIME:
-        if (!ParseIsoDate(value.value.text_value, y, mo, d))
-            return false;
-        if (const char* blank = std::strchr(value.value.text_value, ' '))
-            ParseIsoTime(blank + 1, h, mi, s);
-        cell.type = Variant::Number;
-        cell.number = SerialOf(y, mo, d) + FractionOf(h, mi, s);
-        cell.style = styles.dateTime;
-        return true;
-    case FREEXL_CELL_TIME:
-        if (!ParseIsoTime(value.value.text_value, h, mi, s))
-            return false;
-        cell.type = Variant::Number;
-        cell.number = FractionOf(h, mi, s);
-        cell.style = styles.time;
-        return true;
-    default:
-        return false;
-    }
+    return file.Read(*workbook);
 }
 
 } // namespace
@@ -240,43 +387,10 @@ void ImportXls(const std::string& path, ImportSink& sink, StyleTable& styles, co
     if (probe && static_cast<std::uint64_t>(probe.tellg()) > limits.maxFileBytes)
         throw OpenError(path, "the file is larger than " + std::to_string(limits.maxFileBytes >> 20) + " MiB.");
     probe.close();
-    CheckContainer(path);
-    CheckDimensions(path, limits);
-
-    Handle workbook;
-    CheckOpened(freexl_open(path.c_str(), &workbook.m_handle), workbook, path);
-    unsigned password = 0;
-    if (freexl_get_info(workbook.m_handle, FREEXL_BIFF_PASSWORD, &password) == FREEXL_OK && password == FREEXL_BIFF_OBFUSCATED)
-        throw OpenError(path, "the workbook is password-protected.");
-    DateStyles dateStyles{styles.Add(NumberFormat(kDateCode)), styles.Add(NumberFormat(kDateTimeCode)),
-                          styles.Add(NumberFormat(kTimeCode))};
-
-    unsigned sheets = 0;
-    Check(freexl_get_info(workbook.m_handle, FREEXL_BIFF_SHEET_COUNT, &sheets), path);
-    for (unsigned s = 0; s < sheets; ++s) {
-        const char* name = nullptr;
-        Check(freexl_get_worksheet_name(workbook.m_handle, static_cast<unsigned short>(s), &name), path);
-        sink.AddSheet(name != nullptr ? name : "");
-    }
-    for (unsigned s = 0; s < sheets; ++s) {
-        Check(freexl_select_active_worksheet(workbook.m_handle, static_cast<unsigned short>(s)), path);
-        unsigned rows = 0;
-        unsigned short columns = 0;
-        Check(freexl_worksheet_dimensions(workbook.m_handle, &rows, &columns), path);
-        for (unsigned r = 0; r < rows; ++r) {
-            for (unsigned short c = 0; c < columns; ++c) {
-                FreeXL_CellValue value;
-                if (freexl_get_cell_value(workbook.m_handle, r, c, &value) != FREEXL_OK)
-                    continue;
-                ImportedCell cell;
-                cell.row = static_cast<int>(r) + 1;
-                cell.column = c + 1;
-                if (ToCell(value, dateStyles, cell))
-                    sink.AddCell(static_cast<int>(s), cell);
-            }
-        }
-        sink.EndSheet(static_cast<int>(s));
-    }
+    BiffStream stream(path, WorkbookStream(path));
+    XlsReader reader(path, stream, sink, styles, limits);
+    reader.ReadGlobals();
+    reader.ReadSheets();
 }
 
 } // namespace sheet

@@ -82,7 +82,7 @@ TEST(WorkbookReader, ReadsXlsAlike)
     EXPECT_EQ(reader.SheetNames(), std::vector<std::string>{"Stamps"});
     std::vector<Row> rows = ReadAll(reader, 1);
     ASSERT_EQ(rows.size(), 4u);
-    EXPECT_EQ(rows[1].cells[0].text, "5/17/2021 1:02:03");
+    EXPECT_EQ(rows[1].cells[0].text, "2021/05/17 01:02:03");
     EXPECT_EQ(rows[3].cells[1].text, "14:00:00");
 }
 

@@ -220,22 +220,173 @@ def make_xls_files():
     lost = bytearray(full)
     lost[48:52] = b"\xff\xff\xff\xff"
     write("lost-directory.xls", bytes(lost))
-    # Records FreeXL would overrun: one longer than a BIFF8 record may be, one whose text is
-    # longer than the record holding it.
+    # A record longer than a BIFF8 record may be, and a text longer than the record holding it.
     long_record = bof(0x0005) + record(0x0087, b"\0" * 9000) + record(0x000A)
     write("long-record.xls", compound_file([("Workbook", long_record.ljust(MINI_CUTOFF, b"\0"))]))
     long_text = bof(0x0005) + record(0x041E, struct.pack("<HHB", 164, 0xFFFF, 0) + b"0.00") + record(0x000A)
     write("long-text.xls", compound_file([("Workbook", long_text.ljust(MINI_CUTOFF, b"\0"))]))
-    # A sheet sized twice, and a sheet sized beyond the format's grid.
-    def one_sheet(dimensions):
-        body = bof(0x0010) + b"".join(record(0x0200, d) for d in dimensions) + record(0x000A)
-        head = globals_records(["Data"], [], [0])
-        head = globals_records(["Data"], [], [len(head)])
-        return compound_file([("Workbook", (head + body).ljust(MINI_CUTOFF, b"\0"))])
-    write("two-dimensions.xls", one_sheet([struct.pack("<IIHHH", 0, 1, 0, 1, 0)] * 2))
-    write("huge-dimension.xls", one_sheet([struct.pack("<IIHHH", 0, 0, 0xFFFF, 0xFFFF, 0)]))
     # The compound file is sound but holds no workbook stream.
     write("no-workbook.xls", compound_file([("Something", b"\0" * 4096)]))
+
+
+# ----------------------------------------------------------------------------------------------
+# Workbooks exercising each kind of record the .xls reader takes, and damage it must report.
+
+def text8(text, count_bytes=2):
+    """A BIFF8 text: count, option byte, then one byte per character when every character
+    fits one, else UTF-16."""
+    units = text.encode("utf-16-le")
+    count = len(units) // 2
+    head = struct.pack("<H" if count_bytes == 2 else "<B", count)
+    if all(ord(c) < 256 for c in text):
+        return head + b"\0" + text.encode("latin-1")
+    return head + b"\1" + units
+
+
+def cell_head(row, col, xf_index):
+    return struct.pack("<HHH", row, col, xf_index)
+
+
+def rk_int(value):
+    return ((value << 2) | 2) & 0xFFFFFFFF
+
+
+def formula(row, col, xf_index, result):
+    return record(0x0006, cell_head(row, col, xf_index) + result + struct.pack("<HIH", 0, 0, 0))
+
+
+def typed_result(kind, value=0):
+    return struct.pack("<BBBBBBH", kind, 0, value, 0, 0, 0, 0xFFFF)
+
+
+def shared_texts_records():
+    """An SST of seven texts spread over the SST record and three CONTINUE records: a text whose
+    characters go on in the next record with a fresh option byte (and switch to two bytes each),
+    texts with formatting runs and phonetic data, a surrogate pair, a header that ends a record
+    with its characters in the next, and a text starting a record."""
+    body = struct.pack("<II", 7, 7)
+    body += text8("Flow")
+    body += struct.pack("<HB", 8, 0) + b"Pegel "                 # 8 characters, 6 here
+    first = b"\1" + "水位".encode("utf-16-le")                    # the other 2, two bytes each
+    first += struct.pack("<HBH", 4, 0x08, 2) + b"rich" + b"\0" * 8   # two formatting runs
+    first += struct.pack("<HBI", 3, 0x04, 6) + b"ext" + b"\0" * 6    # phonetic data
+    first += text8("😀 Q")
+    first += struct.pack("<HB", 5, 0)                            # header only
+    second = b"\0" + b"Ende!"
+    third = text8("last")
+    return record(0x00FC, body) + record(0x003C, first) + record(0x003C, second) + record(0x003C, third)
+
+
+SHARED_TEXTS = ["Flow", "Pegel 水位", "rich", "ext", "😀 Q", "Ende!", "last"]
+XF_CUSTOM = 20
+
+
+def feature_globals(offsets, date1904=False):
+    out = bof(0x0005)
+    out += record(0x0042, struct.pack("<H", 1200))
+    out += record(0x0022, struct.pack("<H", 1 if date1904 else 0))
+    out += record(0x041E, struct.pack("<H", 164) + text8("yyyy/mm/dd hh:mm:ss"))
+    out += record(0x041E, struct.pack("<H", 165) + text8("0.000"))
+    for _ in range(15):
+        out += xf(0, True)
+    out += xf(0, False) + xf(14, False) + xf(164, False) + xf(21, False) + xf(2, False) + xf(165, False)
+    # A worksheet, a chart sheet (no cells, not listed) and a hidden worksheet.
+    out += record(0x0085, struct.pack("<IBB", offsets[0], 0, 0) + text8("Data", 1))
+    out += record(0x0085, struct.pack("<IBB", offsets[1], 0, 2) + text8("Chart", 1))
+    out += record(0x0085, struct.pack("<IBB", offsets[2], 1, 0) + text8("Verborgen ä", 1))
+    out += shared_texts_records()
+    out += record(0x000A)
+    return out
+
+
+def feature_data_sheet():
+    out = bof(0x0010)
+    for col in range(7):
+        out += record(0x00FD, cell_head(0, col, XF_GENERAL) + struct.pack("<I", col))
+    # MULRK: an integer, an integer in hundredths, the high half of a double, a negative integer.
+    rks = [(XF_GENERAL, rk_int(42)), (XF_FIXED2, rk_int(1234) | 1), (XF_GENERAL, 0x3FF80000), (XF_GENERAL, rk_int(-7))]
+    out += record(0x00BD, struct.pack("<HH", 1, 0) + b"".join(struct.pack("<HI", x, v) for x, v in rks) + struct.pack("<H", 3))
+    out += record(0x0203, cell_head(2, 0, XF_CUSTOM) + struct.pack("<d", 3.14159))
+    out += record(0x0205, cell_head(2, 1, XF_GENERAL) + struct.pack("<BB", 1, 0))
+    out += record(0x0205, cell_head(2, 2, XF_GENERAL) + struct.pack("<BB", 0x07, 1))
+    out += formula(3, 0, XF_GENERAL, struct.pack("<d", 2.5))
+    out += formula(3, 1, XF_GENERAL, typed_result(0))
+    out += record(0x0207, text8("from formula"))
+    out += formula(3, 2, XF_GENERAL, typed_result(1, 1))
+    out += formula(3, 3, XF_GENERAL, typed_result(2, 0x2A))
+    out += formula(3, 4, XF_GENERAL, typed_result(3))
+    out += record(0x0204, cell_head(4, 0, XF_GENERAL) + text8("label €"))
+    # A chart drawn on the sheet brings its own records; its number is not a cell of the sheet.
+    out += bof(0x0020) + record(0x0203, cell_head(20, 0, XF_GENERAL) + struct.pack("<d", 99)) + record(0x000A)
+    # Formatted blank cells down to row 10.
+    out += record(0x00BE, struct.pack("<HHHHHH", 9, 0, XF_FIXED2, XF_FIXED2, XF_FIXED2, 2))
+    out += record(0x000A)
+    return out
+
+
+def assemble(globals_of, bodies, name="Workbook"):
+    """The stream: globals (made by `globals_of(offsets)`) then the bodies, each offset pointing
+    at its body."""
+    position = len(globals_of([0] * len(bodies)))
+    offsets = []
+    for body in bodies:
+        offsets.append(position)
+        position += len(body)
+    stream = globals_of(offsets) + b"".join(bodies)
+    return compound_file([(name, stream.ljust(MINI_CUTOFF, b"\0"))])
+
+
+def biff5_file(code_page, label):
+    """An Excel 5.0 workbook (stream "Book"): byte texts in the code page, no shared texts."""
+    def bof5(kind):
+        return record(0x0809, struct.pack("<HHHH", 0x0500, kind, 0x0DBB, 0x07CC))
+
+    def text5(raw, count_format):
+        return struct.pack(count_format, len(raw)) + raw
+
+    def globals_of(offsets):
+        out = bof5(0x0005) + record(0x0042, struct.pack("<H", code_page))
+        out += record(0x041E, struct.pack("<H", 164) + text5(b"0.0", "<B"))
+        for _ in range(15):
+            out += xf(0, True)
+        out += xf(0, False) + xf(164, False)
+        out += record(0x0085, struct.pack("<IBB", offsets[0], 0, 0) + text5(b"Gr\xf6\xdfe", "<B"))
+        return out + record(0x000A)
+
+    sheet = bof5(0x0010)
+    sheet += record(0x0204, cell_head(0, 0, 15) + text5(label, "<H"))
+    sheet += record(0x0203, cell_head(1, 0, 16) + struct.pack("<d", 2.25))
+    sheet += record(0x000A)
+    return assemble(globals_of, [sheet], name="Book")
+
+
+def one_data_sheet(body_records, extra_globals=b""):
+    """A plain BIFF8 workbook with one sheet "Data" whose records after BOF are `body_records`."""
+    def globals_of(offsets):
+        head = globals_records(["Data"], ["only"], offsets)
+        return head[:-4] + extra_globals + head[-4:]  # before the globals' EOF
+    return assemble(globals_of, [bof(0x0010) + body_records])
+
+
+def make_biff_feature_files():
+    chart = bof(0x0020) + record(0x000A)
+    hidden = bof(0x0010) + record(0x0203, cell_head(0, 0, XF_GENERAL) + struct.pack("<d", 1)) + record(0x000A)
+    write("records.xls", assemble(feature_globals, [feature_data_sheet(), chart, hidden]))
+    dates = bof(0x0010) + record(0x0203, cell_head(0, 0, XF_DATE) + struct.pack("<d", 0))
+    dates += record(0x0203, cell_head(0, 1, XF_GENERAL) + struct.pack("<d", 5)) + record(0x000A)
+    write("dates1904.xls", assemble(lambda offsets: feature_globals(offsets, date1904=True), [dates, chart, chart]))
+    write("biff5.xls", biff5_file(1252, b"\x80 Gr\xf6\xdfe"))
+
+    # Damage the reader must name.
+    write("foreign-codepage.xls", biff5_file(1251, b"\xc4\xe0\xed\xed\xfb\xe5"))
+    write("shared-text-index.xls", one_data_sheet(record(0x00FD, cell_head(0, 0, XF_GENERAL) + struct.pack("<I", 5)) + record(0x000A)))
+    write("short-number.xls", one_data_sheet(record(0x0203, cell_head(0, 0, XF_GENERAL) + b"\0\0") + record(0x000A)))
+    write("no-sheet-end.xls", one_data_sheet(record(0x0203, cell_head(0, 0, XF_GENERAL) + struct.pack("<d", 1))))
+    write("password.xls", one_data_sheet(record(0x000A), extra_globals=record(0x002F, b"\1\0" + b"\0" * 52)))
+    lost = bof(0x0005) + record(0x0085, struct.pack("<IBB", 999999, 0, 0) + text8("Data", 1)) + record(0x000A)
+    write("lost-sheet.xls", compound_file([("Workbook", lost.ljust(MINI_CUTOFF, b"\0"))]))
+    old = record(0x0409, struct.pack("<HHH", 0, 0x0010, 0)) + record(0x000A)
+    write("excel4.xls", compound_file([("Workbook", old.ljust(MINI_CUTOFF, b"\0"))]))
 
 
 # ----------------------------------------------------------------------------------------------
@@ -318,4 +469,5 @@ def make_xlsx_files():
 
 if __name__ == "__main__":
     make_xls_files()
+    make_biff_feature_files()
     make_xlsx_files()
