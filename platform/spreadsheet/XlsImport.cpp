@@ -6,6 +6,7 @@
 #include "platform/spreadsheet/BiffStream.h"
 #include "platform/spreadsheet/CompoundFile.h"
 
+#include <algorithm>
 #include <cstdint>
 #include <fstream>
 #include <map>
@@ -49,6 +50,7 @@ constexpr double k1904Offset = 1462;
 struct SheetEntry {
     std::string name;
     std::uint32_t offset = 0; // of the sheet's BOF record
+    std::uint64_t end = UINT64_MAX; // where the next sheet starts: this one must end before
 };
 
 class XlsReader {
@@ -63,6 +65,7 @@ private:
     void ReadGlobalRecord(const BiffRecord& record);
     void ReadSharedTexts(const BiffRecord& record);
     void SetStyles();
+    void SetSheetEnds();
     void ReadSheet(int index);
     void ReadCellRecord(const BiffRecord& record, int sheet);
     void ReadFormula(BiffCursor& body, ImportedCell& cell, int sheet);
@@ -191,8 +194,26 @@ void XlsReader::SetStyles()
     }
 }
 
+// Sheets may not overlap: reading stops where the next sheet starts, so a damaged sheet list
+// cannot make the reader go over the same records again and again.
+void XlsReader::SetSheetEnds()
+{
+    std::vector<std::uint32_t> starts;
+    for (const SheetEntry& sheet : m_sheets)
+        starts.push_back(sheet.offset);
+    std::sort(starts.begin(), starts.end());
+    for (SheetEntry& sheet : m_sheets) {
+        auto next = std::upper_bound(starts.begin(), starts.end(), sheet.offset);
+        if (next != starts.begin() && next - starts.begin() >= 2 && *(next - 2) == sheet.offset)
+            m_stream.Fail("two sheets start at byte " + std::to_string(sheet.offset));
+        if (next != starts.end())
+            sheet.end = *next;
+    }
+}
+
 void XlsReader::ReadSheets()
 {
+    SetSheetEnds();
     for (const SheetEntry& sheet : m_sheets)
         m_sink.AddSheet(sheet.name);
     for (std::size_t s = 0; s < m_sheets.size(); ++s) {
@@ -212,6 +233,8 @@ void XlsReader::ReadSheet(int index)
     // Charts embedded in a sheet bring their own BOF ... EOF inside it.
     int depth = 1;
     while (m_stream.Next(record)) {
+        if (record.offset >= sheet.end)
+            m_stream.Fail("the sheet '" + sheet.name + "' runs into the next sheet without its EOF record");
         if (record.id == kBof) {
             ++depth;
         } else if (record.id == kEof) {

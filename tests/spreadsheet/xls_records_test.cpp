@@ -122,6 +122,8 @@ TEST(XlsDamage, EachFaultIsNamedWithTheFile)
         {"password.xls", "password-protected"},
         {"lost-sheet.xls", "the sheet 'Data' does not start at byte 999999"},
         {"excel4.xls", "Excel 4.0 or older"},
+        {"overlapping-sheets.xls", "the sheet 'One' runs into the next sheet without its EOF record"},
+        {"shared-sheet-start.xls", "two sheets start at byte"},
     };
     for (const Case& c : cases) {
         // Damage inside a sheet shows when its rows are read, so read them all.

@@ -385,6 +385,16 @@ def make_biff_feature_files():
     write("password.xls", one_data_sheet(record(0x000A), extra_globals=record(0x002F, b"\1\0" + b"\0" * 52)))
     lost = bof(0x0005) + record(0x0085, struct.pack("<IBB", 999999, 0, 0) + text8("Data", 1)) + record(0x000A)
     write("lost-sheet.xls", compound_file([("Workbook", lost.ljust(MINI_CUTOFF, b"\0"))]))
+    # The first sheet lacks its EOF and runs into the second; two sheets at one place.
+    def two_sheets(first_body, second_at_first):
+        def globals_of(offsets):
+            head = bof(0x0005)
+            head += record(0x0085, struct.pack("<IBB", offsets[0], 0, 0) + text8("One", 1))
+            head += record(0x0085, struct.pack("<IBB", offsets[0] if second_at_first else offsets[1], 0, 0) + text8("Two", 1))
+            return head + record(0x000A)
+        return assemble(globals_of, [bof(0x0010) + first_body, bof(0x0010) + record(0x000A)])
+    write("overlapping-sheets.xls", two_sheets(b"", False))
+    write("shared-sheet-start.xls", two_sheets(record(0x000A), True))
     old = record(0x0409, struct.pack("<HHH", 0, 0x0010, 0)) + record(0x000A)
     write("excel4.xls", compound_file([("Workbook", old.ljust(MINI_CUTOFF, b"\0"))]))
 
