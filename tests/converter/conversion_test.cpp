@@ -92,6 +92,17 @@ void RoundTripThrough(std::initializer_list<Format> formats)
 
 TEST(Conversion, EveryFormatPairRoundTrips) { RoundTripThrough({Format::Rbx0, Format::Ascii, Format::Excel}); }
 
+TEST(Conversion, AnXlsWorkbookInTheEngineLayoutReadsWithoutATemplateFile)
+{
+    // Written record by record by tests/data/spreadsheet/make_test_files.py: date-time cells,
+    // blank cells for the missing values.
+    convtest::ScratchFolder folder;
+    FileReport report = Convert(Format::Excel, std::string(VELMORA_TEST_DATA) + "/spreadsheet/engine-layout.xls", Format::Ascii,
+                                folder.Path("out.txt"));
+    ASSERT_TRUE(report.converted) << report.problem.Describe();
+    EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")), kSample);
+}
+
 TEST(Conversion, Rbx0HeaderDescribesAxisAndItems)
 {
     convtest::ScratchFolder folder;

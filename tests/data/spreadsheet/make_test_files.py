@@ -376,6 +376,16 @@ def make_biff_feature_files():
     dates += record(0x0203, cell_head(0, 1, XF_GENERAL) + struct.pack("<d", 5)) + record(0x000A)
     write("dates1904.xls", assemble(lambda offsets: feature_globals(offsets, date1904=True), [dates, chart, chart]))
     write("biff5.xls", biff5_file(1252, b"\x80 Gr\xf6\xdfe"))
+    # The layout the conversion engine writes: types, units and value types in row 1, names in
+    # row 2, date-time cells and values from row 3, blank cells for missing values.
+    layout = [(0, 1, "Rainfall[mm]:Accumulated", XF_GENERAL), (0, 2, "Water Level[m]:Instantaneous", XF_GENERAL),
+              (0, 3, "Undefined[Undefined]:Instantaneous", XF_GENERAL),
+              (1, 0, "Date/time", XF_GENERAL), (1, 1, "Rain", XF_GENERAL), (1, 2, "Level", XF_GENERAL), (1, 3, "Other", XF_GENERAL)]
+    rows = [(0.1, 1.25, 7), (None, 1.5, 8), (0.3, None, 9)]
+    for i, values in enumerate(rows):
+        layout.append((2 + i, 0, 43831 + i * 15 / 1440, XF_DATETIME))
+        layout += [(2 + i, 1 + k, float(v), XF_GENERAL) for k, v in enumerate(values) if v is not None]
+    write("engine-layout.xls", compound_file([("Workbook", workbook_stream([("Series", layout)]))]))
 
     # Damage the reader must name.
     write("foreign-codepage.xls", biff5_file(1251, b"\xc4\xe0\xed\xed\xfb\xe5"))
