@@ -1,6 +1,6 @@
 #pragma once
-// Reading workbook files into a stream of cells: .xlsx through liborcus, .xls by our own reader,
-// chosen by the file's content. Every failure is an AutomationError naming the file and why.
+// Reading workbook files into a stream of cells: .xlsx and .xls by our own readers, chosen by the
+// file's content. Every failure is an AutomationError naming the file and why.
 #include "platform/spreadsheet/NumberFormat.h"
 #include "platform/spreadsheet/Spreadsheet.h"
 
@@ -59,8 +59,8 @@ enum class WorkbookKind { Xlsx, Xls };
 // Tells the format by the first bytes; throws AutomationError when it is neither.
 WorkbookKind DetectWorkbookKind(const std::string& path);
 
-// Reads the whole workbook into `sink` and its cell styles into `styles`. For .xlsx the styles
-// are complete only when the reading ends (cells arrive first); for .xls before the first cell.
+// Reads the whole workbook into `sink` and its cell styles into `styles`, which are complete
+// before the first cell arrives.
 // A sink may stop the reading early by throwing StopImport.
 void ImportWorkbook(const std::string& path, ImportSink& sink, StyleTable& styles,
                     const ImportLimits& limits = ImportLimits());

@@ -1,4 +1,4 @@
-// Workbook files of both kinds through the object model: .xls written by our own script
+// Workbook files of both kinds through the object model: .xls and hand-made .xlsx packages written by our own script
 // (tests/data/spreadsheet/make_test_files.py), and damaged or hostile files, each of which must
 // fail to open with a message naming the file and the cause.
 #include "TestWorkbooks.h"
@@ -86,18 +86,48 @@ TEST(XlsWorkbooks, DateTimesAndTimesKeepTheirSeconds)
     EXPECT_NEAR(sheet->Range("B2")->Value2().number, 0.5, 1e-9);
 }
 
-TEST(XlsxWorkbooks, ErrorAndInlineStringCellsAreNotReportedByTheLibrary)
+TEST(XlsxWorkbooks, ErrorAndInlineStringCellsCount)
 {
-    // liborcus 0.17 passes over error cells and inline strings: they read as blank and do not
-    // count for the used range (docs/spreadsheet.md).
     auto app = StartApplication(ApplicationSettings());
     auto sheet = OpenSheet(*app, DataFile("errors.xlsx"));
-    EXPECT_TRUE(sheet->Range("A1")->Value2().IsEmpty());
-    EXPECT_EQ(Text(*sheet, "C1"), "");
+    Variant error = sheet->Range("A1")->Value2();
+    EXPECT_EQ(error.type, Variant::Error);
+    EXPECT_EQ(error.text, "#N/A");
+    EXPECT_EQ(Text(*sheet, "B1"), "#DIV/0!");
+    EXPECT_EQ(Text(*sheet, "C1"), "inline");
     auto used = sheet->UsedRange();
-    EXPECT_EQ(used->Column(), 26);
-    EXPECT_EQ(used->Count(), 1);
+    EXPECT_EQ(used->Column(), 1);
+    EXPECT_EQ(used->Count(), 30 * 26);
     EXPECT_EQ(Text(*sheet, "Z30"), "7");
+}
+
+// A package laid out unlike Excel's own (see make_test_files.py): its workbook part found through
+// the package relationships, prefixed elements, the 1904 date system, rich shared strings.
+TEST(XlsxWorkbooks, APackageOfAnotherWriterReadsInFull)
+{
+    auto app = StartApplication(ApplicationSettings());
+    auto book = app->Workbooks()->Open(DataFile("features.xlsx"));
+    ASSERT_EQ(book->Worksheets()->Count(), 2);
+    auto sheet = book->Worksheets()->Item(1);
+    EXPECT_EQ(Text(*sheet, "A1"), "Flow <m3/s>");
+    EXPECT_EQ(Text(*sheet, "B1"), "Station A");
+    EXPECT_EQ(Text(*sheet, "C1"), "inline");
+    // Date-styled numbers of the 1904 system mean the same days as in the 1900 system.
+    EXPECT_EQ(Text(*sheet, "A2"), "2021/05/17 01:02:03");
+    EXPECT_EQ(Text(*sheet, "B2"), "5/17/2021");
+    EXPECT_EQ(sheet->Range("B2")->Value2().number, 44333);
+    EXPECT_EQ(Text(*sheet, "C2"), "4.50");
+    EXPECT_EQ(sheet->Range("D2")->Value2().number, 44333);
+    EXPECT_EQ(sheet->Range("A3")->Value2().number, 0.30000000000000004);
+    EXPECT_EQ(sheet->Range("B3")->Value2().number, 1e15);
+    EXPECT_EQ(sheet->Range("C3")->Value2().number, 123456789.12345678);
+    EXPECT_EQ(sheet->Range("B6")->Value2().type, Variant::Boolean);
+    EXPECT_EQ(sheet->Range("C6")->Value2().type, Variant::Error);
+    EXPECT_EQ(Text(*sheet, "D6"), "TRUEx");
+    EXPECT_EQ(Text(*sheet, "E6"), "2");
+    auto used = sheet->UsedRange();
+    EXPECT_EQ(used->Count(), 6 * 5);
+    EXPECT_EQ(Text(*book->Worksheets()->Item(2), "B2"), "-2.5");
 }
 
 TEST(XlsxWorkbooks, FormattedBlankCellsWidenTheUsedRange)
@@ -130,10 +160,11 @@ TEST(BadWorkbooks, EachFailsToOpenWithItsReason)
         {"long-text.xls", "holds a text longer than itself"},
         {"truncated.xlsx", "damaged (no central directory)"},
         {"not-a-workbook.xlsx", "xl/workbook.xml is missing"},
-        {"broken-xml.xlsx", "damaged"},
+        {"broken-xml.xlsx", "xl/worksheets/sheet1.xml, byte 163: the XML is damaged ('<' inside the tag <row>)"},
         {"bomb.xlsx", "zip bomb"},
         {"lying-sizes.xlsx", "runs past the end of the file"},
-        {"wide.xlsx", "outside the sheet's grid"},
+        {"wide.xlsx", "xl/worksheets/sheet1.xml, byte 137: the cell reference 'ACNV1' is malformed or lies outside the sheet's grid"},
+        {"missing-sheet.xlsx", "the sheet 'Sheet1' has no part in the package (xl/worksheets/sheet1.xml is missing)"},
     };
     for (const Case& c : cases) {
         std::string path = DataFile(c.file);

@@ -97,3 +97,14 @@ TEST(WorkbookReader, FailuresNameTheFileAndTheSheet)
     EXPECT_FALSE(reader.ReadRows(3, [](int, const std::vector<RowCell>&) { return true; }));
     EXPECT_NE(reader.Error().find("no sheet 3"), std::string::npos) << reader.Error();
 }
+
+TEST(WorkbookReader, SheetNamesOfAnXlsxPackageAreDecoded)
+{
+    WorkbookReader reader;
+    ASSERT_TRUE(reader.Open(DataFile("features.xlsx"))) << reader.Error();
+    EXPECT_EQ(reader.SheetNames(), (std::vector<std::string>{"Data & more", "Second"}));
+    std::vector<Row> rows = ReadAll(reader, 2);
+    ASSERT_EQ(rows.size(), 1u);
+    EXPECT_EQ(rows[0].number, 2);
+    EXPECT_EQ(rows[0].cells[0].text, "-2.5");
+}

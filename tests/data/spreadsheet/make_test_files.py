@@ -458,7 +458,65 @@ def xlsx(name, sheet_xml):
         put(z, "xl/worksheets/sheet1.xml", sheet_xml)
 
 
+def rels(*relationships):
+    return ('<?xml version="1.0" encoding="UTF-8"?>'
+            '<Relationships xmlns="http://schemas.openxmlformats.org/package/2006/relationships">'
+            + "".join('<Relationship Id="%s" Type="http://schemas.openxmlformats.org/officeDocument/2006/relationships/%s" '
+                      'Target="%s"/>' % r for r in relationships)
+            + '</Relationships>')
+
+
+def make_feature_package():
+    # A workbook the way other writers lay it out: the workbook part under another name, found
+    # through the package's relationships; a sheet target with a leading '/'; the 1904 date
+    # system; a prefix on every element; rows and cells without references; shared strings with
+    # rich runs and phonetic readings; every cell type; a chart sheet, which is no worksheet.
+    main = 'xmlns:x="http://schemas.openxmlformats.org/spreadsheetml/2006/main"'
+    workbook = ('<?xml version="1.0" encoding="UTF-8"?>'
+                '<x:workbook %s xmlns:r="http://schemas.openxmlformats.org/officeDocument/2006/relationships">'
+                '<x:workbookPr date1904="1"/><x:sheets>'
+                '<x:sheet name="Data &amp; more" sheetId="1" r:id="rId7"/>'
+                '<x:sheet name="Chart" sheetId="3" r:id="rId9"/>'
+                '<x:sheet name="Second" sheetId="2" r:id="rId8"/></x:sheets></x:workbook>' % main)
+    styles = ('<?xml version="1.0" encoding="UTF-8"?><x:styleSheet %s>'
+              '<x:numFmts count="1"><x:numFmt numFmtId="164" formatCode="yyyy/mm/dd hh:mm:ss"/></x:numFmts>'
+              '<x:cellStyleXfs count="1"><x:xf numFmtId="14"/></x:cellStyleXfs>'
+              '<x:cellXfs count="4"><x:xf numFmtId="0"/><x:xf numFmtId="164"/><x:xf numFmtId="14"/><x:xf numFmtId="2"/></x:cellXfs>'
+              '<x:dxfs count="1"><x:dxf><x:numFmt numFmtId="165" formatCode="0.000"/></x:dxf></x:dxfs>'
+              '</x:styleSheet>' % main)
+    shared = ('<?xml version="1.0" encoding="UTF-8"?><x:sst %s count="3" uniqueCount="3">'
+              '<x:si><x:t>Flow &lt;m3/s&gt;</x:t></x:si>'
+              '<x:si><x:r><x:rPr><x:b/></x:rPr><x:t xml:space="preserve">Station </x:t></x:r><x:r><x:t>A</x:t></x:r>'
+              '<x:rPh sb="0" eb="1"><x:t>reading</x:t></x:rPh></x:si>'
+              '<x:si><x:t/></x:si></x:sst>' % main)
+    sheet = ('<?xml version="1.0" encoding="UTF-8"?><x:worksheet %s><x:sheetData>'
+             '<x:row r="1"><x:c r="A1" t="s"><x:v>0</x:v></x:c><x:c t="s"><x:v>1</x:v></x:c>'
+             '<x:c t="inlineStr"><x:is><x:r><x:t>in</x:t></x:r><x:r><x:t>line</x:t></x:r></x:is></x:c></x:row>'
+             '<x:row><x:c s="1"><x:v>42871.04309027778</x:v></x:c><x:c s="2"><x:v>42871</x:v></x:c>'
+             '<x:c s="3"><x:v>4.5</x:v></x:c><x:c t="d" s="2"><x:v>2021-05-17T00:00:00</x:v></x:c></x:row>'
+             '<x:row><x:c><x:v>0.30000000000000004</x:v></x:c><x:c><x:v>1E+15</x:v></x:c>'
+             '<x:c><x:v>123456789.12345678</x:v></x:c></x:row>'
+             '<x:row r="6"><x:c r="B6" t="b"><x:v>1</x:v></x:c><x:c t="e"><x:v>#DIV/0!</x:v></x:c>'
+             '<x:c t="str"><x:f>B6&amp;"x"</x:f><x:v>TRUEx</x:v></x:c><x:c><x:f>1/0</x:f><x:v>2</x:v></x:c></x:row>'
+             '</x:sheetData></x:worksheet>' % main)
+    second = SHEET_HEAD + '<row r="2"><c r="B2"><v>-2.5</v></c></row>' + SHEET_TAIL
+    with zipfile.ZipFile(os.path.join(HERE, "features.xlsx"), "w") as z:
+        put(z, "[Content_Types].xml", CONTENT_TYPES)
+        put(z, "_rels/.rels", rels(("rId1", "officeDocument", "xl/book.xml")))
+        put(z, "xl/book.xml", workbook)
+        put(z, "xl/_rels/book.xml.rels", rels(("rId7", "worksheet", "/xl/sheets/data.xml"),
+                                              ("rId8", "worksheet", "sheets/../sheets/second.xml"),
+                                              ("rId9", "chartsheet", "chartsheets/sheet1.xml"),
+                                              ("rId2", "styles", "styles.xml"),
+                                              ("rId3", "sharedStrings", "strings.xml")))
+        put(z, "xl/styles.xml", styles)
+        put(z, "xl/strings.xml", shared)
+        put(z, "xl/sheets/data.xml", sheet)
+        put(z, "xl/sheets/second.xml", second)
+
+
 def make_xlsx_files():
+    make_feature_package()
     # Error cells, an inline string and a cell far right and low.
     xlsx("errors.xlsx", SHEET_HEAD
          + '<row r="1"><c r="A1" t="e"><v>#N/A</v></c><c r="B1" t="e"><v>#DIV/0!</v></c>'
@@ -471,6 +529,11 @@ def make_xlsx_files():
     xlsx("bomb.xlsx", SHEET_HEAD + " " * (64 << 20) + SHEET_TAIL)
     # Broken XML in the sheet part.
     xlsx("broken-xml.xlsx", SHEET_HEAD + '<row r="1"><c r="A1"><v>1</v></c><row' + SHEET_TAIL)
+    # A workbook whose sheet part is not in the package.
+    with zipfile.ZipFile(os.path.join(HERE, "missing-sheet.xlsx"), "w") as z:
+        put(z, "_rels/.rels", ROOT_RELS)
+        put(z, "xl/workbook.xml", WORKBOOK)
+        put(z, "xl/_rels/workbook.xml.rels", WORKBOOK_RELS)
     # A zip without a workbook part.
     with zipfile.ZipFile(os.path.join(HERE, "not-a-workbook.xlsx"), "w") as z:
         put(z, "readme.txt", "just a zip")
