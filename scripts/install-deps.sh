@@ -7,7 +7,7 @@ packages=(
   build-essential cmake ninja-build pkg-config ccache git
   clang libclang-rt-14-dev
   qt6-base-dev libgl-dev
-  libpugixml-dev liborcus-dev libboost-dev libxlsxwriter-dev zlib1g-dev
+  libpugixml-dev libxlsxwriter-dev zlib1g-dev
   libgtest-dev libgmock-dev libbenchmark-dev
   python3
 )
