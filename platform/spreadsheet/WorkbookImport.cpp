@@ -1,7 +1,5 @@
 #include "platform/spreadsheet/WorkbookImport.h"
 
-#include "platform/spreadsheet/ZipReader.h"
-
 #include "platform/system/FileSystem.h"
 
 #include <array>
@@ -65,13 +63,6 @@ WorkbookKind DetectWorkbookKind(const std::string& path)
     if (got == kCompoundFileMagic.size() && head == kCompoundFileMagic)
         return WorkbookKind::Xls;
     throw OpenError(path, "the file is not a workbook (neither an .xlsx zip package nor an .xls compound file).");
-}
-
-void CheckZipDirectory(const std::string& path, const ImportLimits& limits)
-{
-    ZipReader package(path, limits);
-    if (package.Find("xl/workbook.xml") == nullptr)
-        throw OpenError(path, "the zip package holds no workbook (xl/workbook.xml is missing).");
 }
 
 void ImportWorkbook(const std::string& path, ImportSink& sink, StyleTable& styles, const ImportLimits& limits)

@@ -70,8 +70,6 @@ struct StopImport {};
 // Internal entry points of ImportWorkbook, one per format.
 void ImportXlsx(const std::string& path, ImportSink& sink, StyleTable& styles, const ImportLimits& limits);
 void ImportXls(const std::string& path, ImportSink& sink, StyleTable& styles, const ImportLimits& limits);
-// Throws when the zip's directory declares parts beyond the limits (zip bombs, huge sheets).
-void CheckZipDirectory(const std::string& path, const ImportLimits& limits);
 
 // "Cannot open <path>: <why>"
 AutomationError OpenError(const std::string& path, const std::string& why);

@@ -4,7 +4,7 @@
 // sink, and only the current cell is held.
 #include "platform/spreadsheet/WorkbookImport.h"
 
-#include "platform/spreadsheet/XlsxParts.h"
+#include "platform/spreadsheet/XlsxPartReaders.h"
 #include "platform/spreadsheet/ZipReader.h"
 
 #include <memory>

@@ -1,7 +1,7 @@
 // The .xlsx part readers on XML written inline: cell values of every type, numbers read exactly,
 // positions of rows and cells without references, shared strings and styles, and the faults
 // each must name.
-#include "platform/spreadsheet/XlsxParts.h"
+#include "platform/spreadsheet/XlsxPartReaders.h"
 
 #include <gtest/gtest.h>
 

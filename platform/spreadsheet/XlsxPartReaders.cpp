@@ -1,4 +1,4 @@
-#include "platform/spreadsheet/XlsxParts.h"
+#include "platform/spreadsheet/XlsxPartReaders.h"
 
 #include "platform/spreadsheet/CellAddress.h"
 #include "platform/system/OleDateTime.h"
