@@ -8,12 +8,16 @@
 
 #include <algorithm>
 #include <cmath>
+#include <utility>
 
 namespace converter {
 
 namespace {
 
-constexpr size_t kQueuedRows = 256;
+// Rows go from the reading thread to Next in batches, so the two threads meet once a batch
+// instead of once a row.
+constexpr size_t kBatchRows = 256;
+constexpr size_t kQueuedBatches = 4;
 
 const sheet::RowCell* CellAt(const std::vector<sheet::RowCell>& cells, int column)
 {
@@ -92,15 +96,22 @@ Status ExcelSeriesReader::ReadHeader()
             wanted.push_back(row);
     std::map<int, SheetRow> headerRows;
     int first = 0, last = 0;
+    // This pass goes over the whole sheet for its used columns; only the header rows need the
+    // texts of their numbers.
+    const std::vector<bool> noNumberTexts;
     const bool read = workbook.ReadRows(m_sheet, [&](int row, const std::vector<sheet::RowCell>& cells) {
         if (!cells.empty()) {
             first = first == 0 ? cells.front().column : std::min(first, cells.front().column);
             last = std::max(last, cells.back().column);
         }
-        if (std::find(wanted.begin(), wanted.end(), row) != wanted.end())
-            headerRows[row] = SheetRow{row, cells};
+        if (std::find(wanted.begin(), wanted.end(), row) != wanted.end()) {
+            SheetRow& header = headerRows[row] = SheetRow{row, cells};
+            for (sheet::RowCell& cell : header.cells)
+                if (cell.value.type != sheet::Variant::Text)
+                    cell.text = workbook.DisplayedText(cell);
+        }
         return true;
-    });
+    }, &noNumberTexts);
     if (!read)
         return Status::Fail(m_path, 0, workbook.Error());
     if (last < 2 || last - first < 1)
@@ -225,21 +236,28 @@ void ExcelSeriesReader::Select(const std::vector<size_t>& items)
 void ExcelSeriesReader::StartRows()
 {
     const int startRow = m_spec.m_DataDesc.m_nStartRow;
-    m_producer = std::thread([this, startRow] {
+    m_producer = std::thread([this, startRow, textColumns = TextColumns()] {
         sheet::WorkbookReader workbook;
+        std::vector<SheetRow> batch;
+        auto handOver = [&] {
+            std::unique_lock<std::mutex> lock(m_mutex);
+            m_changed.wait(lock, [&] { return m_stop || m_queue.size() < kQueuedBatches; });
+            if (m_stop)
+                return false;
+            m_queue.push_back(std::exchange(batch, {}));
+            m_changed.notify_all();
+            return true;
+        };
         bool ok = workbook.Open(m_path);
         if (ok)
             ok = workbook.ReadRows(m_sheet, [&](int number, const std::vector<sheet::RowCell>& cells) {
                 if (number < startRow)
                     return true;
-                std::unique_lock<std::mutex> lock(m_mutex);
-                m_changed.wait(lock, [&] { return m_stop || m_queue.size() < kQueuedRows; });
-                if (m_stop)
-                    return false;
-                m_queue.push_back(SheetRow{number, cells});
-                m_changed.notify_all();
-                return true;
-            });
+                batch.push_back(SheetRow{number, cells});
+                return batch.size() < kBatchRows || handOver();
+            }, textColumns.empty() ? nullptr : &textColumns);
+        if (ok && !batch.empty())
+            handOver();
         std::lock_guard<std::mutex> lock(m_mutex);
         if (!ok && !m_stop)
             m_producerError = workbook.Error();
@@ -248,21 +266,43 @@ void ExcelSeriesReader::StartRows()
     });
 }
 
+// The columns whose numbers are needed as the sheet displays them: the date/time columns, and
+// every column when a delete value is compared with the displayed texts. Empty means every one.
+std::vector<bool> ExcelSeriesReader::TextColumns() const
+{
+    if (m_deleteInUse)
+        return {};
+    std::vector<bool> columns(static_cast<size_t>(std::max(m_lastColumn, m_stampColumn + m_formatColumns)) + 1, false);
+    for (int w = 0; w < m_formatColumns; ++w)
+        columns[static_cast<size_t>(m_stampColumn + w)] = true;
+    return columns;
+}
+
+bool ExcelSeriesReader::NextSheetRow(SheetRow& sheetRow)
+{
+    if (m_batchAt == m_batch.size()) {
+        std::unique_lock<std::mutex> lock(m_mutex);
+        m_changed.wait(lock, [&] { return !m_queue.empty() || m_producerDone; });
+        if (m_queue.empty())
+            return false;
+        m_batch = std::move(m_queue.front());
+        m_queue.pop_front();
+        m_batchAt = 0;
+        m_changed.notify_all();
+    }
+    sheetRow = std::move(m_batch[m_batchAt++]);
+    return true;
+}
+
 bool ExcelSeriesReader::Next(Row& row)
 {
     while (m_status) {
         SheetRow sheetRow;
-        {
-            std::unique_lock<std::mutex> lock(m_mutex);
-            m_changed.wait(lock, [&] { return !m_queue.empty() || m_producerDone; });
-            if (m_queue.empty()) {
-                if (!m_producerError.empty())
-                    return Fail(m_path, m_rowNumber, m_producerError);
-                return false;
-            }
-            sheetRow = std::move(m_queue.front());
-            m_queue.pop_front();
-            m_changed.notify_all();
+        if (!NextSheetRow(sheetRow)) {
+            std::lock_guard<std::mutex> lock(m_mutex);
+            if (!m_producerError.empty())
+                return Fail(m_path, m_rowNumber, m_producerError);
+            return false;
         }
         m_rowNumber = sheetRow.number;
         bool endOfData = false;
@@ -273,6 +313,8 @@ bool ExcelSeriesReader::Next(Row& row)
             std::lock_guard<std::mutex> lock(m_mutex);
             m_stop = true;
             m_queue.clear();
+            m_batch.clear();
+            m_batchAt = 0;
             m_changed.notify_all();
             return false;
         }

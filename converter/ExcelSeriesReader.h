@@ -40,6 +40,8 @@ private:
     Status ReadHeader();
     Status ReadItems(const std::map<int, SheetRow>& headerRows);
     void StartRows();
+    std::vector<bool> TextColumns() const;
+    bool NextSheetRow(SheetRow& sheetRow);
     bool ReadDataRow(const SheetRow& sheetRow, Row& row, bool& endOfData);
     bool ReadStamp(const SheetRow& sheetRow, Stamp& stamp, bool& endOfData);
     bool IsDeleted(const std::string& text) const;
@@ -66,7 +68,9 @@ private:
     std::thread m_producer;
     std::mutex m_mutex;
     std::condition_variable m_changed;
-    std::deque<SheetRow> m_queue;
+    std::deque<std::vector<SheetRow>> m_queue;
+    std::vector<SheetRow> m_batch; // the batch Next takes its rows from
+    size_t m_batchAt = 0;
     bool m_producerDone = false;
     bool m_stop = false;
     std::string m_producerError;

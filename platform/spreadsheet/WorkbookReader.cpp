@@ -4,13 +4,14 @@ namespace sheet {
 
 namespace {
 
-// Collects only the sheet names (the styles come with the reading); cells are passed over.
+// Collects the sheet names. Both readers list every sheet before the first cell, so the reading
+// stops there instead of going through the whole file.
 class NameCollector : public ImportSink {
 public:
     explicit NameCollector(std::vector<std::string>& names) : m_names(names) {}
     void AddSheet(const std::string& name) override { m_names.push_back(name); }
-    void AddCell(int, const ImportedCell&) override {}
-    void EndSheet(int) override {}
+    void AddCell(int, const ImportedCell&) override { throw StopImport(); }
+    void EndSheet(int) override { throw StopImport(); }
 
 private:
     std::vector<std::string>& m_names;
@@ -19,8 +20,9 @@ private:
 // Gathers the cells of one row of the wanted sheet and hands the row on when the next begins.
 class RowStreamer : public ImportSink {
 public:
-    RowStreamer(int sheet, const StyleTable& styles, const WorkbookReader::RowCallback& onRow)
-        : m_sheet(sheet), m_styles(styles), m_onRow(onRow) {}
+    RowStreamer(int sheet, const StyleTable& styles, const WorkbookReader::RowCallback& onRow,
+                const std::vector<bool>* textColumns)
+        : m_sheet(sheet), m_styles(styles), m_onRow(onRow), m_textColumns(textColumns) {}
 
     void AddSheet(const std::string&) override {}
 
@@ -36,7 +38,9 @@ public:
         out.value.type = cell.type;
         out.value.number = cell.number;
         out.value.text = cell.text;
-        out.text = m_styles.Format(cell.style).Render(out.value);
+        out.style = cell.style;
+        if (out.value.type == Variant::Text || WantsText(cell.column))
+            out.text = m_styles.Format(cell.style).Render(out.value);
         m_cells.push_back(std::move(out));
     }
 
@@ -49,6 +53,12 @@ public:
     }
 
 private:
+    bool WantsText(int column) const
+    {
+        return m_textColumns == nullptr ||
+               (static_cast<size_t>(column) < m_textColumns->size() && (*m_textColumns)[static_cast<size_t>(column)]);
+    }
+
     void Emit()
     {
         if (m_cells.empty())
@@ -62,6 +72,7 @@ private:
     int m_sheet;
     const StyleTable& m_styles;
     const WorkbookReader::RowCallback& m_onRow;
+    const std::vector<bool>* m_textColumns;
     int m_row = 0;
     std::vector<RowCell> m_cells;
 };
@@ -76,6 +87,7 @@ bool WorkbookReader::Open(const std::string& path)
     NameCollector names(m_sheetNames);
     try {
         ImportWorkbook(path, names, m_styles, m_limits);
+    } catch (const StopImport&) {
     } catch (const AutomationError& e) {
         m_error = e.what();
         m_sheetNames.clear();
@@ -84,19 +96,17 @@ bool WorkbookReader::Open(const std::string& path)
     return true;
 }
 
-bool WorkbookReader::ReadRows(int sheet, const RowCallback& onRow)
+bool WorkbookReader::ReadRows(int sheet, const RowCallback& onRow, const std::vector<bool>* textColumns)
 {
     m_error.clear();
     if (sheet < 1 || sheet > SheetCount()) {
         m_error = "Cannot read " + m_path + ": the workbook has no sheet " + std::to_string(sheet) + ".";
         return false;
     }
-    // The texts need the styles before the cells: those Open read (the sheets precede the
-    // styles in an .xlsx reading); this reading's own copy is not used.
-    StyleTable scratch;
-    RowStreamer streamer(sheet - 1, m_styles, onRow);
+    // Both readers fill the style table before the first cell arrives.
+    RowStreamer streamer(sheet - 1, m_styles, onRow, textColumns);
     try {
-        ImportWorkbook(m_path, streamer, scratch, m_limits);
+        ImportWorkbook(m_path, streamer, m_styles, m_limits);
     } catch (const StopImport&) {
     } catch (const AutomationError& e) {
         m_error = e.what();

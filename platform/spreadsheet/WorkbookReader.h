@@ -14,7 +14,8 @@ namespace sheet {
 struct RowCell {
     int column = 0; // from 1
     Variant value;  // Number (dates as serial numbers), Text, Boolean or Error
-    std::string text;
+    std::string text; // what the sheet displays; empty for a non-text cell outside the text columns
+    unsigned style = 0;
 };
 
 class WorkbookReader {
@@ -25,14 +26,20 @@ public:
 
     explicit WorkbookReader(ImportLimits limits = ImportLimits()) : m_limits(limits) {}
 
-    // Opens `path` (the content tells .xlsx from .xls) and reads its sheet names and cell
-    // styles. This reads the whole file once, holding no cells.
+    // Opens `path` (the content tells .xlsx from .xls) and reads its sheet names, stopping
+    // before the first cell: damage further in shows when the rows are read.
     bool Open(const std::string& path);
     int SheetCount() const { return static_cast<int>(m_sheetNames.size()); }
     const std::vector<std::string>& SheetNames() const { return m_sheetNames; }
 
     // Reads sheet `sheet` (from 1) from its first row to its last, or until `onRow` says stop.
-    bool ReadRows(int sheet, const RowCallback& onRow);
+    // With `textColumns`, numbers, booleans and errors get their displayed text only in the
+    // columns it marks true (indexed by column): rendering a number through its format costs
+    // more than reading it, and a conversion needs the texts of a few columns only.
+    bool ReadRows(int sheet, const RowCallback& onRow, const std::vector<bool>* textColumns = nullptr);
+
+    // What the sheet displays for `cell`, for one read without its text.
+    std::string DisplayedText(const RowCell& cell) const { return m_styles.Format(cell.style).Render(cell.value); }
 
     // Why the last Open or ReadRows failed: names the file and the cause.
     const std::string& Error() const { return m_error; }

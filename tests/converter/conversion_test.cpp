@@ -5,6 +5,7 @@
 #include "converter/Converter.h"
 #include "converter/StampText.h"
 #include "platform/rbx/RbxReader.h"
+#include "platform/system/Text.h"
 #include "templates/AsciiSpecification.h"
 
 #include <gtest/gtest.h>
@@ -101,6 +102,35 @@ TEST(Conversion, AnXlsWorkbookInTheEngineLayoutReadsWithoutATemplateFile)
                                 folder.Path("out.txt"));
     ASSERT_TRUE(report.converted) << report.problem.Describe();
     EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")), kSample);
+}
+
+TEST(Conversion, ExcelRowsCrossTheReadingBatchesAndDeleteValuesMatchTheDisplayedText)
+{
+    // 700 rows pass from the reading thread in several batches; every seventh level is -999.
+    std::string original = "Rainfall[mm]:Accumulated\tWater Level[m]:Instantaneous\nDate/time\tRain\tLevel\n";
+    std::string withoutDeleted = original;
+    for (int i = 0; i < 700; ++i) {
+        const std::string stamp = text::Format("2020/01/01 %02d:%02d:00", i / 60, i % 60);
+        const std::string rain = std::to_string(i % 5) + ".5";
+        original += stamp + "\t" + rain + "\t" + (i % 7 == 0 ? "-999" : std::to_string(i)) + "\n";
+        withoutDeleted += stamp + "\t" + rain + "\t" + (i % 7 == 0 ? "" : std::to_string(i)) + "\n";
+    }
+    convtest::ScratchFolder folder;
+    convtest::WriteFile(folder.Path("in.txt"), original);
+    ASSERT_TRUE(Convert(Format::Ascii, folder.Path("in.txt"), Format::Excel, folder.Path("mid.xlsx")).converted);
+    FileReport plain = Convert(Format::Excel, folder.Path("mid.xlsx"), Format::Ascii, folder.Path("plain.txt"));
+    ASSERT_TRUE(plain.converted) << plain.problem.Describe();
+    EXPECT_EQ(convtest::ReadFile(folder.Path("plain.txt")), original);
+
+    Status status;
+    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Excel, "", status);
+    spec->m_DataDesc.m_nDeleteValueCheck = 1;
+    spec->m_DataDesc.m_nDeleteValueRadio = 0;
+    spec->m_DataDesc.m_strDeleteValue = "-999";
+    FileJob job{Format::Excel, folder.Path("mid.xlsx"), spec.get(), {}, Format::Ascii, folder.Path("deleted.txt"), "Title"};
+    FileReport deleted = ConvertFile(job);
+    ASSERT_TRUE(deleted.converted) << deleted.problem.Describe();
+    EXPECT_EQ(convtest::ReadFile(folder.Path("deleted.txt")), withoutDeleted);
 }
 
 TEST(Conversion, Rbx0HeaderDescribesAxisAndItems)

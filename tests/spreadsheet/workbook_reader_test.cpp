@@ -108,3 +108,22 @@ TEST(WorkbookReader, SheetNamesOfAnXlsxPackageAreDecoded)
     EXPECT_EQ(rows[0].number, 2);
     EXPECT_EQ(rows[0].cells[0].text, "-2.5");
 }
+
+TEST(WorkbookReader, NumbersGetTheirTextsOnlyInTheTextColumns)
+{
+    WorkbookReader reader;
+    ASSERT_TRUE(reader.Open(MakeTwoSheetWorkbook())) << reader.Error();
+    const std::vector<bool> onlyFirst = {false, true};
+    std::vector<Row> rows;
+    ASSERT_TRUE(reader.ReadRows(1, [&](int row, const std::vector<RowCell>& cells) {
+        rows.push_back({row, cells});
+        return true;
+    }, &onlyFirst)) << reader.Error();
+    ASSERT_EQ(rows.size(), 4u);
+    EXPECT_EQ(rows[0].cells[1].text, "Flow"); // texts always come with their text
+    EXPECT_EQ(rows[1].cells[0].text, "2021/05/17 12:00");
+    EXPECT_EQ(rows[1].cells[1].text, "");
+    EXPECT_EQ(rows[1].cells[1].value.number, 1.25);
+    EXPECT_EQ(reader.DisplayedText(rows[1].cells[1]), "1.3"); // "0.0", half up
+    EXPECT_EQ(reader.DisplayedText(rows[3].cells[0]), "FALSE");
+}
