@@ -4,8 +4,8 @@ namespace sheet {
 
 namespace {
 
-// Collects the sheet names. Both readers list every sheet before the first cell, so the reading
-// stops there instead of going through the whole file.
+// Collects the sheet names. Both readers list every sheet before the first cell (.xlsx even
+// before its styles and shared strings), so the reading stops there.
 class NameCollector : public ImportSink {
 public:
     explicit NameCollector(std::vector<std::string>& names) : m_names(names) {}

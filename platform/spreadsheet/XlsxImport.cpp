@@ -179,6 +179,17 @@ void XlsxReader::Read()
         ReadRelationships(folder + "_rels/" + workbookPart.substr(folder.size()) + ".rels");
     const WorkbookEntries workbook = ReadWorkbook(workbookPart);
 
+    // Chart sheets and dialog sheets hold no cells and are not worksheets. The sheets are listed
+    // first, so a reader that wants only their names can stop before the styles and texts.
+    std::vector<std::pair<std::string, const ZipReader::Entry*>> worksheets;
+    for (const SheetEntry& sheet : workbook.sheets) {
+        const Relationship& relationship = SheetRelationship(sheet, relationships);
+        if (relationship.type == "worksheet")
+            worksheets.emplace_back(sheet.name, SheetPart(sheet, relationship));
+    }
+    for (const auto& [name, part] : worksheets)
+        m_sink.AddSheet(name);
+
     xlsx::CellStyles cellStyles;
     if (const ZipReader::Entry* styles = Related(relationships, "styles", folder + "styles.xml")) {
         PartReader reader(m_package, *styles);
@@ -190,16 +201,7 @@ void XlsxReader::Read()
         xlsx::ReadSharedStrings(reader.Xml(), strings);
     }
 
-    // Chart sheets and dialog sheets hold no cells and are not worksheets.
-    std::vector<std::pair<std::string, const ZipReader::Entry*>> worksheets;
-    for (const SheetEntry& sheet : workbook.sheets) {
-        const Relationship& relationship = SheetRelationship(sheet, relationships);
-        if (relationship.type == "worksheet")
-            worksheets.emplace_back(sheet.name, SheetPart(sheet, relationship));
-    }
     const xlsx::SheetContext context{strings, cellStyles, workbook.date1904, m_limits};
-    for (const auto& [name, part] : worksheets)
-        m_sink.AddSheet(name);
     for (std::size_t s = 0; s < worksheets.size(); ++s) {
         PartReader reader(m_package, *worksheets[s].second);
         xlsx::ReadSheetCells(reader.Xml(), context, static_cast<int>(s), m_sink);
