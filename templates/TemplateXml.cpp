@@ -18,25 +18,6 @@ struct FileCloser {
 };
 using File = std::unique_ptr<std::FILE, FileCloser>;
 
-void AppendUtf8(std::string& out, char32_t c)
-{
-    if (c < 0x80) {
-        out += static_cast<char>(c);
-    } else if (c < 0x800) {
-        out += static_cast<char>(0xC0 | (c >> 6));
-        out += static_cast<char>(0x80 | (c & 0x3F));
-    } else if (c < 0x10000) {
-        out += static_cast<char>(0xE0 | (c >> 12));
-        out += static_cast<char>(0x80 | ((c >> 6) & 0x3F));
-        out += static_cast<char>(0x80 | (c & 0x3F));
-    } else {
-        out += static_cast<char>(0xF0 | (c >> 18));
-        out += static_cast<char>(0x80 | ((c >> 12) & 0x3F));
-        out += static_cast<char>(0x80 | ((c >> 6) & 0x3F));
-        out += static_cast<char>(0x80 | (c & 0x3F));
-    }
-}
-
 bool DecodeUtf16(std::string_view bytes, bool bigEndian, std::string& utf8, CString& error)
 {
     if (bytes.size() % 2 != 0) {
@@ -55,7 +36,7 @@ bool DecodeUtf16(std::string_view bytes, bool bigEndian, std::string& utf8, CStr
         if (c >= 0xD800 && c <= 0xDBFF && i + 2 < bytes.size()) {
             char32_t low = unit(i + 2);
             if (low >= 0xDC00 && low <= 0xDFFF) {
-                AppendUtf8(utf8, 0x10000 + ((c - 0xD800) << 10) + (low - 0xDC00));
+                text::AppendUtf8(utf8, 0x10000 + ((c - 0xD800) << 10) + (low - 0xDC00));
                 i += 2;
                 continue;
             }
@@ -64,7 +45,7 @@ bool DecodeUtf16(std::string_view bytes, bool bigEndian, std::string& utf8, CStr
             error = text::Format("the UTF-16 text has an unpaired surrogate at byte %zu", i);
             return false;
         }
-        AppendUtf8(utf8, c);
+        text::AppendUtf8(utf8, c);
     }
     return true;
 }
@@ -323,7 +304,7 @@ CString RepairUtf8(std::string_view text)
     for (size_t i = 0; i < text.size();) {
         size_t length = Utf8SequenceLength(text, i);
         if (length == 0) {
-            AppendUtf8(out, static_cast<unsigned char>(text[i]));
+            text::AppendUtf8(out, static_cast<unsigned char>(text[i]));
             ++i;
         } else {
             out.append(text, i, length);

@@ -1,6 +1,8 @@
 #include "platform/spreadsheet/BiffStream.h"
 
+#include "platform/spreadsheet/LittleEndian.h"
 #include "platform/spreadsheet/WorkbookImport.h"
+#include "platform/system/Text.h"
 
 #include <cstdio>
 #include <cstring>
@@ -25,25 +27,6 @@ bool ReadsAsWindows1252(unsigned codePage)
     return codePage == 1252 || codePage == 367 || codePage == 28591 || codePage == 1200 || codePage == 0;
 }
 
-void AppendUtf8(std::string& out, char32_t c)
-{
-    if (c < 0x80) {
-        out.push_back(static_cast<char>(c));
-    } else if (c < 0x800) {
-        out.push_back(static_cast<char>(0xC0 | c >> 6));
-        out.push_back(static_cast<char>(0x80 | (c & 0x3F)));
-    } else if (c < 0x10000) {
-        out.push_back(static_cast<char>(0xE0 | c >> 12));
-        out.push_back(static_cast<char>(0x80 | (c >> 6 & 0x3F)));
-        out.push_back(static_cast<char>(0x80 | (c & 0x3F)));
-    } else {
-        out.push_back(static_cast<char>(0xF0 | c >> 18));
-        out.push_back(static_cast<char>(0x80 | (c >> 12 & 0x3F)));
-        out.push_back(static_cast<char>(0x80 | (c >> 6 & 0x3F)));
-        out.push_back(static_cast<char>(0x80 | (c & 0x3F)));
-    }
-}
-
 // Surrogate pairs join; a lone surrogate becomes U+FFFD rather than invalid UTF-8.
 std::string Utf8Of(const std::u16string& units)
 {
@@ -55,7 +38,7 @@ std::string Utf8Of(const std::u16string& units)
             c = 0x10000 + ((c - 0xD800) << 10) + (units[++i] - 0xDC00);
         else if (c >= 0xD800 && c < 0xE000)
             c = 0xFFFD;
-        AppendUtf8(out, c);
+        text::AppendUtf8(out, c);
     }
     return out;
 }
@@ -217,8 +200,8 @@ bool BiffStream::Next(BiffRecord& record)
     if (m_at + 4 > m_bytes.size())
         return false;
     record.offset = m_at;
-    record.id = static_cast<unsigned>(m_bytes[m_at] | m_bytes[m_at + 1] << 8);
-    const std::size_t length = static_cast<std::size_t>(m_bytes[m_at + 2] | m_bytes[m_at + 3] << 8);
+    record.id = Load16(&m_bytes[m_at]);
+    const std::size_t length = Load16(&m_bytes[m_at + 2]);
     if (length > kLongestBody)
         Fail(record, "is longer than a record may be");
     if (m_at + 4 + length > m_bytes.size())

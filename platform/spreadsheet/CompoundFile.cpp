@@ -1,5 +1,6 @@
 #include "platform/spreadsheet/CompoundFile.h"
 
+#include "platform/spreadsheet/LittleEndian.h"
 #include "platform/spreadsheet/WorkbookImport.h"
 
 namespace sheet {
@@ -7,14 +8,6 @@ namespace sheet {
 namespace {
 
 constexpr std::uint32_t kLastRegularSector = 0xFFFFFFF9u;
-
-std::uint32_t Le32(const unsigned char* p)
-{
-    return static_cast<std::uint32_t>(p[0]) | static_cast<std::uint32_t>(p[1]) << 8 |
-           static_cast<std::uint32_t>(p[2]) << 16 | static_cast<std::uint32_t>(p[3]) << 24;
-}
-
-unsigned Le16(const unsigned char* p) { return p[0] | p[1] << 8; }
 
 } // namespace
 
@@ -32,43 +25,43 @@ CompoundFile::CompoundFile(const std::string& path) : m_path(path), m_in(path, s
     m_in.seekg(0);
     if (!m_in.read(reinterpret_cast<char*>(header.data()), 512))
         Fail("its header is cut short");
-    const unsigned shift = Le16(&header[30]);
+    const unsigned shift = Load16(&header[30]);
     if (shift != 9 && shift != 12)
         Fail("sector size 2^" + std::to_string(shift));
     m_sectorSize = 1ull << shift;
     m_sectorCount = m_fileSize > m_sectorSize ? (m_fileSize - m_sectorSize) / m_sectorSize : 0;
-    m_miniCutoff = Le32(&header[56]);
+    m_miniCutoff = Load32(&header[56]);
 
     // The FAT from the sectors the header lists (the header holds room for 109 of them).
     std::vector<unsigned char> sector;
-    const std::uint32_t fatSectors = Le32(&header[44]);
+    const std::uint32_t fatSectors = Load32(&header[44]);
     for (std::uint32_t i = 0; i < fatSectors && i < 109; ++i) {
-        if (!ReadSector(Le32(&header[76 + 4 * i]), sector))
+        if (!ReadSector(Load32(&header[76 + 4 * i]), sector))
             Fail("its allocation table lies outside the file");
         for (std::uint64_t k = 0; k + 4 <= m_sectorSize; k += 4)
-            m_fat.push_back(Le32(&sector[k]));
+            m_fat.push_back(Load32(&sector[k]));
     }
 
-    const std::uint32_t directoryStart = Le32(&header[48]);
+    const std::uint32_t directoryStart = Load32(&header[48]);
     if (directoryStart >= m_sectorCount)
         Fail("its directory lies outside the file");
     std::vector<unsigned char> directory = ReadChain(directoryStart, m_fileSize, m_fat, m_sectorSize, false);
     for (std::uint64_t at = 0; at + 128 <= directory.size(); at += 128) {
         const unsigned char* e = &directory[at];
-        const unsigned nameLength = Le16(e + 64);
+        const unsigned nameLength = Load16(e + 64);
         Entry entry;
         entry.type = e[66];
         if (nameLength > 64 || nameLength % 2 != 0 || entry.type > 5)
             Fail("bad directory entry");
         for (unsigned i = 0; i + 2 < nameLength; i += 2) // the length counts the closing zero
             entry.name.push_back(e[i + 1] == 0 && e[i] >= 0x20 && e[i] < 0x7F ? static_cast<char>(e[i]) : '?');
-        entry.start = Le32(e + 116);
-        entry.size = Le32(e + 120);
+        entry.start = Load32(e + 116);
+        entry.size = Load32(e + 120);
         m_entries.push_back(entry);
     }
     if (m_entries.empty() || m_entries[0].type != 5)
         Fail("no root entry");
-    m_miniFat = ReadTable(Le32(&header[60]), Le32(&header[64]));
+    m_miniFat = ReadTable(Load32(&header[60]), Load32(&header[64]));
 }
 
 std::optional<CompoundFile::Entry> CompoundFile::Find(const std::string& name) const
@@ -109,7 +102,7 @@ std::vector<std::uint32_t> CompoundFile::ReadTable(std::uint32_t start, std::uin
         return table;
     std::vector<unsigned char> bytes = ReadChain(start, static_cast<std::uint64_t>(count) * m_sectorSize, m_fat, m_sectorSize, false);
     for (size_t k = 0; k + 4 <= bytes.size(); k += 4)
-        table.push_back(Le32(&bytes[k]));
+        table.push_back(Load32(&bytes[k]));
     return table;
 }
 

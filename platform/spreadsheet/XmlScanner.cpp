@@ -1,5 +1,7 @@
 #include "platform/spreadsheet/XmlScanner.h"
 
+#include "platform/system/Text.h"
+
 #include <algorithm>
 
 namespace sheet {
@@ -88,24 +90,9 @@ void XmlScanner::Append(std::string& to, const char* bytes, std::size_t count)
 
 void XmlScanner::AppendCodePoint(std::string& to, std::uint32_t cp)
 {
-    char bytes[4];
-    std::size_t count = 0;
-    if (cp < 0x80) {
-        bytes[count++] = static_cast<char>(cp);
-    } else if (cp < 0x800) {
-        bytes[count++] = static_cast<char>(0xC0 | (cp >> 6));
-        bytes[count++] = static_cast<char>(0x80 | (cp & 0x3F));
-    } else if (cp < 0x10000) {
-        bytes[count++] = static_cast<char>(0xE0 | (cp >> 12));
-        bytes[count++] = static_cast<char>(0x80 | ((cp >> 6) & 0x3F));
-        bytes[count++] = static_cast<char>(0x80 | (cp & 0x3F));
-    } else {
-        bytes[count++] = static_cast<char>(0xF0 | (cp >> 18));
-        bytes[count++] = static_cast<char>(0x80 | ((cp >> 12) & 0x3F));
-        bytes[count++] = static_cast<char>(0x80 | ((cp >> 6) & 0x3F));
-        bytes[count++] = static_cast<char>(0x80 | (cp & 0x3F));
-    }
-    Append(to, bytes, count);
+    std::string bytes;
+    text::AppendUtf8(bytes, cp);
+    Append(to, bytes.data(), bytes.size());
 }
 
 XmlScanner::Token XmlScanner::Next()

@@ -1,5 +1,7 @@
 #include "platform/spreadsheet/ZipReader.h"
 
+#include "platform/spreadsheet/LittleEndian.h"
+
 #include <zlib.h>
 
 #include <algorithm>
@@ -16,14 +18,6 @@ constexpr std::uint32_t kDirectoryEndSignature = 0x06054b50u;
 constexpr std::size_t kDirectoryEndSize = 22;
 constexpr std::size_t kLocalHeaderSize = 30;
 constexpr std::size_t kChunk = 64 * 1024;
-
-std::uint32_t Read32(const unsigned char* p)
-{
-    return static_cast<std::uint32_t>(p[0]) | static_cast<std::uint32_t>(p[1]) << 8 |
-           static_cast<std::uint32_t>(p[2]) << 16 | static_cast<std::uint32_t>(p[3]) << 24;
-}
-
-std::uint16_t Read16(const unsigned char* p) { return static_cast<std::uint16_t>(p[0] | p[1] << 8); }
 
 std::vector<unsigned char> ReadAt(std::ifstream& in, std::uint64_t offset, std::size_t length)
 {
@@ -163,16 +157,16 @@ void ZipReader::ReadDirectory()
     std::vector<unsigned char> tail = ReadAt(m_in, m_fileSize - tailLength, static_cast<std::size_t>(tailLength));
     long end = -1;
     for (long i = static_cast<long>(tail.size()) - static_cast<long>(kDirectoryEndSize); i >= 0; --i)
-        if (Read32(&tail[static_cast<std::size_t>(i)]) == kDirectoryEndSignature) {
+        if (Load32(&tail[static_cast<std::size_t>(i)]) == kDirectoryEndSignature) {
             end = i;
             break;
         }
     if (end < 0)
         Fail("no central directory");
     const unsigned char* eocd = &tail[static_cast<std::size_t>(end)];
-    const std::uint32_t count = Read16(eocd + 10);
-    const std::uint32_t directorySize = Read32(eocd + 12);
-    const std::uint32_t directoryOffset = Read32(eocd + 16);
+    const std::uint32_t count = Load16(eocd + 10);
+    const std::uint32_t directorySize = Load32(eocd + 12);
+    const std::uint32_t directoryOffset = Load32(eocd + 16);
     if (count == 0xFFFF || directoryOffset == 0xFFFFFFFFu)
         throw OpenError(m_path, "the zip package uses 64-bit sizes; workbooks that large are not read.");
     if (static_cast<std::uint64_t>(directoryOffset) + directorySize > m_fileSize)
@@ -182,27 +176,27 @@ void ZipReader::ReadDirectory()
     std::uint64_t total = 0;
     std::size_t at = 0;
     for (std::uint32_t n = 0; n < count; ++n) {
-        if (at + 46 > directory.size() || Read32(&directory[at]) != kDirectorySignature)
+        if (at + 46 > directory.size() || Load32(&directory[at]) != kDirectorySignature)
             Fail("bad directory entry " + std::to_string(n + 1));
         const unsigned char* record = &directory[at];
-        const std::size_t nameLength = Read16(record + 28);
-        const std::size_t extra = static_cast<std::size_t>(Read16(record + 30)) + Read16(record + 32);
+        const std::size_t nameLength = Load16(record + 28);
+        const std::size_t extra = static_cast<std::size_t>(Load16(record + 30)) + Load16(record + 32);
         if (at + 46 + nameLength > directory.size())
             Fail("bad directory entry " + std::to_string(n + 1));
         Entry entry;
         entry.name.assign(reinterpret_cast<const char*>(record + 46), nameLength);
-        entry.method = Read16(record + 10);
-        entry.crc = Read32(record + 16);
-        entry.headerOffset = Read32(record + 42);
+        entry.method = Load16(record + 10);
+        entry.crc = Load32(record + 16);
+        entry.headerOffset = Load32(record + 42);
         // The directory's sizes are the ones unpacking trusts (a part's own header may leave them
         // to a descriptor after the data); the own header's must still fit the file and limits.
         std::vector<unsigned char> local = ReadAt(m_in, entry.headerOffset, kLocalHeaderSize);
-        if (local.size() < kLocalHeaderSize || Read32(local.data()) != kLocalHeaderSignature)
+        if (local.size() < kLocalHeaderSize || Load32(local.data()) != kLocalHeaderSignature)
             throw OpenError(m_path, "the zip package is damaged (the part " + entry.name + " is missing).");
-        entry.packedSize = Read32(record + 20);
-        entry.size = Read32(record + 24);
-        const std::uint64_t packed = std::max<std::uint64_t>(entry.packedSize, Read32(local.data() + 18));
-        const std::uint64_t unpacked = std::max<std::uint64_t>(entry.size, Read32(local.data() + 22));
+        entry.packedSize = Load32(record + 20);
+        entry.size = Load32(record + 24);
+        const std::uint64_t packed = std::max<std::uint64_t>(entry.packedSize, Load32(local.data() + 18));
+        const std::uint64_t unpacked = std::max<std::uint64_t>(entry.size, Load32(local.data() + 22));
         if (packed > m_fileSize - entry.headerOffset)
             Fail("the part " + entry.name + " runs past the end of the file");
         if (unpacked > m_limits.maxEntryBytes ||
@@ -232,11 +226,11 @@ std::unique_ptr<ZipReader::PartStream> ZipReader::Open(const Entry& entry)
         throw OpenError(m_path, "the part " + entry.name + " is packed with method " + std::to_string(entry.method) +
                                     ", which is not read.");
     std::vector<unsigned char> local = ReadAt(m_in, entry.headerOffset, kLocalHeaderSize);
-    if (local.size() < kLocalHeaderSize || Read32(local.data()) != kLocalHeaderSignature)
+    if (local.size() < kLocalHeaderSize || Load32(local.data()) != kLocalHeaderSignature)
         throw OpenError(m_path, "the zip package is damaged (the part " + entry.name + " is missing).");
-    if (Read16(local.data() + 6) & 1)
+    if (Load16(local.data() + 6) & 1)
         throw OpenError(m_path, "the part " + entry.name + " is encrypted.");
-    const std::uint64_t dataOffset = entry.headerOffset + kLocalHeaderSize + Read16(local.data() + 26) + Read16(local.data() + 28);
+    const std::uint64_t dataOffset = entry.headerOffset + kLocalHeaderSize + Load16(local.data() + 26) + Load16(local.data() + 28);
     if (dataOffset > m_fileSize || entry.packedSize > m_fileSize - dataOffset)
         Fail("the part " + entry.name + " runs past the end of the file");
     return std::make_unique<Part>(m_path, entry, dataOffset);

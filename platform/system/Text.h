@@ -22,4 +22,7 @@ int AtoI(std::string_view s);
 
 std::string Trim(std::string_view s);
 
+// Appends the UTF-8 bytes of code point `c`.
+void AppendUtf8(std::string& out, char32_t c);
+
 } // namespace text
