@@ -9,7 +9,9 @@ packages=(
   qt6-base-dev libgl-dev
   libpugixml-dev libxlsxwriter-dev zlib1g-dev
   libgtest-dev libgmock-dev libbenchmark-dev
-  python3
+  libexpat1-dev libzip-dev
+  xvfb xauth fonts-dejavu-core
+  python3 python3-xlwt python3-xlrd python3-openpyxl python3-xlsxwriter
 )
 
 missing=()
