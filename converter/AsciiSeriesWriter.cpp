@@ -2,6 +2,7 @@
 
 #include "converter/NumberText.h"
 #include "converter/StampText.h"
+#include "platform/system/Text.h"
 
 #include <cerrno>
 #include <cstring>
@@ -21,8 +22,9 @@ AsciiSeriesWriter::~AsciiSeriesWriter()
 
 std::string AsciiSeriesWriter::CleanField(const std::string& text)
 {
-    // Tabs and line ends would split the field; a double quote would start a quoted field.
-    std::string clean = text;
+    // The file is UTF-8 whatever the input's texts were (text::ToUtf8). Tabs and line ends would
+    // split the field; a double quote would start a quoted field.
+    std::string clean = text::ToUtf8(text);
     for (char& c : clean)
         if (c == '\t' || c == '\n' || c == '\r')
             c = ' ';

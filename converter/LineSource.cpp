@@ -5,18 +5,12 @@
 
 namespace converter {
 
-LineSource::~LineSource()
-{
-    if (m_file)
-        std::fclose(m_file);
-}
-
 Status LineSource::Open(const std::string& path)
 {
     m_path = path;
-    m_file = std::fopen(path.c_str(), "rb");
-    if (!m_file)
-        return m_status = Status::Fail(path, 0, std::string("cannot open the file: ") + std::strerror(errno));
+    m_open = m_input.Open(path);
+    if (!m_open)
+        return m_status = Status::Fail(path, 0, m_input.Error());
     m_buffer.resize(kDefaultBuffer + kReadableAfterLine);
     return m_status;
 }
@@ -39,10 +33,10 @@ bool LineSource::Refill()
         }
         m_buffer.resize(Capacity() * 2 + kReadableAfterLine);
     }
-    const size_t got = std::fread(m_buffer.data() + m_end, 1, Capacity() - m_end, m_file);
+    const size_t got = m_input.Read(m_buffer.data() + m_end, Capacity() - m_end);
     if (got == 0) {
-        if (std::ferror(m_file))
-            m_status = Status::Fail(m_path, m_lineNumber + 1, std::string("read error: ") + std::strerror(errno));
+        if (!m_input.Error().empty())
+            m_status = Status::Fail(m_path, m_lineNumber + 1, m_input.Error());
         m_eof = true;
         return false;
     }
@@ -52,7 +46,7 @@ bool LineSource::Refill()
 
 bool LineSource::Next(std::string_view& line)
 {
-    if (!m_file || !m_status)
+    if (!m_open || !m_status)
         return false;
     size_t searched = m_begin;
     while (true) {

@@ -1,10 +1,11 @@
 #pragma once
-// Reading a text file line by line through one fixed buffer, counting lines from 1. A line longer
-// than the limit fails the read instead of growing memory without bound.
+// Reading a text file line by line through one fixed buffer, counting lines from 1, as UTF-8 (a
+// byte-order mark passed over, UTF-16 converted; see sys::TextFileInput). A line longer than the
+// limit fails the read instead of growing memory without bound.
 #include "converter/Problem.h"
+#include "platform/system/TextFileInput.h"
 
 #include <cstdint>
-#include <cstdio>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -14,13 +15,12 @@ namespace converter {
 class LineSource {
 public:
     static constexpr size_t kDefaultBuffer = 256 * 1024;
-    static constexpr size_t kMaxLineLength = 4 * 1024 * 1024;
+    static constexpr size_t kMaxLineLength = sys::kLongestTextLine;
     // Bytes past the end of every line that may be read, so that a line can be scanned in wide
     // blocks; what they hold is unspecified.
     static constexpr size_t kReadableAfterLine = 64;
 
     LineSource() = default;
-    ~LineSource();
     LineSource(const LineSource&) = delete;
     LineSource& operator=(const LineSource&) = delete;
 
@@ -37,7 +37,8 @@ private:
     bool Refill();
     size_t Capacity() const { return m_buffer.size() - kReadableAfterLine; }
 
-    std::FILE* m_file = nullptr;
+    sys::TextFileInput m_input;
+    bool m_open = false;
     std::string m_path;
     std::vector<char> m_buffer;
     size_t m_begin = 0; // first unread byte

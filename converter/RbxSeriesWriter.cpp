@@ -2,6 +2,7 @@
 
 #include "converter/StampText.h"
 #include "platform/rbx/RbxWriter.h"
+#include "platform/system/Text.h"
 #include "platform/units/Units.h"
 
 #include <cstdio>
@@ -10,16 +11,17 @@ namespace converter {
 
 namespace {
 
+// rbx0 texts are UTF-8; names from 8-bit files are made so as everywhere (text::ToUtf8).
 rbx::ItemInfo DescribeItem(const ItemInfo& item)
 {
     rbx::ItemInfo info;
-    info.name = item.name;
+    info.name = text::ToUtf8(item.name);
     const units::ItemType* type = units::LookupItemType(item.type.empty() ? "Undefined" : item.type);
     info.itemTypeKey = type ? type->key : units::kItemTypeUndefined;
-    info.itemTypeText = item.type.empty() ? "Undefined" : item.type;
+    info.itemTypeText = item.type.empty() ? "Undefined" : text::ToUtf8(item.type);
     const units::Unit* unit = type ? units::LookupUnit(*type, item.unit) : nullptr;
     info.unitKey = unit ? unit->key : units::kUnitUndefined;
-    info.unitText = item.unit;
+    info.unitText = text::ToUtf8(item.unit);
     info.dataType = rbx::kFloat64;
     const int valueType = rbx::ValueTypeFromName(item.valueType);
     info.valueType = valueType < 0 ? rbx::kInstantaneous : valueType;
@@ -35,7 +37,7 @@ Status RbxSeriesWriter::Begin(const std::string& path, const SeriesHeader& heade
 {
     m_path = path;
     m_definition = std::make_unique<rbx::FileDefinition>();
-    m_definition->title = title;
+    m_definition->title = text::ToUtf8(title);
     m_definition->calendar = true;
     m_definition->timeUnitKey = units::kUnitSecond;
     m_definition->timeUnitText = "second";

@@ -6,8 +6,8 @@
 
 namespace converter::xlsx {
 
-// `text` as XML character data, safe inside elements and quoted attributes. Bytes that are not
-// UTF-8 are taken as Latin-1 characters; control characters XML 1.0 cannot carry become blanks.
+// `text` as XML character data, safe inside elements and quoted attributes. Text that is not UTF-8
+// is read as Windows-1252 (text::ToUtf8); control characters XML 1.0 cannot carry become blanks.
 std::string XmlText(std::string_view text);
 
 // "A", "B", ..., "Z", "AA", ... for columns from 1.

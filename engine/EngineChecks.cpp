@@ -4,6 +4,7 @@
 #include "engine/Engine.h"
 
 #include "parsers/ExcelFilePreviewParser.h"
+#include "parsers/ParserFactory.h"
 #include "platform/bridge/BridgeComponent.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
@@ -228,15 +229,12 @@ int CEngine::ParseInputFile(const CString& path)
     if (m_bParsed && text::EqualsNoCase(path, m_strPreviewFile))
         return 1;
     const CString& file = path.empty() ? m_strPreviewFile : path;
-    int result = 0;
-    try {
-        result = m_pParser->Parse(file);
-    } catch (...) {
-        // Unreadable files and spreadsheet automation errors surface as exceptions.
+    // Unreadable files and spreadsheet automation errors surface as exceptions.
+    bool threw = false;
+    const int result = ParseGuarded(*m_pParser, file, &threw);
+    if (threw)
         m_bParsed = 0;
-        return 0;
-    }
-    if (result)
+    else if (result)
         m_bParsed = 1;
     return result;
 }

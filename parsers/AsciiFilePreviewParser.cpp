@@ -9,20 +9,24 @@
 #include "resources/StringTable.h"
 #include "templates/Specification.h"
 
+#include <algorithm>
+
 namespace {
 
-void Show(int stringId) { ui::ShowStringMessage(stringId); }
-
-// Raw lines are shown with tabs opened up, as a list control cannot show them.
+// Raw lines are shown with tabs opened up, as a list control cannot show them, and at most their
+// first kShownLineBytes bytes.
 ui::Row RawRow(const CString& line)
 {
     CString shown;
     size_t from = 0;
-    for (size_t tab = line.find('\t'); tab != CString::npos; from = tab + 1, tab = line.find('\t', from)) {
+    const size_t end = std::min(line.size(), CAsciiFilePreviewParser::kShownLineBytes);
+    for (size_t tab = line.find('\t'); tab < end; from = tab + 1, tab = line.find('\t', from)) {
         shown.append(line, from, tab - from);
         shown += "    ";
     }
-    shown.append(line, from, CString::npos);
+    shown.append(line, from, end - std::min(from, end));
+    if (end < line.size())
+        text::DropPartialCharacter(shown);
     return ui::Row{std::move(shown)};
 }
 
@@ -34,18 +38,18 @@ bool IsKnownValueType(const CString& name)
     return text::EqualsNoCase(name, "Instantaneous") || CSpecification::GetValueTypeCode(name, code);
 }
 
-// The date/time text of a data line: from `start` up to the delimiter in front of `end`, or to the
-// end of the line when the fields ran to it.
-CString DateTimeTextOf(const CString& line, int start, int end)
+// The date/time text of a data line: from `start` up to the delimiter (of `delimiterLength`
+// characters) in front of `end`, or to the end of the line when the fields ran to it.
+CString DateTimeTextOf(const CString& line, int start, int end, int delimiterLength)
 {
     // After a line's trailing delimiter the position stands one past its end: nothing is left.
     if (start >= static_cast<int>(line.size()))
         return CString();
     if (end < 0 || end >= static_cast<int>(line.size()))
         return line.substr(static_cast<size_t>(start));
-    if (end - 1 <= start)
+    if (end - delimiterLength <= start)
         return CString();
-    return line.substr(static_cast<size_t>(start), static_cast<size_t>(end - 1 - start));
+    return line.substr(static_cast<size_t>(start), static_cast<size_t>(end - delimiterLength - start));
 }
 
 } // namespace
@@ -55,15 +59,21 @@ bool CAsciiFilePreviewParser::DeleteValue::Matches(const CString& field) const
     return active && text::EqualsNoCase(field, text);
 }
 
-bool CAsciiFilePreviewParser::HasTemplateAndFile() const
+bool CAsciiFilePreviewParser::HasTemplateAndFile()
 {
-    return m_pSpecification && sys::FileExists(m_strFile);
+    if (!m_pSpecification)
+        return Fail(m_strFile, 0, "there is no template to read it with");
+    if (!sys::FileExists(m_strFile))
+        return Fail(m_strFile, 0, "the file does not exist");
+    return true;
 }
 
 int CAsciiFilePreviewParser::ReadLine(int n, CString& text)
 {
-    if (n < 0 || !sys::FileExists(m_strFile))
+    if (n < 0)
         return 0;
+    if (!sys::FileExists(m_strFile))
+        return Fail(m_strFile, 0, "the file does not exist");
     CTextLineReader reader(m_strFile);
     text.clear();
     int passed = 0;
@@ -79,8 +89,7 @@ bool CAsciiFilePreviewParser::ReadHeaderLine(int n, int emptyMessageId, CString&
     line = ReadLineOrEmpty(n);
     if (!line.empty())
         return true;
-    Show(emptyMessageId);
-    return false;
+    return Refuse(emptyMessageId, n);
 }
 
 CString CAsciiFilePreviewParser::ReadLineOrEmpty(int n)
@@ -102,16 +111,14 @@ CAsciiFilePreviewParser::DeleteValue CAsciiFilePreviewParser::DetermineDeleteVal
     return value;
 }
 
-bool CAsciiFilePreviewParser::CountItemFields(const CString& line, bool isDataLine, int& items)
+bool CAsciiFilePreviewParser::CountItemFields(const CString& line, long number, bool isDataLine, int& items)
 {
     const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
     CFieldCursor cursor(*m_pSpecification, line);
     const CString first = cursor.Next();
     const bool noDelimiter = first == cursor.Line() || (isDataLine && cursor.AtEnd());
-    if (noDelimiter) {
-        Show(isDataLine ? res::IDS_START_ROW_NO_DELIMITER : res::IDS_ITEM_NAME_LINE_NO_DELIMITER);
-        return false;
-    }
+    if (noDelimiter)
+        return Refuse(isDataLine ? res::IDS_START_ROW_NO_DELIMITER : res::IDS_ITEM_NAME_LINE_NO_DELIMITER, number);
     items = 0;
     for (int i = 1; !cursor.AtEnd(); ++i) {
         if (i >= dateTimeFields + 1)
@@ -128,25 +135,23 @@ int CAsciiFilePreviewParser::GetItemCount(int& count)
         return 0;
     const CDataDescription& data = m_pSpecification->m_DataDesc;
     CString startLine;
-    if (data.m_nStartRow < 1 || !ReadLine(data.m_nStartRow, startLine))
+    if (data.m_nStartRow < 1)
+        return Fail(m_strFile, 0, "the template's data start row is below 1");
+    if (!ReadLine(data.m_nStartRow, startLine))
         return 0;
-    if (!CountItemFields(startLine, true, count))
+    if (!CountItemFields(startLine, data.m_nStartRow, true, count))
         return 0;
-    if (count < 1) {
-        Show(res::IDS_ITEM_COUNT_WRONG);
-        return 0;
-    }
+    if (count < 1)
+        return Refuse(res::IDS_ITEM_COUNT_WRONG, data.m_nStartRow);
     if (data.m_nItemTitleOption == 0) {
         CString nameLine;
         if (!ReadHeaderLine(data.m_nItemDescriptionRow, res::IDS_ITEM_NAME_LINE_EMPTY, nameLine))
             return 0;
         int names = 0;
-        if (!CountItemFields(nameLine, false, names))
+        if (!CountItemFields(nameLine, data.m_nItemDescriptionRow, false, names))
             return 0;
-        if (count > names) {
-            Show(res::IDS_NAME_COLUMNS_MISMATCH);
-            return 0;
-        }
+        if (count > names)
+            return Refuse(res::IDS_NAME_COLUMNS_MISMATCH, data.m_nItemDescriptionRow);
     }
     return 1;
 }
@@ -169,7 +174,9 @@ int CAsciiFilePreviewParser::GetItemNames(CStringList& names)
         }
         return 1;
     }
-    if (data.m_nItemTitleOption != 0 || data.m_nItemDescriptionRow < 1)
+    if (data.m_nItemTitleOption != 0)
+        return Fail(m_strFile, 0, text::Format("the template's item title option is %d, not 0 or 1", data.m_nItemTitleOption));
+    if (data.m_nItemDescriptionRow < 1)
         return 0;
     CString line;
     if (!ReadHeaderLine(data.m_nItemDescriptionRow, res::IDS_ITEM_NAME_LINE_EMPTY, line))
@@ -240,7 +247,7 @@ int CAsciiFilePreviewParser::GetItemTypes(CStringList& types)
             types.push_back(definition.m_strType);
         return 1;
     default:
-        return 0;
+        return FailOnOption("item type", data.m_nUnitTypeOption);
     }
 }
 
@@ -271,7 +278,7 @@ int CAsciiFilePreviewParser::GetUnits(CStringList& units)
             units.push_back(definition.m_strUnit);
         return 1;
     default:
-        return 0;
+        return FailOnOption("unit", data.m_nUnitOption);
     }
 }
 
@@ -283,10 +290,8 @@ int CAsciiFilePreviewParser::GetValueTypes(CStringList& valueTypes)
     const CDataDescription& data = m_pSpecification->m_DataDesc;
     switch (data.m_nValueTypeOption) {
     case 0:
-        if (!IsKnownValueType(data.m_strGlobalValueType)) {
-            Show(res::IDS_VALUE_TYPE_INVALID);
-            return 0;
-        }
+        if (!IsKnownValueType(data.m_strGlobalValueType))
+            return Refuse(res::IDS_VALUE_TYPE_INVALID);
         valueTypes.insert(valueTypes.end(), static_cast<size_t>(count), data.m_strGlobalValueType);
         return 1;
     case 1: {
@@ -295,15 +300,11 @@ int CAsciiFilePreviewParser::GetValueTypes(CStringList& valueTypes)
             return 0;
         CFieldCursor cursor(*m_pSpecification, line);
         for (int i = 0; i < count; ++i) {
-            if (cursor.AtEnd()) {
-                Show(res::IDS_VALUE_TYPE_LINE_SHORT);
-                return 0;
-            }
+            if (cursor.AtEnd())
+                return Refuse(res::IDS_VALUE_TYPE_LINE_SHORT, data.m_nValueTypeRow);
             CString valueType = TextAfterColon(cursor.Next());
-            if (!cursor.AtEnd() && !IsKnownValueType(valueType)) {
-                Show(res::IDS_VALUE_TYPE_INVALID);
-                return 0;
-            }
+            if (!cursor.AtEnd() && !IsKnownValueType(valueType))
+                return Refuse(res::IDS_VALUE_TYPE_INVALID, data.m_nValueTypeRow);
             valueTypes.push_back(std::move(valueType));
         }
         return 1;
@@ -313,15 +314,26 @@ int CAsciiFilePreviewParser::GetValueTypes(CStringList& valueTypes)
             valueTypes.push_back(definition.m_strValueType);
         return 1;
     default:
-        return 0;
+        return FailOnOption("value type", data.m_nValueTypeOption);
     }
 }
 
-bool CAsciiFilePreviewParser::AppendMetadataRow(int (CAsciiFilePreviewParser::*get)(CStringList&))
+int CAsciiFilePreviewParser::FailOnOption(const char* what, int option)
+{
+    return Fail(m_strFile, 0, text::Format("the template's %s option is %d, not 0, 1 or 2", what, option));
+}
+
+bool CAsciiFilePreviewParser::AppendMetadataRow(const MetadataRow& kind)
 {
     CStringList values;
-    if (!(this->*get)(values) || values.empty())
+    if (!(this->*kind.get)(values))
         return false;
+    if (values.empty()) {
+        const int option = m_pSpecification->m_DataDesc.*kind.option;
+        if (option == 1)
+            return Fail(m_strFile, m_pSpecification->m_DataDesc.*kind.row, CString("the line gives no ") + kind.what);
+        return Fail(m_strFile, 0, CString("the template gives no ") + kind.what + " (it defines no items)");
+    }
     values.insert(values.begin(), CString());
     m_vecRows.push_back(std::move(values));
     return true;
@@ -330,22 +342,26 @@ bool CAsciiFilePreviewParser::AppendMetadataRow(int (CAsciiFilePreviewParser::*g
 int CAsciiFilePreviewParser::Parse(const CString& /*path*/)
 {
     if (!m_pSpecification)
-        return 0;
+        return Fail(m_strFile, 0, "there is no template to read it with");
     m_vecItemNames.clear();
     m_vecRows.clear();
     m_vecRawLines.clear();
-    if (!AppendMetadataRow(&CAsciiFilePreviewParser::GetItemTypes) ||
-        !AppendMetadataRow(&CAsciiFilePreviewParser::GetUnits) ||
-        !AppendMetadataRow(&CAsciiFilePreviewParser::GetValueTypes))
-        return 0;
-    if (!sys::FileExists(m_strFile))
+    static const MetadataRow kMetadataRows[] = {
+        {&CAsciiFilePreviewParser::GetItemTypes, "item type the unit catalogue knows", &CDataDescription::m_nUnitTypeOption,
+         &CDataDescription::m_nUnitTypeRow},
+        {&CAsciiFilePreviewParser::GetUnits, "unit", &CDataDescription::m_nUnitOption, &CDataDescription::m_nUnitRow},
+        {&CAsciiFilePreviewParser::GetValueTypes, "value type", &CDataDescription::m_nValueTypeOption,
+         &CDataDescription::m_nValueTypeRow},
+    };
+    for (const MetadataRow& kind : kMetadataRows)
+        if (!AppendMetadataRow(kind))
+            return 0;
+    if (!HasTemplateAndFile())
         return 0;
     // Only options 0 to 2 say where the date/time stands; with any other no data line could have one.
     const int option = m_pSpecification->m_TimeDesc.m_nDateTimeOption;
-    if (option < 0 || option > 2) {
-        Show(res::IDS_NO_DATETIME_COLUMN);
-        return 0;
-    }
+    if (option < 0 || option > 2)
+        return Refuse(res::IDS_NO_DATETIME_COLUMN);
     const DeleteValue deleteValue = DetermineDeleteValue();
     int columns = 0;
     if (!ReadColumnCountAndNames(deleteValue, columns))
@@ -374,63 +390,54 @@ bool CAsciiFilePreviewParser::ReadColumnCountAndNames(const DeleteValue& deleteV
 
     // Lines beyond the end of the file read as empty, so the reading stops there.
     CTextLineReader reader(m_strFile);
-    CString line, nameLine, startLine;
-    for (long long n = 1; n <= data.m_nStartRow && reader.ReadLine(line); ++n) {
+    CString nameLine, startLine;
+    for (long long n = 1; n <= data.m_nStartRow; ++n) {
+        const bool wanted = n == data.m_nItemDescriptionRow || n == data.m_nStartRow;
+        CString line;
+        if (!(wanted ? reader.ReadLine(line) : reader.SkipLine()))
+            break;
         if (n == data.m_nItemDescriptionRow)
             nameLine = line;
         if (n == data.m_nStartRow)
             startLine = std::move(line);
     }
-    if (!Contains(startLine, m_pSpecification->GetDelimiterString())) {
-        Show(res::IDS_NO_DELIMITERS);
-        return false;
-    }
+    if (!Contains(startLine, m_pSpecification->GetDelimiterString()))
+        return Refuse(res::IDS_NO_DELIMITERS, data.m_nStartRow);
     columns = CountFieldCalls(*m_pSpecification, startLine) - m_pSpecification->CountFormatColumns(1);
-    if (columns < 1) {
-        Show(res::IDS_NO_ITEM_COLUMN);
-        return false;
-    }
-    if (nameLine.empty()) {
-        Show(res::IDS_ITEM_NAME_LINE_EMPTY);
-        return false;
-    }
+    if (columns < 1)
+        return Refuse(res::IDS_NO_ITEM_COLUMN, data.m_nStartRow);
+    if (nameLine.empty())
+        return Refuse(res::IDS_ITEM_NAME_LINE_EMPTY, data.m_nItemDescriptionRow);
     return ReadNamesFromLine(nameLine, columns, deleteValue);
 }
 
 bool CAsciiFilePreviewParser::ReadNamesFromLine(const CString& nameLine, int columns, const DeleteValue& deleteValue)
 {
+    const long lineNumber = m_pSpecification->m_DataDesc.m_nItemDescriptionRow;
     const int firstDateTimeField = m_pSpecification->GetDateTimeColumn();
     const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
     CFieldCursor cursor(*m_pSpecification, nameLine);
     for (int column = 1; column <= columns; ++column) {
         if (column != firstDateTimeField) {
-            if (cursor.AtEnd() || cursor.Pos() >= cursor.Length()) {
-                Show(res::IDS_NAME_COLUMNS_MISMATCH);
-                return false;
-            }
+            if (cursor.AtEnd() || cursor.Pos() >= cursor.Length())
+                return Refuse(res::IDS_NAME_COLUMNS_MISMATCH, lineNumber);
             CString name = cursor.Next();
-            if (cursor.AtEnd()) {
-                Show(res::IDS_NAME_COLUMNS_MISMATCH);
-                return false;
-            }
+            if (cursor.AtEnd())
+                return Refuse(res::IDS_NAME_COLUMNS_MISMATCH, lineNumber);
             m_vecItemNames.push_back(deleteValue.Matches(name) ? CString() : std::move(name));
             continue;
         }
         // The date/time title: its first field names the column; the others are passed over.
         cursor.Restart();
         for (int i = 1; i < firstDateTimeField; ++i) {
-            if (cursor.AtEnd()) {
-                Show(res::IDS_DATETIME_UNPARSABLE);
-                return false;
-            }
+            if (cursor.AtEnd())
+                return Refuse(res::IDS_DATETIME_UNPARSABLE, lineNumber);
             cursor.Next();
         }
         const int titleStart = cursor.Pos();
         for (int i = 0; i < dateTimeFields; ++i) {
-            if (!cursor.AtEnd() && cursor.Pos() >= cursor.Length()) {
-                Show(res::IDS_ITEM_COUNT_WRONG);
-                return false;
-            }
+            if (!cursor.AtEnd() && cursor.Pos() >= cursor.Length())
+                return Refuse(res::IDS_ITEM_COUNT_WRONG, lineNumber);
             if (!cursor.AtEnd())
                 cursor.Next();
         }
@@ -450,75 +457,67 @@ bool CAsciiFilePreviewParser::ReadHeaderAndDataLines(int columns, const DeleteVa
     const CString delimiter = m_pSpecification->GetDelimiterString();
     CTextLineReader reader(m_strFile);
     CString line;
-    for (long long n = 1; n < startRow && reader.ReadLine(line); ++n)
+    for (long long n = 1; n < startRow && reader.ReadLine(line, kShownLineBytes); ++n)
         m_vecRawLines.push_back(RawRow(line));
     for (int i = 0; i < kPreviewLines && reader.ReadLine(line); ++i) {
         m_vecRawLines.push_back(RawRow(line));
         if (line.empty())
             continue;
-        if (!Contains(line, delimiter)) {
-            Show(res::IDS_NO_DELIMITERS);
-            return false;
-        }
-        if (!ParseDataLine(line, columns, deleteValue))
+        if (!Contains(line, delimiter))
+            return Refuse(res::IDS_NO_DELIMITERS, reader.LineNumber());
+        if (!ParseDataLine(line, reader.LineNumber(), columns, deleteValue))
             return false;
     }
     return true;
 }
 
-bool CAsciiFilePreviewParser::ParseDataLine(const CString& line, int columns, const DeleteValue& deleteValue)
+bool CAsciiFilePreviewParser::ParseDataLine(const CString& line, long number, int columns, const DeleteValue& deleteValue)
 {
     const int firstDateTimeField = m_pSpecification->GetDateTimeColumn();
     const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
+    const CString decimalSeparator = m_pSpecification->GetDecimalSeparatorString();
     CFieldCursor cursor(*m_pSpecification, line);
     ui::Row row;
     bool hasDateTime = false;
     int column = 0;
     while (!cursor.AtEnd()) {
         if (column + 1 == firstDateTimeField) {
-            if (!TakeDateTime(cursor, row, column))
+            if (!TakeDateTime(cursor, number, row, column))
                 return false;
             hasDateTime = true;
         } else {
             CString field = cursor.Next();
             if (!cursor.AtEnd()) {
-                if (!CheckDecimalSeparator(field))
-                    return false;
+                if (!UsesDecimalSeparator(field, decimalSeparator))
+                    return Refuse(res::IDS_DECIMAL_SEPARATOR_MISMATCH, number);
                 row.push_back(deleteValue.Matches(field) ? CString() : std::move(field));
             }
         }
         ++column;
     }
-    if (columns != column - dateTimeFields) {
-        Show(res::IDS_ITEM_COUNT_WRONG);
-        return false;
-    }
-    if (!hasDateTime) {
-        Show(res::IDS_NO_DATETIME_COLUMN);
-        return false;
-    }
+    if (columns != column - dateTimeFields)
+        return Refuse(res::IDS_ITEM_COUNT_WRONG, number);
+    if (!hasDateTime)
+        return Refuse(res::IDS_NO_DATETIME_COLUMN, number);
     m_vecRows.push_back(std::move(row));
     return true;
 }
 
-bool CAsciiFilePreviewParser::TakeDateTime(CFieldCursor& cursor, ui::Row& row, int& column)
+bool CAsciiFilePreviewParser::TakeDateTime(CFieldCursor& cursor, long number, ui::Row& row, int& column)
 {
     const CTimeDescription& time = m_pSpecification->m_TimeDesc;
     const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
     // A format that spans no field would leave the line where it is.
-    if (dateTimeFields < 1) {
-        Show(res::IDS_DATETIME_UNPARSABLE);
-        return false;
-    }
+    if (dateTimeFields < 1)
+        return Refuse(res::IDS_DATETIME_UNPARSABLE, number);
     const int start = cursor.Pos();
     for (int i = 0; i < dateTimeFields; ++i) {
-        if (cursor.AtEnd()) {
-            Show(res::IDS_DATETIME_UNPARSABLE);
-            return false;
-        }
+        if (cursor.AtEnd())
+            return Refuse(res::IDS_DATETIME_UNPARSABLE, number);
         cursor.Next();
     }
-    const CString text = DateTimeTextOf(cursor.Line(), start, cursor.Pos());
+    const int delimiterLength = static_cast<int>(m_pSpecification->GetDelimiterString().size());
+    const CString text = DateTimeTextOf(cursor.Line(), start, cursor.Pos(), delimiterLength);
     CString stamp;
     if (time.m_nDateTimeOption == 1)
         stamp = time.m_strGlobalDate + "  " + text;
@@ -535,29 +534,24 @@ bool CAsciiFilePreviewParser::TakeDateTime(CFieldCursor& cursor, ui::Row& row, i
     return true;
 }
 
-bool CAsciiFilePreviewParser::CheckDecimalSeparator(const CString& field) const
+bool CAsciiFilePreviewParser::UsesDecimalSeparator(const CString& field, const CString& separator)
 {
-    const CString separator = m_pSpecification->GetDecimalSeparatorString();
     if (field.empty() || Contains(field, separator) || (separator != "." && separator != ","))
         return true;
-    const char* other = separator == "." ? "," : ".";
-    if (!Contains(field, other))
-        return true;
-    Show(res::IDS_DECIMAL_SEPARATOR_MISMATCH);
-    return false;
+    return !Contains(field, separator == "." ? "," : ".");
 }
 
 int CAsciiFilePreviewParser::ReadRawLines(const CString& path)
 {
     const CString file = path.empty() ? m_strFile : path;
     if (!sys::FileExists(file))
-        return 0;
+        return Fail(file, 0, "the file does not exist");
     CTextLineReader reader(file);
     m_vecItemNames.clear();
     m_vecRows.clear();
     m_vecRawLines.clear();
     CString line;
-    for (int i = 0; i < kPreviewLines && reader.ReadLine(line); ++i)
+    for (int i = 0; i < kPreviewLines && reader.ReadLine(line, kShownLineBytes); ++i)
         m_vecRawLines.push_back(RawRow(line));
     return 1;
 }

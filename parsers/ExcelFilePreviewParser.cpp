@@ -134,7 +134,8 @@ void CExcelFilePreviewParser::SetFile(const CString& path)
 
 int CExcelFilePreviewParser::OpenWorkbook(const CString& path, CString& message)
 {
-    if (!m_dispApplication || !sys::FileExists(path))
+    // A FIFO or a device would keep the workbook reader waiting.
+    if (!m_dispApplication || !sys::IsRegularFile(path))
         return 0;
     try {
         m_dispWorkbooks.reset();
@@ -143,9 +144,9 @@ int CExcelFilePreviewParser::OpenWorkbook(const CString& path, CString& message)
         m_dispWorkbook = Require(m_dispWorkbooks->Open(path), "Workbook");
         m_dispWorksheets = Require(m_dispWorkbook->Worksheets(), "Worksheets");
         return 1;
-    } catch (const sheet::AutomationError&) {
+    } catch (const sheet::AutomationError& error) {
         message = res::LoadString(res::IDS_FAILED_TO_OPEN_FILE) + path;
-        return 0;
+        return Fail(path, 0, error.what());
     }
 }
 
@@ -168,8 +169,7 @@ int CExcelFilePreviewParser::CheckSheetIndex(int n)
     }
     if (n >= 1 && n <= count)
         return 1;
-    ui::ShowStringMessage(res::IDS_SHEET_INDEX_TOO_LARGE);
-    return 0;
+    return Refuse(res::IDS_SHEET_INDEX_TOO_LARGE);
 }
 
 std::shared_ptr<sheet::Worksheet> CExcelFilePreviewParser::ReachSheet(bool allowNoTemplate)
@@ -513,10 +513,8 @@ int CExcelFilePreviewParser::ReadHeaderRow(int row, CString (*extract)(const CSt
 {
     return ReadItemCells(row, [&](size_t, const CString& cell) {
         CString value = extract(cell);
-        if (value.empty()) {
-            ui::ShowStringMessage(messageId);
-            return false;
-        }
+        if (value.empty())
+            return Refuse(messageId, row) != 0;
         values.push_back(std::move(value));
         return true;
     });
@@ -577,8 +575,15 @@ int CExcelFilePreviewParser::GetValueTypes(CStringList& valueTypes)
 
 bool CExcelFilePreviewParser::BeginReading(const CString& path)
 {
+    const CString file = path.empty() ? m_strFile : path;
+    if (!m_dispApplication)
+        return Fail(file, 0, "the spreadsheet application is not available");
+    if (!sys::FileExists(file))
+        return Fail(file, 0, "the file does not exist");
+    if (!sys::IsRegularFile(file))
+        return Fail(file, 0, "it is not a regular file");
     CString message;
-    if (!OpenWorkbook(path.empty() ? m_strFile : path, message))
+    if (!OpenWorkbook(file, message))
         return false;
     m_vecItemNames.clear();
     m_vecRows.clear();
@@ -589,6 +594,8 @@ bool CExcelFilePreviewParser::BeginReading(const CString& path)
 int CExcelFilePreviewParser::FailParse()
 {
     CloseWorkbook();
+    if (m_strFailure.empty())
+        Fail(m_strFile, 0, "the worksheet cannot be read as the template describes");
     return 0;
 }
 
@@ -611,7 +618,7 @@ bool CExcelFilePreviewParser::ReadDeleteValue(sheet::Worksheet& sheet, CString& 
 int CExcelFilePreviewParser::Parse(const CString& path)
 {
     if (!m_pSpecification)
-        return 0;
+        return Fail(path.empty() ? m_strFile : path, 0, "there is no template to read it with");
     if (!BeginReading(path))
         return 0;
 

@@ -1,6 +1,8 @@
 #include "parsers/FilePreviewParser.h"
 
 #include "platform/system/FileSystem.h"
+#include "platform/system/Text.h"
+#include "resources/StringTable.h"
 #include "templates/Specification.h"
 
 CUIntArray CFilePreviewParser::EffectiveSelection() const
@@ -82,4 +84,16 @@ void CFilePreviewParser::SetFile(const CString& path)
     m_strFile = path;
     if (!path.empty())
         m_strFileTitle = sys::FileTitle(path);
+}
+
+int CFilePreviewParser::Fail(const CString& file, long line, const CString& reason)
+{
+    m_strFailure = line > 0 ? text::Format("%s:%ld: %s", file.c_str(), line, reason.c_str()) : file + ": " + reason;
+    return 0;
+}
+
+int CFilePreviewParser::Refuse(int stringId, long line)
+{
+    ui::ShowStringMessage(stringId);
+    return Fail(m_strFile, line, text::Trim(res::LoadString(stringId)));
 }

@@ -30,11 +30,21 @@ public:
 
     CString m_strFile;
     CString m_strFileTitle;
+    // Why the last operation failed, naming the file and, where one is concerned, its line
+    // ("file:line: reason"); whether or not a message box said so. ParseGuarded empties it first.
+    CString m_strFailure;
     CSpecification* m_pSpecification = nullptr; // not owned
     CUIntArray m_arrItems;
     CStringList m_vecItemNames;
     ui::Rows m_vecRawLines;
     ui::Rows m_vecRows;
+
+protected:
+    // Records why `file` cannot be read (at `line` when above 0) and returns 0.
+    int Fail(const CString& file, long line, const CString& reason);
+    // Shows string `stringId` in a message box, as parsers report a file they cannot read, records it
+    // as the reason about the bound file, and returns 0.
+    int Refuse(int stringId, long line = 0);
 };
 
 // Parsers that read a file through a template.

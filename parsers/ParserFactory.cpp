@@ -60,16 +60,25 @@ bool IsParserOfFormat(const CFilePreviewParser* parser, int format)
     }
 }
 
-int ParseGuarded(CFilePreviewParser& parser, const CString& path, CString* error)
+int ParseGuarded(CFilePreviewParser& parser, const CString& path, bool* threw)
 {
+    const CString file = path.empty() ? parser.m_strFile : path;
+    parser.m_strFailure.clear();
+    int result = 0;
+    bool thrown = true;
     try {
-        return parser.Parse(path);
+        result = parser.Parse(path);
+        thrown = false;
     } catch (const std::exception& exception) {
-        if (error)
-            *error = exception.what();
+        parser.m_strFailure = exception.what();
     } catch (...) {
-        if (error)
-            *error = "the parser stopped with an unknown error";
+        parser.m_strFailure = file + ": the parser stopped with an unknown error";
     }
-    return 0;
+    if (threw)
+        *threw = thrown;
+    if (result)
+        parser.m_strFailure.clear();
+    else if (parser.m_strFailure.empty())
+        parser.m_strFailure = file + ": the file cannot be read";
+    return result;
 }

@@ -20,5 +20,7 @@ std::unique_ptr<CFilePreviewParser> MakeParser(int format);
 bool IsParserOfFormat(const CFilePreviewParser* parser, int format);
 
 // Parse as the setup record runs it: an exception the parser lets through (a file that exists but
-// cannot be read) makes the parse fail with 0; its text goes to `error` when asked for.
-int ParseGuarded(CFilePreviewParser& parser, const CString& path, CString* error = nullptr);
+// cannot be read) makes the parse fail with 0. After a failure the parser's m_strFailure names the
+// file and the reason, whatever ended the parse; after a success it is empty. `threw`, when given,
+// tells whether an exception ended it.
+int ParseGuarded(CFilePreviewParser& parser, const CString& path, bool* threw = nullptr);

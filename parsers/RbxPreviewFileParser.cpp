@@ -5,6 +5,7 @@
 #include "platform/rbx/RbxFormat.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/OleDateTime.h"
+#include "platform/system/Text.h"
 #include "platform/units/Units.h"
 
 #include <cmath>
@@ -16,8 +17,6 @@
 #include <exception>
 #include <memory>
 #include <vector>
-
-namespace {
 
 // A file opened through the library, closed and released however the reading ends.
 class COpenRbxFile {
@@ -43,15 +42,17 @@ private:
     bool m_bOpen = false;
 };
 
-// `path` opened through the library; null when the file is missing or the library refuses it.
-std::unique_ptr<COpenRbxFile> OpenExistingFile(const CString& path)
+namespace {
+
+// Why the library failed on `path`: its own message, made to name the file, else `otherwise`.
+CString LibraryFailure(const CString& path, const CString& otherwise)
 {
     if (!sys::FileExists(path))
-        return nullptr;
-    auto file = std::make_unique<COpenRbxFile>(path);
-    if (!file->IsOpen())
-        return nullptr;
-    return file;
+        return path + ": the file does not exist";
+    const CString message = rbxLastError();
+    if (message.empty())
+        return path + ": " + otherwise;
+    return message.rfind(path + ":", 0) == 0 ? message : path + ": " + message;
 }
 
 struct AxisValues {
@@ -200,6 +201,15 @@ bool ReadValueText(const COpenRbxFile& rbxFile, int dataType, std::vector<unsign
 
 CRbxPreviewFileParser::CRbxPreviewFileParser() { rbxInitSystem(); }
 
+std::unique_ptr<COpenRbxFile> CRbxPreviewFileParser::OpenBoundFile()
+{
+    auto file = sys::FileExists(m_strFile) ? std::make_unique<COpenRbxFile>(m_strFile) : nullptr;
+    if (file && file->IsOpen())
+        return file;
+    m_strFailure = LibraryFailure(m_strFile, "the file cannot be read as an rbx0 file");
+    return nullptr;
+}
+
 int CRbxPreviewFileParser::Parse(const CString& path)
 {
     m_vecItemNames.clear();
@@ -207,16 +217,18 @@ int CRbxPreviewFileParser::Parse(const CString& path)
     m_vecRows.clear();
     rbxInitSystem();
     COpenRbxFile rbxFile(path);
-    if (!rbxFile.IsOpen())
+    if (!rbxFile.IsOpen()) {
+        m_strFailure = LibraryFailure(path, "the file cannot be read as an rbx0 file");
         return 0;
+    }
     rbxHeader* header = rbxFile.Header();
     const int fileType = rbxGetFileType(header);
     if (fileType != rbx::kSharedDeleteValue && fileType != rbx::kPerItemDeleteValue)
-        return 0;
+        return Fail(path, 0, text::Format("the file type is %d; only types 1 and 4 are read", fileType));
     rbxGetDataType(header);
     AxisValues axis;
     if (!ReadAxis(header, axis) || axis.steps < 0)
-        return 0;
+        return Fail(path, 0, text::Format("the time axis (of type %d) cannot be read", axis.type));
     double daysPerUnit = 1.0;
     ruqConvertUnit(axis.unitKey, 1.0, units::kUnitDay, &daysPerUnit);
     const COleDateTime base = BaseStamp(axis, daysPerUnit);
@@ -228,7 +240,7 @@ int CRbxPreviewFileParser::Parse(const CString& path)
     for (int i = 1; i <= itemCount; ++i) {
         rbxItem* item = rbxItemD(header, i);
         if (!item || rbxGetItemAxisType(item) != rbx::kScalarItem)
-            return 0;
+            return Fail(path, 0, text::Format("item %d is not a scalar item (one value per time step)", i));
         CString name;
         int dataType = 0, valueType = 0;
         rbxGetItemInfo(item, nullptr, nullptr, &name, nullptr, nullptr, &dataType);
@@ -249,8 +261,10 @@ int CRbxPreviewFileParser::Parse(const CString& path)
         double stepTime = 0.0;
         for (int dataType : dataTypes) {
             row.emplace_back();
-            if (!ReadValueText(rbxFile, dataType, valueBuffer, stepTime, row.back()))
+            if (!ReadValueText(rbxFile, dataType, valueBuffer, stepTime, row.back())) {
+                m_strFailure = LibraryFailure(path, text::Format("the values of time step %d cannot be read", t + 1));
                 return 0;
+            }
         }
         row.front() = FormatStamp(base.AddDays(StepOffsetDays(axis, t, stepTime, daysPerUnit)));
         m_vecRows.push_back(std::move(row));
@@ -262,7 +276,7 @@ int CRbxPreviewFileParser::Parse(const CString& path)
 int CRbxPreviewFileParser::GetItemNames(CStringList& names)
 {
     names.clear();
-    const std::unique_ptr<COpenRbxFile> opened = OpenExistingFile(m_strFile);
+    const std::unique_ptr<COpenRbxFile> opened = OpenBoundFile();
     if (!opened)
         return 0;
     const COpenRbxFile& rbxFile = *opened;
@@ -292,7 +306,7 @@ int CRbxPreviewFileParser::GetItemNames(CStringList& names)
 int CRbxPreviewFileParser::ReadItemTexts(ItemText which, CStringList& texts)
 {
     texts.clear();
-    const std::unique_ptr<COpenRbxFile> opened = OpenExistingFile(m_strFile);
+    const std::unique_ptr<COpenRbxFile> opened = OpenBoundFile();
     if (!opened)
         return 0;
     const COpenRbxFile& rbxFile = *opened;
@@ -301,7 +315,7 @@ int CRbxPreviewFileParser::ReadItemTexts(ItemText which, CStringList& texts)
         for (int i = 1; i <= itemCount; ++i) {
             rbxItem* item = rbxItemD(rbxFile.Header(), i);
             if (!item || rbxGetItemAxisType(item) != rbx::kScalarItem)
-                return 0;
+                return Fail(m_strFile, 0, text::Format("item %d is not a scalar item (one value per time step)", i));
             CString typeText, unitText;
             rbxGetItemInfo(item, nullptr, &typeText, nullptr, nullptr, &unitText, nullptr);
             if (which == ItemText::Type)

@@ -3,6 +3,10 @@
 // needed. Every time step becomes a row of the result table, stamped from the file's time axis.
 #include "parsers/FilePreviewParser.h"
 
+#include <memory>
+
+class COpenRbxFile;
+
 class CRbxPreviewFileParser : public CFilePreviewParser {
 public:
     CRbxPreviewFileParser(); // prepares the rbx data-file library
@@ -19,6 +23,8 @@ public:
 
 private:
     enum class ItemText { Type, Unit, None };
+    // The bound file opened through the library; null, with the reason recorded, when it cannot be.
+    std::unique_ptr<COpenRbxFile> OpenBoundFile();
     // Reads every item's type or unit text into `texts`; 0 when the file cannot be read or an item
     // is not scalar.
     int ReadItemTexts(ItemText which, CStringList& texts);

@@ -1,61 +1,62 @@
 #include "parsers/TextLineReader.h"
 
 #include "parsers/FileException.h"
+#include "platform/system/Text.h"
 
-#include <cerrno>
 #include <cstring>
 
-CTextLineReader::CTextLineReader(const CString& path)
-    : m_strPath(path), m_file(std::fopen(path.c_str(), "rb")), m_buffer(1 << 16)
+CTextLineReader::CTextLineReader(const CString& path) : m_strPath(path), m_buffer(1 << 16)
 {
-    if (!m_file)
-        throw CFileException(path, std::strerror(errno));
+    if (!m_input.Open(path))
+        Refuse(m_input.Error());
 }
+
+void CTextLineReader::Refuse(const CString& reason) const { throw CFileException(m_strPath, reason); }
 
 bool CTextLineReader::Fill()
 {
     m_nBegin = 0;
-    m_nEnd = std::fread(m_buffer.data(), 1, m_buffer.size(), m_file.get());
-    if (m_nEnd == 0 && std::ferror(m_file.get()))
-        throw CFileException(m_strPath, std::strerror(errno ? errno : EIO));
+    m_nEnd = m_input.Read(m_buffer.data(), m_buffer.size());
+    if (m_nEnd == 0 && !m_input.Error().empty())
+        Refuse(text::Format("line %ld: %s", m_nLine + 1, m_input.Error().c_str()));
     return m_nEnd > 0;
 }
 
-bool CTextLineReader::ReadLine(CString& line)
+bool CTextLineReader::Walk(CString* line, size_t keep)
 {
-    line.clear();
     bool readAny = false;
+    size_t length = 0;
     while (m_nBegin < m_nEnd || Fill()) {
         readAny = true;
         const char* begin = m_buffer.data() + m_nBegin;
         const auto* newline = static_cast<const char*>(std::memchr(begin, '\n', m_nEnd - m_nBegin));
-        if (newline) {
-            line.append(begin, newline);
-            m_nBegin += static_cast<size_t>(newline - begin) + 1;
+        const size_t piece = newline ? static_cast<size_t>(newline - begin) : m_nEnd - m_nBegin;
+        length += piece;
+        if (length > sys::kLongestTextLine)
+            Refuse(text::Format("line %ld has no line break within %zu bytes; this is not a delimited text file",
+                                m_nLine + 1, sys::kLongestTextLine));
+        if (line && line->size() < keep)
+            line->append(begin, std::min(piece, keep - line->size()));
+        m_nBegin += piece + (newline ? 1 : 0);
+        if (newline)
             break;
-        }
-        line.append(begin, m_nEnd - m_nBegin);
-        m_nBegin = m_nEnd;
     }
-    if (!readAny)
+    if (readAny)
+        ++m_nLine;
+    m_nLastLength = length;
+    return readAny;
+}
+
+bool CTextLineReader::ReadLine(CString& line, size_t keep)
+{
+    line.clear();
+    if (!Walk(&line, keep))
         return false;
-    if (!line.empty() && line.back() == '\r')
+    if (line.size() < m_nLastLength)
+        text::DropPartialCharacter(line); // keep what was kept well-formed
+    else if (!line.empty() && line.back() == '\r')
         line.pop_back();
     return true;
 }
 
-bool CTextLineReader::SkipLine()
-{
-    bool readAny = false;
-    while (m_nBegin < m_nEnd || Fill()) {
-        readAny = true;
-        const char* begin = m_buffer.data() + m_nBegin;
-        const auto* newline = static_cast<const char*>(std::memchr(begin, '\n', m_nEnd - m_nBegin));
-        if (newline) {
-            m_nBegin += static_cast<size_t>(newline - begin) + 1;
-            return true;
-        }
-        m_nBegin = m_nEnd;
-    }
-    return readAny;
-}
+bool CTextLineReader::SkipLine() { return Walk(nullptr, 0); }

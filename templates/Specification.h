@@ -70,7 +70,8 @@ public:
     void SetTemplateFile(const CString& path);
     CString GetDelimiterString() const;
     CString GetDecimalSeparatorString() const;
-    // The separator text of a separator name, compared exactly; "User Locale" asks the process locale.
+    // The separator text of a separator name, compared exactly; "User Locale" asks the user's locale
+    // (sys::LocaleDecimalSeparator).
     // 0 (and a blank) for an unknown name.
     static int MapSeparatorName(const CString& name, CString& text);
     // The next field of `line` from `pos` (0 for the first call); `pos` becomes -1 after the last

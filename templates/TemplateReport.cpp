@@ -45,7 +45,7 @@ CString JsonString(const CString& value)
         } else if (c < 0x20) {
             out += text::Format("\\u%04x", c);
         } else if (c >= 0x80) {
-            size_t length = Utf8SequenceLength(value, i);
+            size_t length = text::Utf8SequenceLength(value, i);
             if (length == 0) {
                 out += "\xEF\xBF\xBD";
                 ++i;

@@ -1,6 +1,8 @@
 #include "templates/TemplateXml.h"
 
+#include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
+#include "templates/WellFormedXml.h"
 
 #include <cerrno>
 #include <climits>
@@ -24,28 +26,14 @@ bool DecodeUtf16(std::string_view bytes, bool bigEndian, std::string& utf8, CStr
         error = "the UTF-16 text has an odd number of bytes";
         return false;
     }
-    auto unit = [&](size_t i) -> char32_t {
-        auto hi = static_cast<unsigned char>(bytes[bigEndian ? i : i + 1]);
-        auto lo = static_cast<unsigned char>(bytes[bigEndian ? i + 1 : i]);
-        return static_cast<char32_t>((hi << 8) | lo);
-    };
     utf8.clear();
     utf8.reserve(bytes.size());
-    for (size_t i = 0; i < bytes.size(); i += 2) {
-        char32_t c = unit(i);
-        if (c >= 0xD800 && c <= 0xDBFF && i + 2 < bytes.size()) {
-            char32_t low = unit(i + 2);
-            if (low >= 0xDC00 && low <= 0xDFFF) {
-                text::AppendUtf8(utf8, 0x10000 + ((c - 0xD800) << 10) + (low - 0xDC00));
-                i += 2;
-                continue;
-            }
-        }
-        if (c >= 0xD800 && c <= 0xDFFF) {
-            error = text::Format("the UTF-16 text has an unpaired surrogate at byte %zu", i);
-            return false;
-        }
-        text::AppendUtf8(utf8, c);
+    size_t unpairedAt = 0;
+    const size_t used = text::AppendUtf16AsUtf8(bytes, bigEndian, utf8, unpairedAt);
+    if (used < bytes.size()) {
+        error = text::Format("the UTF-16 text has an unpaired surrogate at byte %zu",
+                             unpairedAt == std::string_view::npos ? used : unpairedAt);
+        return false;
     }
     return true;
 }
@@ -247,8 +235,45 @@ bool AppendList(pugi::xml_node& extension, const char* listName, const char* ent
         return false;
     for (const CItemDefinition& item : items) {
         pugi::xml_node entry = list.append_child(entryName);
-        if (!entry || !entry.text().set(RepairUtf8(item.*field).c_str()))
+        if (!entry || !entry.text().set(text::ToUtf8(item.*field).c_str()))
             return false;
+    }
+    return true;
+}
+
+// The first character of `utf8` that an XML 1.0 file cannot hold even as a reference (a control
+// character other than tab, line feed and carriage return; U+FFFE; U+FFFF), or 0 when there is none.
+char32_t CharacterXmlCannotCarry(std::string_view utf8)
+{
+    for (size_t i = 0; i < utf8.size(); ++i) {
+        const auto c = static_cast<unsigned char>(utf8[i]);
+        if (c < 0x20 && c != '\t' && c != '\n' && c != '\r')
+            return c;
+        const bool nonCharacter = c == 0xEF && i + 2 < utf8.size() && static_cast<unsigned char>(utf8[i + 1]) == 0xBF &&
+                                  static_cast<unsigned char>(utf8[i + 2]) >= 0xBE;
+        if (nonCharacter)
+            return static_cast<unsigned char>(utf8[i + 2]) == 0xBE ? 0xFFFE : 0xFFFF;
+    }
+    return 0;
+}
+
+// False, with `error` naming the value, when a text of the template could not be written as XML.
+bool CheckWritable(CSpecification& spec, const FileLayout& layout, CString& error)
+{
+    auto refuse = [&error](const CString& what, char32_t c) {
+        error = text::Format("%s holds the character U+%04X, which an XML file cannot carry", what.c_str(),
+                             static_cast<unsigned>(c));
+        return false;
+    };
+    for (const AttributeRule& rule : layout.attributes)
+        if (char32_t c = CharacterXmlCannotCarry(text::ToUtf8(AttributeText(rule, spec))))
+            return refuse(CString("the value of ") + rule.name, c);
+    const auto& items = spec.m_DataDesc.m_vecItemDefs;
+    for (size_t i = 0; i < items.size(); ++i) {
+        const CItemDefinition& item = items[i];
+        for (const CString* field : {&item.m_strTitle, &item.m_strType, &item.m_strUnit, &item.m_strValueType})
+            if (char32_t c = CharacterXmlCannotCarry(text::ToUtf8(*field)))
+                return refuse(text::Format("item definition %zu", i + 1), c);
     }
     return true;
 }
@@ -262,7 +287,7 @@ bool BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_doc
     if (!root || !root.append_attribute("xmlns:xsi").set_value(kSchemaInstanceNamespace))
         return false;
     for (const AttributeRule& rule : layout.attributes)
-        if (!root.append_attribute(rule.name).set_value(RepairUtf8(AttributeText(rule, spec)).c_str()))
+        if (!root.append_attribute(rule.name).set_value(text::ToUtf8(AttributeText(rule, spec)).c_str()))
             return false;
     pugi::xml_node extension = root.append_child(layout.extension);
     if (!extension)
@@ -278,47 +303,12 @@ bool BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_doc
 
 } // namespace
 
-size_t Utf8SequenceLength(std::string_view s, size_t i)
-{
-    auto byte = [&](size_t k) { return static_cast<unsigned char>(s[k]); };
-    unsigned char lead = byte(i);
-    size_t length = lead < 0x80 ? 1 : (lead >> 5) == 0x6 ? 2 : (lead >> 4) == 0xE ? 3 : (lead >> 3) == 0x1E ? 4 : 0;
-    if (length == 0 || i + length > s.size())
-        return 0;
-    char32_t code = length == 1 ? lead : lead & (0x7F >> length);
-    for (size_t k = 1; k < length; ++k) {
-        if ((byte(i + k) & 0xC0) != 0x80)
-            return 0;
-        code = (code << 6) | (byte(i + k) & 0x3F);
-    }
-    static const char32_t kSmallest[] = {0, 0, 0x80, 0x800, 0x10000};
-    if (code < kSmallest[length] || code > 0x10FFFF || (code >= 0xD800 && code <= 0xDFFF))
-        return 0;
-    return length;
-}
-
-CString RepairUtf8(std::string_view text)
-{
-    CString out;
-    out.reserve(text.size());
-    for (size_t i = 0; i < text.size();) {
-        size_t length = Utf8SequenceLength(text, i);
-        if (length == 0) {
-            text::AppendUtf8(out, static_cast<unsigned char>(text[i]));
-            ++i;
-        } else {
-            out.append(text, i, length);
-            i += length;
-        }
-    }
-    return out;
-}
-
 bool ReadFileBytes(const CString& path, std::string& bytes, CString& error)
 {
-    File file(std::fopen(path.c_str(), "rb"));
+    std::string problem;
+    File file(sys::OpenRegularFile(path, problem));
     if (!file) {
-        error = path + ": cannot be opened: " + std::strerror(errno);
+        error = path + ": " + problem;
         return false;
     }
     try {
@@ -361,7 +351,7 @@ bool DecodeToUtf8(std::string_view bytes, std::string& utf8, CString& error)
         return DecodeUtf16(bytes, true, utf8, error);
     if (StartsWith(bytes, "\xEF\xBB\xBF"sv))
         bytes.remove_prefix(3);
-    utf8 = RepairUtf8(bytes);
+    utf8 = text::ToUtf8(bytes);
     return true;
 }
 
@@ -372,25 +362,19 @@ bool ParseDocument(std::string_view bytes, const CString& name, pugi::xml_docume
         error = name + ": " + error;
         return false;
     }
+    if (!IsWellFormedXml(utf8, error)) {
+        error = name + ": " + error;
+        return false;
+    }
     // Comments and processing instructions are kept because they count as entries of the item
     // lists; literal tabs and line feeds in attribute values are kept as written.
     const unsigned flags = (pugi::parse_default & ~pugi::parse_wconv_attribute) | pugi::parse_comments |
-                           pugi::parse_pi | pugi::parse_doctype | pugi::parse_declaration;
+                           pugi::parse_pi | pugi::parse_declaration;
     pugi::xml_parse_result result = document.load_buffer(utf8.data(), utf8.size(), flags, pugi::encoding_utf8);
     if (!result) {
-        error = name + ": not a well-formed XML document (" + result.description() + " at " +
+        error = name + ": the XML document cannot be stored (" + result.description() + " at " +
                 Position(utf8, static_cast<size_t>(result.offset)) + ")";
         return false;
-    }
-    for (pugi::xml_node child : document.children()) {
-        if (child.type() == pugi::node_doctype) {
-            error = name + ": a document type declaration is not accepted in a template file";
-            return false;
-        }
-        if (child.type() == pugi::node_declaration && child != document.first_child()) {
-            error = name + ": the XML declaration must be at the start of the document";
-            return false;
-        }
     }
     if (ElementDepth(document, kMaxElementDepth) > kMaxElementDepth) {
         error = text::Format("%s: elements nested deeper than %d levels", name.c_str(), kMaxElementDepth);
@@ -440,6 +424,10 @@ bool WriteTemplate(CSpecification& spec, const FileLayout& layout, const CString
 {
     if (path.empty()) {
         error = "no file name to save the template to";
+        return false;
+    }
+    if (!CheckWritable(spec, layout, error)) {
+        error = path + ": " + error;
         return false;
     }
     std::string contents;

@@ -21,19 +21,12 @@ inline constexpr int kMaxElementDepth = 1000;
 inline constexpr const char* kDeclarationData = "version='1.0'   encoding='UTF-16'";
 inline constexpr const char* kSchemaInstanceNamespace = "http://www.w3.org/2001/XMLSchema-instance";
 
-// Length of the well-formed UTF-8 sequence at `i` (no overlong forms, surrogates or values past
-// U+10FFFF), or 0 when there is none.
-size_t Utf8SequenceLength(std::string_view text, size_t i);
-// `text` with every byte that is not part of well-formed UTF-8 read as Latin-1, so text taken from
-// 8-bit files stays legible and every written template can be read back.
-CString RepairUtf8(std::string_view text);
-
 // Reads at most kMaxFileBytes of `path`; false with `error` set when the file cannot be read or is larger.
 bool ReadFileBytes(const CString& path, std::string& bytes, CString& error);
 
-// The text of a file in UTF-8, from UTF-8 (with or without a byte-order mark; stray bytes read as
-// Latin-1) or UTF-16 of either byte order (told by its byte-order mark, or by the first character
-// being "<").
+// The text of a file in UTF-8, from UTF-8 (with or without a byte-order mark; a file that is not
+// well-formed UTF-8 is read as Windows-1252, text::ToUtf8) or UTF-16 of either byte order (told by
+// its byte-order mark, or by the first character being "<").
 bool DecodeToUtf8(std::string_view bytes, std::string& utf8, CString& error);
 
 // Parses a template file's bytes; `name` is used in messages. Refuses DTDs and deep nesting.

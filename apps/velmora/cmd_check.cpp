@@ -125,8 +125,9 @@ CheckResult CheckPreview(CEngine& engine)
     ui::ScopedUserInterface scoped(recorder);
     if (engine.ParseInputFile(file))
         return {"preview", true, "the parser reads " + Quoted(file)};
-    CString why = recorder.boxes.empty() ? CString("the parser cannot read it") : recorder.boxes.front().text;
-    return {"preview", false, Quoted(file) + ": " + why};
+    if (!engine.m_pParser)
+        return {"preview", false, Quoted(file) + ": there is no parser for the input format"};
+    return {"preview", false, engine.m_pParser->m_strFailure};
 }
 
 CheckResult CheckOutput(CEngine& engine)

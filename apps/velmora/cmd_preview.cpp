@@ -2,6 +2,7 @@
 // file the way the wizard's preview does and prints what the parser made of it.
 #include "apps/velmora/Commands.h"
 #include "parsers/ParserFactory.h"
+#include "platform/system/Text.h"
 #include "platform/ui/UserInterface.h"
 
 #include <algorithm>
@@ -21,7 +22,8 @@ void PrintHelp()
         "Prints the file's first lines (\"Input file\") and the parsed table (\"Import result\"); message\n"
         "boxes the parser shows go to stderr. With --json one object instead:\n"
         "  {\"ok\", \"messages\": [{\"text\", \"caption\"}], \"itemNames\", \"rows\", \"rawLines\",\n"
-        "   \"previewTitles\", \"previewRows\"}  (plus \"error\" when the file could not be read).\n\n"
+        "   \"previewTitles\", \"previewRows\"}, plus \"error\" when the parse failed: the file, the line\n"
+        "   where one is concerned, and why (\"FILE:LINE: reason\").\n\n"
         "Exit status: 0 when the parse succeeded, 1 when it failed, 2 for bad usage.\n");
 }
 
@@ -106,48 +108,13 @@ void WithPreviewRows(const CFilePreviewParser& parser, Use use)
 
 // --- JSON output -----------------------------------------------------------------------------------
 
-// Appends `text` as a JSON string. Bytes that are not UTF-8 become U+FFFD, so the output stays valid.
-void AppendJsonString(std::string& out, const std::string& text)
-{
-    out += '"';
-    for (size_t i = 0; i < text.size();) {
-        const auto c = static_cast<unsigned char>(text[i]);
-        if (c == '"' || c == '\\') {
-            out += '\\';
-            out += static_cast<char>(c);
-            ++i;
-        } else if (c < 0x20) {
-            char escaped[8];
-            std::snprintf(escaped, sizeof(escaped), "\\u%04x", c);
-            out += escaped;
-            ++i;
-        } else if (c < 0x80) {
-            out += static_cast<char>(c);
-            ++i;
-        } else {
-            const size_t length = c >= 0xF0 && c <= 0xF4 ? 4 : c >= 0xE0 ? 3 : c >= 0xC2 && c < 0xE0 ? 2 : 0;
-            bool valid = length > 0 && i + length <= text.size();
-            for (size_t k = 1; valid && k < length; ++k)
-                valid = (static_cast<unsigned char>(text[i + k]) & 0xC0) == 0x80;
-            if (valid) {
-                out.append(text, i, length);
-                i += length;
-            } else {
-                out += "\xEF\xBF\xBD";
-                ++i;
-            }
-        }
-    }
-    out += '"';
-}
-
 void AppendJsonList(std::string& out, const CStringList& list)
 {
     out += '[';
     for (size_t i = 0; i < list.size(); ++i) {
         if (i)
             out += ',';
-        AppendJsonString(out, list[i]);
+        text::AppendJsonString(out, list[i]);
     }
     out += ']';
 }
@@ -168,21 +135,21 @@ void WriteJsonRows(std::FILE* stream, const char* key, const ui::Rows& rows)
     std::fputs("]", stream);
 }
 
-void WriteJson(const CFilePreviewParser& parser, bool ok, const ui::ScriptedUserInterface& ui, const CString& error)
+void WriteJson(const CFilePreviewParser& parser, bool ok, const ui::ScriptedUserInterface& ui)
 {
     std::string head = std::string("{\"ok\":") + (ok ? "true" : "false") + ",\n\"messages\":[";
     for (size_t i = 0; i < ui.boxes.size(); ++i) {
         head += i ? "," : "";
         head += "{\"text\":";
-        AppendJsonString(head, ui.boxes[i].text);
+        text::AppendJsonString(head, ui.boxes[i].text);
         head += ",\"caption\":";
-        AppendJsonString(head, ui.boxes[i].caption);
+        text::AppendJsonString(head, ui.boxes[i].caption);
         head += '}';
     }
     head += "]";
-    if (!error.empty()) {
+    if (!ok) {
         head += ",\n\"error\":";
-        AppendJsonString(head, error);
+        text::AppendJsonString(head, parser.m_strFailure);
     }
     head += ",\n\"itemNames\":";
     AppendJsonList(head, parser.m_vecItemNames);
@@ -213,7 +180,7 @@ void PrintTable(const CStringList& titles, const ui::Rows& rows)
     auto print = [&widths](const ui::Row& row) {
         std::string line;
         for (size_t j = 0; j < row.size(); ++j) {
-            line += row[j];
+            line += text::ToUtf8(row[j]);
             if (j + 1 < row.size())
                 line.append(row[j].size() < widths[j] ? widths[j] - row[j].size() + 2 : 2, ' ');
         }
@@ -230,12 +197,10 @@ void PrintTable(const CStringList& titles, const ui::Rows& rows)
         print(row);
 }
 
-void WriteText(const CFilePreviewParser& parser, bool ok, const ui::ScriptedUserInterface& ui, const CString& error)
+void WriteText(const CFilePreviewParser& parser, bool ok, const ui::ScriptedUserInterface& ui)
 {
     for (const auto& box : ui.boxes)
         std::fprintf(stderr, "velmora preview: message: %s\n", box.text.c_str());
-    if (!error.empty())
-        std::fprintf(stderr, "velmora preview: %s\n", error.c_str());
     if (!parser.m_vecRawLines.empty()) {
         std::printf("Input file\n");
         PrintTable({}, parser.m_vecRawLines);
@@ -243,7 +208,10 @@ void WriteText(const CFilePreviewParser& parser, bool ok, const ui::ScriptedUser
     }
     std::printf("Import result\n");
     WithPreviewRows(parser, [&parser](const ui::Rows& rows) { PrintTable(parser.BuildPreviewTitles(), rows); });
-    std::printf("\n%s\n", ok ? "Parse succeeded." : "Parse failed.");
+    if (ok)
+        std::printf("\nParse succeeded.\n");
+    else
+        std::printf("\nParse failed: %s\n", parser.m_strFailure.c_str());
 }
 
 int RunPreview(int argc, char** argv)
@@ -271,12 +239,11 @@ int RunPreview(int argc, char** argv)
     parser->SetFile(options.file);
     parser->m_arrItems = options.items;
 
-    CString error;
-    const bool ok = ParseGuarded(*parser, options.file, &error) != 0;
+    const bool ok = ParseGuarded(*parser, options.file) != 0;
     if (options.json)
-        WriteJson(*parser, ok, recorder, error);
+        WriteJson(*parser, ok, recorder);
     else
-        WriteText(*parser, ok, recorder, error);
+        WriteText(*parser, ok, recorder);
     std::fflush(stdout);
     return ok ? host::kSuccess : host::kFailed;
 }

@@ -4,6 +4,7 @@
 #include "platform/rbx/RbxBytes.h"
 #include "platform/rbx/RbxHeaderCodec.h"
 #include "platform/system/Text.h"
+#include "platform/system/FileSystem.h"
 
 #include <algorithm>
 #include <cmath>
@@ -85,10 +86,13 @@ bool CRbxReader::Open(const CString& path, VerifyChecksum verify)
     m_state->path = path;
     m_strError.clear();
     State& s = *m_state;
-    s.file.reset(std::fopen(path.c_str(), "rb"));
+    std::string problem;
+    s.file.reset(sys::OpenRegularFile(path, problem));
     struct stat info {};
-    if (!s.file || fstat(fileno(s.file.get()), &info) != 0 || !S_ISREG(info.st_mode))
-        return Fail("cannot open the file for reading");
+    if (!s.file)
+        return Fail(problem);
+    if (fstat(fileno(s.file.get()), &info) != 0)
+        return Fail("cannot examine the file");
     s.fileSize = static_cast<std::uint64_t>(info.st_size);
     return ReadHeader(verify);
 }

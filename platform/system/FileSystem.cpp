@@ -1,14 +1,33 @@
 #include "platform/system/FileSystem.h"
 
-#include <clocale>
+#include <cerrno>
 #include <cstdio>
+#include <cstring>
 #include <cstdlib>
 #include <dirent.h>
 #include <dlfcn.h>
+#include <fcntl.h>
+#include <langinfo.h>
+#include <locale.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 namespace sys {
+
+namespace {
+
+std::string KindOfSpecialFile(mode_t mode)
+{
+    if (S_ISDIR(mode))
+        return "it is a folder, not a file";
+    if (S_ISFIFO(mode))
+        return "it is a FIFO (a named pipe), not a regular file";
+    if (S_ISSOCK(mode))
+        return "it is a socket, not a regular file";
+    return "it is a device, not a regular file";
+}
+
+} // namespace
 
 unsigned GetTempPath(unsigned bufferLength, std::string& folder)
 {
@@ -36,6 +55,36 @@ std::optional<FileAttributes> GetAttributes(const std::string& path)
 }
 
 bool FileExists(const std::string& path) { return !path.empty() && ::access(path.c_str(), F_OK) == 0; }
+
+std::FILE* OpenRegularFile(const std::string& path, std::string& error)
+{
+    // Without O_NONBLOCK opening a FIFO would wait for a writer.
+    const int fd = ::open(path.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY);
+    if (fd < 0) {
+        error = std::string("cannot be opened: ") + std::strerror(errno);
+        return nullptr;
+    }
+    struct stat info {};
+    if (::fstat(fd, &info) != 0) {
+        error = std::string("cannot examine the file: ") + std::strerror(errno);
+        ::close(fd);
+        return nullptr;
+    }
+    if (!S_ISREG(info.st_mode)) {
+        error = KindOfSpecialFile(info.st_mode);
+        ::close(fd);
+        return nullptr;
+    }
+    const int flags = ::fcntl(fd, F_GETFL);
+    if (flags != -1)
+        ::fcntl(fd, F_SETFL, flags & ~O_NONBLOCK);
+    std::FILE* file = ::fdopen(fd, "rb");
+    if (!file) {
+        error = std::string("cannot be opened: ") + std::strerror(errno);
+        ::close(fd);
+    }
+    return file;
+}
 
 bool IsRegularFile(const std::string& path)
 {
@@ -99,10 +148,27 @@ std::string JoinPath(const std::string& folder, const std::string& name)
 
 std::string LocaleDecimalSeparator()
 {
-    const std::lconv* conv = std::localeconv();
-    if (!conv || !conv->decimal_point || !*conv->decimal_point)
-        return std::string();
-    return conv->decimal_point;
+    // The user's locale is the environment's (LC_ALL, else LC_NUMERIC, else LANG), asked for on its
+    // own: the process keeps the "C" locale, on which number formatting everywhere else relies.
+    auto variable = [](const char* name) {
+        const char* value = std::getenv(name);
+        return std::string(value ? value : "");
+    };
+    const std::string key = variable("LC_ALL") + '\n' + variable("LC_NUMERIC") + '\n' + variable("LANG") + '\n' +
+                            variable("LOCPATH");
+    thread_local std::string cachedKey = "\n"; // never a key, which holds three line feeds
+    thread_local std::string cachedSeparator;
+    if (key == cachedKey)
+        return cachedSeparator;
+    std::string separator;
+    if (locale_t locale = ::newlocale(LC_NUMERIC_MASK, "", static_cast<locale_t>(nullptr))) {
+        const char* radix = ::nl_langinfo_l(RADIXCHAR, locale);
+        separator = radix ? radix : "";
+        ::freelocale(locale);
+    }
+    cachedKey = key;
+    cachedSeparator = separator;
+    return separator;
 }
 
 std::string ModuleFolder(const void* address)

@@ -2,6 +2,7 @@
 // The system services the plug-in asks for: temporary folder, file attributes, folder listing,
 // file titles, deletion and the locale's decimal separator.
 #include <cstdint>
+#include <cstdio>
 #include <optional>
 #include <string>
 #include <vector>
@@ -23,6 +24,10 @@ struct FileAttributes {
 std::optional<FileAttributes> GetAttributes(const std::string& path);
 
 bool FileExists(const std::string& path);      // exists, of any kind
+// Opens `path` for reading when it is a regular file, never waiting on a FIFO (a FIFO or a device
+// could keep a reader waiting or feed it without end); null with `error` saying why otherwise. The
+// caller closes the file.
+std::FILE* OpenRegularFile(const std::string& path, std::string& error);
 bool IsRegularFile(const std::string& path);
 bool IsDirectory(const std::string& path);
 std::optional<std::int64_t> FileSize(const std::string& path);
@@ -39,7 +44,8 @@ std::string FolderOf(const std::string& path);
 // `folder` joined with `name`, with exactly one "/" between.
 std::string JoinPath(const std::string& folder, const std::string& name);
 
-// The decimal separator of the process locale (LC_NUMERIC), or empty when it cannot be asked.
+// The decimal separator of the user's locale as the environment names it (LC_ALL, LC_NUMERIC, LANG),
+// or empty when that locale cannot be had. The process's own locale is neither used nor changed.
 std::string LocaleDecimalSeparator();
 
 // The folder of the running executable or of the shared object containing `address`.

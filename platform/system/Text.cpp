@@ -110,4 +110,131 @@ void AppendUtf8(std::string& out, char32_t c)
     }
 }
 
+size_t Utf8SequenceLength(std::string_view s, size_t i)
+{
+    auto byte = [&](size_t k) { return static_cast<unsigned char>(s[k]); };
+    const unsigned char lead = byte(i);
+    if (lead < 0x80)
+        return 1;
+    const size_t length = lead >= 0xF0 ? 4 : lead >= 0xE0 ? 3 : lead >= 0xC2 ? 2 : 0;
+    if (length == 0 || lead > 0xF4 || i + length > s.size())
+        return 0;
+    for (size_t k = 1; k < length; ++k)
+        if ((byte(i + k) & 0xC0) != 0x80)
+            return 0;
+    const unsigned char second = byte(i + 1);
+    if ((lead == 0xE0 && second < 0xA0) || (lead == 0xED && second > 0x9F) || (lead == 0xF0 && second < 0x90) ||
+        (lead == 0xF4 && second > 0x8F))
+        return 0;
+    return length;
+}
+
+bool IsUtf8(std::string_view s)
+{
+    for (size_t i = 0; i < s.size();) {
+        if (static_cast<unsigned char>(s[i]) < 0x80) {
+            ++i;
+            continue;
+        }
+        const size_t length = Utf8SequenceLength(s, i);
+        if (length == 0)
+            return false;
+        i += length;
+    }
+    return true;
+}
+
+void DropPartialCharacter(std::string& s)
+{
+    // Back over the continuation bytes at the end to the sequence's first byte.
+    size_t start = s.size();
+    while (start > 0 && s.size() - start < 3 && (static_cast<unsigned char>(s[start - 1]) & 0xC0) == 0x80)
+        --start;
+    if (start > 0 && static_cast<unsigned char>(s[start - 1]) >= 0x80 && Utf8SequenceLength(s, start - 1) == 0)
+        s.resize(start - 1);
+}
+
+void CutToLength(std::string& s, size_t length)
+{
+    if (s.size() <= length)
+        return;
+    s.resize(length);
+    DropPartialCharacter(s);
+}
+
+char32_t Windows1252Character(unsigned char byte)
+{
+    static constexpr char16_t kHigh[32] = {
+        0x20AC, 0x0081, 0x201A, 0x0192, 0x201E, 0x2026, 0x2020, 0x2021, 0x02C6, 0x2030, 0x0160,
+        0x2039, 0x0152, 0x008D, 0x017D, 0x008F, 0x0090, 0x2018, 0x2019, 0x201C, 0x201D, 0x2022,
+        0x2013, 0x2014, 0x02DC, 0x2122, 0x0161, 0x203A, 0x0153, 0x009D, 0x017E, 0x0178};
+    return byte >= 0x80 && byte < 0xA0 ? kHigh[byte - 0x80] : byte;
+}
+
+std::string ToUtf8(std::string_view bytes)
+{
+    if (IsUtf8(bytes))
+        return std::string(bytes);
+    std::string out;
+    out.reserve(bytes.size() + bytes.size() / 2);
+    for (char c : bytes)
+        AppendUtf8(out, Windows1252Character(static_cast<unsigned char>(c)));
+    return out;
+}
+
+size_t AppendUtf16AsUtf8(std::string_view bytes, bool bigEndian, std::string& out, size_t& unpairedAt)
+{
+    auto unit = [&](size_t i) -> char32_t {
+        const auto first = static_cast<unsigned char>(bytes[i]);
+        const auto second = static_cast<unsigned char>(bytes[i + 1]);
+        return bigEndian ? (first << 8 | second) : (second << 8 | first);
+    };
+    auto isHigh = [](char32_t c) { return c >= 0xD800 && c <= 0xDBFF; };
+    auto isLow = [](char32_t c) { return c >= 0xDC00 && c <= 0xDFFF; };
+    unpairedAt = std::string_view::npos;
+    size_t i = 0;
+    while (i + 2 <= bytes.size()) {
+        const char32_t first = unit(i);
+        if (isHigh(first) && i + 4 > bytes.size())
+            break; // its partner may come later
+        if (isHigh(first) && isLow(unit(i + 2))) {
+            AppendUtf8(out, 0x10000 + ((first - 0xD800) << 10) + (unit(i + 2) - 0xDC00));
+            i += 4;
+            continue;
+        }
+        if (isHigh(first) || isLow(first)) {
+            unpairedAt = i;
+            break;
+        }
+        AppendUtf8(out, first);
+        i += 2;
+    }
+    return i;
+}
+
+void AppendJsonString(std::string& out, std::string_view s)
+{
+    if (!IsUtf8(s)) {
+        AppendJsonString(out, ToUtf8(s));
+        return;
+    }
+    out += '"';
+    for (char ch : s) {
+        const auto c = static_cast<unsigned char>(ch);
+        switch (c) {
+        case '"': out += "\\\""; break;
+        case '\\': out += "\\\\"; break;
+        case '\n': out += "\\n"; break;
+        case '\t': out += "\\t"; break;
+        case '\r': out += "\\r"; break;
+        default:
+            if (c < 0x20)
+                out += Format("\\u%04x", c);
+            else
+                out += ch;
+        }
+    }
+    out += '"';
+}
+
 } // namespace text

@@ -25,4 +25,31 @@ std::string Trim(std::string_view s);
 // Appends the UTF-8 bytes of code point `c`.
 void AppendUtf8(std::string& out, char32_t c);
 
+// Length of the well-formed UTF-8 sequence at `s[i]` (1 to 4), 0 when there is none there: overlong
+// forms, surrogates and values past U+10FFFF are not well formed.
+size_t Utf8SequenceLength(std::string_view s, size_t i);
+bool IsUtf8(std::string_view s);
+// Removes a UTF-8 sequence that was cut short at the end of `s`.
+void DropPartialCharacter(std::string& s);
+// Shortens `s` to at most `length` bytes without leaving the start of a UTF-8 sequence at its end.
+void CutToLength(std::string& s, size_t length);
+
+// The character a Windows-1252 byte stands for. Its five unassigned bytes (0x81, 0x8D, 0x8F, 0x90,
+// 0x9D) keep their value, as Windows itself reads them.
+char32_t Windows1252Character(unsigned char byte);
+
+// How 8-bit text from a file becomes text, everywhere: the bytes as they are when they are
+// well-formed UTF-8, else every byte read as Windows-1252, the ANSI code page of the systems that
+// write such files. The result is always well-formed UTF-8.
+std::string ToUtf8(std::string_view bytes);
+
+// Converts the whole UTF-16 code units at the start of `bytes` (in the byte order given) onto `out`
+// as UTF-8 and returns how many bytes it used. An odd last byte, or a high surrogate at the end
+// whose partner may still follow, is left unused. An unpaired surrogate stops the conversion there
+// and sets `unpairedAt` to its offset (else it is std::string_view::npos).
+size_t AppendUtf16AsUtf8(std::string_view bytes, bool bigEndian, std::string& out, size_t& unpairedAt);
+
+// Appends `s` as a JSON string literal, made UTF-8 by ToUtf8 first.
+void AppendJsonString(std::string& out, std::string_view s);
+
 } // namespace text

@@ -15,27 +15,6 @@ namespace {
 constexpr int kVersion = 1;
 constexpr size_t kMaxDepth = 64; // target plus nested sections
 
-// Length of the well-formed UTF-8 sequence starting at `s[i]` (1 to 4), 0 when it is not one.
-// Overlong forms, surrogates and values above U+10FFFF are not well formed.
-size_t Utf8SequenceLength(std::string_view s, size_t i)
-{
-    auto byte = [&](size_t k) { return static_cast<unsigned char>(s[k]); };
-    unsigned char c = byte(i);
-    if (c < 0x80)
-        return 1;
-    size_t length = c >= 0xF0 ? 4 : c >= 0xE0 ? 3 : c >= 0xC2 ? 2 : 0;
-    if (length == 0 || c > 0xF4 || i + length > s.size())
-        return 0;
-    for (size_t k = 1; k < length; ++k)
-        if ((byte(i + k) & 0xC0) != 0x80)
-            return 0;
-    unsigned char second = byte(i + 1);
-    if ((c == 0xE0 && second < 0xA0) || (c == 0xED && second > 0x9F) || (c == 0xF0 && second < 0x90) ||
-        (c == 0xF4 && second > 0x8F))
-        return 0;
-    return length;
-}
-
 bool IsBareWordChar(char c)
 {
     return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') || c == '_' || c == '.' ||
@@ -56,7 +35,7 @@ std::string Quote(std::string_view value)
         case '\r': out += "\\r"; break;
         case '\t': out += "\\t"; break;
         default: {
-            size_t length = c >= 0x20 && c != 0x7f ? Utf8SequenceLength(value, i) : 0;
+            size_t length = c >= 0x20 && c != 0x7f ? text::Utf8SequenceLength(value, i) : 0;
             if (length == 0) {
                 out += text::Format("\\x%02X", c);
                 ++i;
@@ -321,7 +300,7 @@ bool Reader::CheckCharacters(std::string_view line)
         if ((c < 0x20 && c != '\t') || c == 0x7f)
             return Fail(text::Format("control character 0x%02X in column %zu; write it as \\x%02X inside quotes", c,
                                      i + 1, c));
-        size_t length = Utf8SequenceLength(line, i);
+        size_t length = text::Utf8SequenceLength(line, i);
         if (length == 0)
             return Fail(text::Format("invalid UTF-8 in column %zu; expected UTF-8 text (write other bytes as \\xHH "
                                      "inside quotes)",

@@ -191,7 +191,7 @@ TEST(XlsxWriter, HeaderTextsAreSharedStringsThatReadBack)
         {Item("雨量"), "雨量", "Rainfall[mm]:Accumulated"},
         {Item(" padded "), " padded ", "Rainfall[mm]:Accumulated"},
         {Item("bell\x07tab\tend"), "bell tab\tend", "Rainfall[mm]:Accumulated"},
-        {Item("Temp\xE9rature"), "Température", "Rainfall[mm]:Accumulated"}, // a Latin-1 byte
+        {Item("Temp\xE9rature \x80"), "Température €", "Rainfall[mm]:Accumulated"}, // Windows-1252
         {Item("", "", "", ""), "<blank>", "Undefined[Undefined]:Instantaneous"},
         {Item("odd", "Type[x]", "m:s", ""), "odd", "Type x [m s]:Instantaneous"},
     };
@@ -348,11 +348,13 @@ TEST(XlsxWriter, TextsBecomeWellFormedXmlCharacters)
         {"a<b>&\"c'", "a&lt;b&gt;&amp;&quot;c&apos;"},
         {"tab\tline\nbell\x07nul" + std::string(1, '\0') + "cr\r", "tab\tline\nbell nul cr "},
         {"caf\xC3\xA9 \xE2\x82\xAC \xF0\x9F\x8C\xA7", "caf\xC3\xA9 \xE2\x82\xAC \xF0\x9F\x8C\xA7"}, // UTF-8 kept
-        {"caf\xE9", "caf\xC3\xA9"},                    // a Latin-1 byte
+        // Text that is not UTF-8 is Windows-1252 as a whole.
+        {"caf\xE9 \x80", "caf\xC3\xA9 \xE2\x82\xAC"},
         {"\xC0\xAF", "\xC3\x80\xC2\xAF"},              // an overlong form is not UTF-8
-        {"\xED\xA0\x80", "\xC3\xAD\xC2\xA0\xC2\x80"},  // nor is a surrogate
-        {"\xF4\x90\x80\x80", "\xC3\xB4\xC2\x90\xC2\x80\xC2\x80"}, // nor a code point past U+10FFFF
-        {"\xE2\x82", "\xC3\xA2\xC2\x82"},              // a sequence cut short
+        {"\xED\xA0\x80", "\xC3\xAD\xC2\xA0\xE2\x82\xAC"},  // nor is a surrogate
+        {"\xF4\x90\x80\x80", "\xC3\xB4\xC2\x90\xE2\x82\xAC\xE2\x82\xAC"}, // nor a code point past U+10FFFF
+        {"\xE2\x82", "\xC3\xA2\xE2\x80\x9A"},              // a sequence cut short
+        {"\xC3\xA9\xE9", "\xC3\x83\xC2\xA9\xC3\xA9"},   // one stray byte makes all of it Windows-1252
         {"\xEF\xBF\xBE\xEF\xBF\xBF\xEF\xBF\xBD", "  \xEF\xBF\xBD"}, // U+FFFE, U+FFFF are no characters
     };
     for (const auto& [text, xml] : cases)

@@ -352,20 +352,21 @@ TEST(TemplateFile, AcceptedEncodings)
     EXPECT_EQ(spec.m_DataDesc.m_strGlobalUnit, "\xC2\xB5\xF0\x9F\x98\x80");
 }
 
-TEST(TemplateFile, BytesThatAreNotUtf8AreReadAsLatin1)
+TEST(TemplateFile, TextThatIsNotUtf8IsReadAsWindows1252)
 {
     ScratchFolder folder;
     CAsciiSpecification spec;
-    spec.m_DataDesc.m_strGlobalUnit = "m\xB3/s";                 // Latin-1 from an 8-bit input file
+    spec.m_DataDesc.m_strGlobalUnit = "m\xB3/s \x80";           // Windows-1252 from an 8-bit input file
     spec.m_strDefDelimiter = "::\xA3\xED\xED\xED\xA3";             // stray bytes, one looking like a surrogate
     spec.m_DataDesc.m_vecItemDefs = {{"\xC0\xAF", "", "", ""}}; // an overlong form
     ASSERT_EQ(spec.Save(folder.File("latin.xml")), 1);
     CAsciiSpecification loaded;
     ASSERT_EQ(loaded.Load(folder.File("latin.xml")), 1) << loaded.LastError();
-    EXPECT_EQ(loaded.m_DataDesc.m_strGlobalUnit, "m\xC2\xB3/s");
+    EXPECT_EQ(loaded.m_DataDesc.m_strGlobalUnit, "m\xC2\xB3/s \xE2\x82\xAC");
     EXPECT_EQ(loaded.m_strDefDelimiter, "::\xC2\xA3\xC3\xAD\xC3\xAD\xC3\xAD\xC2\xA3");
     EXPECT_EQ(loaded.m_DataDesc.m_vecItemDefs.at(0).m_strTitle, "\xC3\x80\xC2\xAF");
 
+    // A file with one byte that is not UTF-8 is a Windows-1252 file as a whole.
     ASSERT_EQ(loaded.LoadFromMemory("<ASCIITSBridgeSpecification GlobalUnit='\xB5g \xC2\xB5g'/>", "l.xml"), 1);
-    EXPECT_EQ(loaded.m_DataDesc.m_strGlobalUnit, "\xC2\xB5g \xC2\xB5g");
+    EXPECT_EQ(loaded.m_DataDesc.m_strGlobalUnit, "\xC2\xB5g \xC3\x82\xC2\xB5g");
 }
