@@ -459,7 +459,8 @@ bool CAsciiFilePreviewParser::ReadHeaderAndDataLines(int columns, const DeleteVa
     CString line;
     for (long long n = 1; n < startRow && reader.ReadLine(line, kShownLineBytes); ++n)
         m_vecRawLines.push_back(RawRow(line));
-    for (int i = 0; i < kPreviewLines && reader.ReadLine(line); ++i) {
+    size_t cells = 0;
+    for (int i = 0; i < kPreviewLines && cells < kPreviewCells && reader.ReadLine(line); ++i) {
         m_vecRawLines.push_back(RawRow(line));
         if (line.empty())
             continue;
@@ -467,6 +468,7 @@ bool CAsciiFilePreviewParser::ReadHeaderAndDataLines(int columns, const DeleteVa
             return Refuse(res::IDS_NO_DELIMITERS, reader.LineNumber());
         if (!ParseDataLine(line, reader.LineNumber(), columns, deleteValue))
             return false;
+        cells += m_vecRows.back().size();
     }
     return true;
 }

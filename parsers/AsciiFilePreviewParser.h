@@ -12,6 +12,9 @@ public:
     static constexpr int kPreviewLines = 20;
     // The bytes of a line the "Input file" list shows; the rest of a longer line is read past.
     static constexpr size_t kShownLineBytes = 64 * 1024;
+    // Data cells a parse holds at most: a file with very many columns shows fewer data lines, so no
+    // file can make the preview hold more than this and one line.
+    static constexpr size_t kPreviewCells = 1000000;
 
     // Reads the bound file; `path` is not used.
     int Parse(const CString& path) override;

@@ -6,8 +6,10 @@
 
 class CFileException : public std::runtime_error {
 public:
-    CFileException(const std::string& path, const std::string& reason)
-        : std::runtime_error("Cannot read \"" + path + "\": " + reason), m_strPath(path)
+    // The text reads "path: reason", or "path:line: reason" when a line (from 1) is concerned.
+    CFileException(const std::string& path, const std::string& reason, long line = 0)
+        : std::runtime_error(path + (line > 0 ? ":" + std::to_string(line) : std::string()) + ": " + reason),
+          m_strPath(path)
     {
     }
     const std::string& Path() const { return m_strPath; }

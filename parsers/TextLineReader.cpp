@@ -11,14 +11,14 @@ CTextLineReader::CTextLineReader(const CString& path) : m_strPath(path), m_buffe
         Refuse(m_input.Error());
 }
 
-void CTextLineReader::Refuse(const CString& reason) const { throw CFileException(m_strPath, reason); }
+void CTextLineReader::Refuse(const CString& reason, long line) const { throw CFileException(m_strPath, reason, line); }
 
 bool CTextLineReader::Fill()
 {
     m_nBegin = 0;
     m_nEnd = m_input.Read(m_buffer.data(), m_buffer.size());
     if (m_nEnd == 0 && !m_input.Error().empty())
-        Refuse(text::Format("line %ld: %s", m_nLine + 1, m_input.Error().c_str()));
+        Refuse(m_input.Error(), m_nLine + 1);
     return m_nEnd > 0;
 }
 
@@ -33,8 +33,9 @@ bool CTextLineReader::Walk(CString* line, size_t keep)
         const size_t piece = newline ? static_cast<size_t>(newline - begin) : m_nEnd - m_nBegin;
         length += piece;
         if (length > sys::kLongestTextLine)
-            Refuse(text::Format("line %ld has no line break within %zu bytes; this is not a delimited text file",
-                                m_nLine + 1, sys::kLongestTextLine));
+            Refuse(text::Format("no line break within %zu bytes; this is not a delimited text file",
+                                sys::kLongestTextLine),
+                   m_nLine + 1);
         if (line && line->size() < keep)
             line->append(begin, std::min(piece, keep - line->size()));
         m_nBegin += piece + (newline ? 1 : 0);

@@ -27,7 +27,8 @@ private:
     // Reads to the end of the next line, appending at most `keep` - `line.size()` bytes of it to
     // `line` when given; false when the file had nothing more.
     bool Walk(CString* line, size_t keep);
-    [[noreturn]] void Refuse(const CString& reason) const;
+    // Throws CFileException with `reason`, about `line` when above 0.
+    [[noreturn]] void Refuse(const CString& reason, long line = 0) const;
 
     CString m_strPath;
     sys::TextFileInput m_input;

@@ -3,6 +3,7 @@
 // component that records what it is asked and answers as told.
 #include "platform/bridge/BridgeComponent.h"
 #include "platform/system/Types.h"
+#include "tests/support/ScopedEnv.h"
 
 #include <cstdlib>
 #include <filesystem>
@@ -54,29 +55,7 @@ private:
 };
 
 // Sets (or, with nullopt, removes) an environment variable for the lifetime of the object.
-class ScopedEnv {
-public:
-    ScopedEnv(const char* name, std::optional<std::string> value) : m_name(name)
-    {
-        if (const char* old = std::getenv(name))
-            m_old = old;
-        Apply(value);
-    }
-    ~ScopedEnv() { Apply(m_old); }
-    ScopedEnv(const ScopedEnv&) = delete;
-    ScopedEnv& operator=(const ScopedEnv&) = delete;
-
-private:
-    void Apply(const std::optional<std::string>& value)
-    {
-        if (value)
-            ::setenv(m_name.c_str(), value->c_str(), 1);
-        else
-            ::unsetenv(m_name.c_str());
-    }
-    std::string m_name;
-    std::optional<std::string> m_old;
-};
+using ScopedEnv = testsupport::ScopedEnv;
 
 // The spreadsheet application present in a given version, or absent.
 inline ScopedEnv SpreadsheetVersion(const char* version) { return ScopedEnv("VELMORA_SPREADSHEET_VERSION", version); }

@@ -3,6 +3,7 @@
 // the converter library.
 #include "converter/Converter.h"
 #include "templates/Specification.h"
+#include "tests/support/ScratchLocale.h"
 
 #include <gtest/gtest.h>
 
@@ -12,6 +13,7 @@
 #include <sstream>
 #include <csignal>
 #include <spawn.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -256,6 +258,68 @@ TEST_F(EndToEnd, InterruptedEngineLeavesNoPartFile)
     EXPECT_EQ(WEXITSTATUS(status), 128 + SIGTERM);
     EXPECT_EQ(partFiles(), 0);
     EXPECT_FALSE(fs::exists(Path("big.out.txt")));
+}
+
+// Text files as other programs write them: those that can be read convert, the rest are refused
+// by name with the reason, and nothing waits on a FIFO.
+TEST_F(EndToEnd, AwkwardTextFilesConvertOrAreRefusedByName)
+{
+    fs::create_directories(Path("in"));
+    fs::create_directories(Path("out"));
+    WriteFile(Path("in/bom.txt"), "\xEF\xBB\xBF" + kSample);
+    const std::string python = "open('" + Path("in/python16.txt").string() + "', 'w', encoding='utf-16', newline='')"
+                               ".write(open('" + Path("in/bom.txt").string() + "', encoding='utf-8-sig').read())";
+    ASSERT_EQ(std::system(("/usr/bin/python3 -c \"" + python + "\"").c_str()), 0);
+    std::string latin = kSample;
+    latin.replace(latin.find("\tRain\t"), 6, "\tNiederschlag \xC4 \x80\t");
+    WriteFile(Path("in/latin.txt"), latin);
+    WriteFile(Path("in/odd16.txt"), ReadFile(Path("in/python16.txt")) + "x");
+    WriteFile(Path("in/endless.txt"), std::string(5 << 20, '7'));
+    ASSERT_EQ(::mkfifo(Path("in/fifo.txt").c_str(), 0600), 0);
+
+    EXPECT_EQ(RunHost({2, Format::Ascii, Path("in").string(), "", "", Format::Ascii, Path("out").string()}), 1);
+    EXPECT_EQ(ReadFile(Path("out/bom.txt")), kSample);
+    EXPECT_EQ(ReadFile(Path("out/python16.txt")), kSample);
+    EXPECT_NE(ReadFile(Path("out/latin.txt")).find("\tNiederschlag \xC3\x84 \xE2\x82\xAC\t"), std::string::npos)
+        << ReadFile(Path("out/latin.txt"));
+    for (const char* refused : {"odd16", "endless", "fifo"}) {
+        EXPECT_FALSE(fs::exists(Path("out/" + std::string(refused) + ".txt"))) << refused;
+        EXPECT_NE(Log().find(Path("in/" + std::string(refused) + ".txt").string() + ":"), std::string::npos)
+            << refused << "\n" << Log();
+    }
+    EXPECT_NE(Log().find("UTF-16"), std::string::npos) << Log();
+}
+
+// "User Locale" means the same to the check and to the engine: the decimal separator of the
+// environment's locale.
+TEST_F(EndToEnd, CheckAndEngineAgreeOnTheUserLocale)
+{
+    const testsupport::ScratchLocale& german = testsupport::ScratchLocale::German();
+    if (!german.Available())
+        GTEST_SKIP() << "localedef cannot build de_DE.UTF-8 here (no localedef or no locale sources)";
+    WriteFile(Path("comma.txt"), "Undefined[Undefined]:Instantaneous\nTime\tLevel\n2020/01/01 00:00:00\t3,5\n");
+    converter::Status status;
+    std::unique_ptr<CSpecification> spec = converter::LoadTemplate(Format::Ascii, "", status);
+    spec->m_strDecimalSeparator = "User Locale";
+    ASSERT_EQ(spec->Save(Path("locale.xml").string()), 1);
+    const Setup setup{1, Format::Ascii, Path("comma.txt").string(), Path("locale.xml").string(), "", Format::Ascii,
+                      Path("out.txt").string()};
+    auto check = [this] {
+        const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora check '" + Path("setup.wpx").string() +
+                                    "' >'" + Path("check.out").string() + "' 2>&1";
+        const int raw = std::system(command.c_str());
+        return WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
+    };
+    {
+        const testsupport::LocaleEnvironment environment(german, testsupport::ScratchLocale::kName, nullptr, nullptr);
+        EXPECT_EQ(RunHost(setup), 0) << Log();
+        EXPECT_NE(ReadFile(Path("out.txt")).find("\t3.5\n"), std::string::npos) << ReadFile(Path("out.txt"));
+        EXPECT_EQ(check(), 0) << ReadFile(Path("check.out"));
+    }
+    const testsupport::LocaleEnvironment environment(german, "C", nullptr, nullptr);
+    EXPECT_EQ(RunHost(setup), 1);
+    EXPECT_EQ(check(), 1) << ReadFile(Path("check.out"));
+    EXPECT_NE(ReadFile(Path("check.out")).find("FAIL "), std::string::npos) << ReadFile(Path("check.out"));
 }
 
 TEST_F(EndToEnd, EngineProgramHelpAndUsage)

@@ -2,6 +2,7 @@
 #include "parsers/AsciiFilePreviewParser.h"
 #include "parsers/FileException.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/ScratchLocale.h"
 
 #include <gtest/gtest.h>
 
@@ -134,14 +135,30 @@ TEST_F(AsciiParserTest, DecimalSeparatorCheck)
         {"Dot", "3,5", false}, {"Dot", "3.5", true},   {"Dot", "1,234.5", true},
         {"Comma", "3.5", false}, {"Comma", "3,5", true}, {"Comma", "1.234,5", true},
         {"Dot", "", true},
-        {"User Locale", "3,5", false}, // the tests run in the "C" locale, whose separator is the point
+        {"User Locale", "3,5", false}, // the "C" locale below, whose separator is the point
     };
+    const testsupport::ScopedEnv cLocale("LC_ALL", "C");
     for (const Case& c : cases) {
         ui.boxes.clear();
         spec.m_strDecimalSeparator = c.separator;
         Bind(std::string("h\nTime\tA\tB\n2020/01/01 00:00:00\t") + c.value + "\t1\n");
         EXPECT_EQ(parser.Parse(""), c.accepted ? 1 : 0) << c.separator << " " << c.value;
         EXPECT_EQ(MessageIds(ui), c.accepted ? Ids{} : Ids{res::IDS_DECIMAL_SEPARATOR_MISMATCH}) << c.value;
+    }
+}
+
+TEST_F(AsciiParserTest, UserLocaleFollowsTheEnvironment)
+{
+    const testsupport::ScratchLocale& german = testsupport::ScratchLocale::German();
+    if (!german.Available())
+        GTEST_SKIP() << "localedef cannot build de_DE.UTF-8 here (no localedef or no locale sources)";
+    const testsupport::LocaleEnvironment environment(german, nullptr, nullptr, testsupport::ScratchLocale::kName);
+    spec.m_strDecimalSeparator = "User Locale";
+    for (const auto& [value, accepted] : {std::pair{"3,5", true}, std::pair{"3.5", false}, std::pair{"1.234,5", true}}) {
+        ui.boxes.clear();
+        Bind(std::string("h\nTime\tA\n2020/01/01 00:00:00\t") + value + "\n");
+        EXPECT_EQ(parser.Parse(""), accepted ? 1 : 0) << value;
+        EXPECT_EQ(MessageIds(ui), accepted ? Ids{} : Ids{res::IDS_DECIMAL_SEPARATOR_MISMATCH}) << value;
     }
 }
 

@@ -63,6 +63,38 @@ TEST(PreviewCommand, FailedParseReportsItsMessages)
     EXPECT_NE(run.out.find("[\"\",\"Undefined\"]"), std::string::npos); // the rows read before the failure stay
 }
 
+TEST(PreviewCommand, EveryFailureSaysWhichFileAndWhy)
+{
+    parsertest::ScratchFolder folder;
+    const std::string notRbx = folder.Write("text.rbx0", "Time\tA\n");
+    const std::string bad = folder.Write("bad.txt", "h\nTime\tA\n2020/01/01 00:00:00\t3,5\n");
+    const struct {
+        std::string arguments;
+        std::string error;
+    } cases[] = {
+        {folder.Path("absent.rbx0") + " --format rbx0", folder.Path("absent.rbx0") + ": the file does not exist"},
+        {folder.Path("absent.xlsx") + " --format excel", folder.Path("absent.xlsx") + ": the file does not exist"},
+        {folder.Path("absent.txt") + " --format ascii", folder.Path("absent.txt") + ": the file does not exist"},
+        {notRbx + " --format rbx0", notRbx + ": "},
+        {bad + " --format ascii", bad + ":1: the line gives no item type the unit catalogue knows"},
+        {"/dev/zero --format ascii", "/dev/zero: it is a device, not a regular file"},
+    };
+    for (const auto& c : cases) {
+        const CommandRun json = Velmora(c.arguments + " --json");
+        EXPECT_EQ(json.status, 1) << c.arguments;
+        EXPECT_NE(json.out.find("\"error\":\"" + c.error), std::string::npos) << json.out;
+        EXPECT_EQ(json.out.find("\"error\":\"\""), std::string::npos) << json.out;
+        const CommandRun text = Velmora(c.arguments);
+        EXPECT_EQ(text.status, 1) << c.arguments;
+        EXPECT_NE(text.out.find("Parse failed: "), std::string::npos) << text.out;
+        EXPECT_NE(text.out.find(c.error), std::string::npos) << text.out;
+    }
+    // A success has no error.
+    const CommandRun good = Velmora(Example("data/river_gauge.rbx0") + " --format rbx0 --json");
+    EXPECT_EQ(good.status, 0);
+    EXPECT_EQ(good.out.find("\"error\""), std::string::npos);
+}
+
 TEST(PreviewCommand, RbxExampleAsTable)
 {
     const CommandRun run = Velmora(Example("data/river_gauge.rbx0") + " --format rbx0");

@@ -1,10 +1,13 @@
 #include "ParserTestSupport.h"
+#include "parsers/ParserFactory.h"
 #include "parsers/RbxPreviewFileParser.h"
 #include "platform/rbx/RbxWriter.h"
 #include "platform/system/Text.h"
 #include "platform/units/Units.h"
 
 #include <gtest/gtest.h>
+
+#include <sys/stat.h>
 
 namespace {
 
@@ -196,10 +199,17 @@ TEST_F(RbxParserTest, UnreadableFilesGiveZeroQuietly)
     }
     const std::string damaged = folder.Write("damaged.rbx0", bytes.substr(0, bytes.size() / 2));
     const std::string text = folder.Write("text.rbx0", "Time\tA\n");
-    for (const std::string& path : {damaged, text, folder.Path("absent.rbx0")}) {
+    const std::string fifo = folder.Path("fifo.rbx0");
+    ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
+    const std::pair<std::string, const char*> cases[] = {
+        {damaged, "rbx0 header"}, {text, "rbx0"}, {folder.Path("absent.rbx0"), "does not exist"}, {fifo, "FIFO"}};
+    for (const auto& [path, reason] : cases) {
         parser.m_vecRows = {{"old"}};
-        EXPECT_EQ(parser.Parse(path), 0) << path;
+        EXPECT_EQ(ParseGuarded(parser, path), 0) << path;
         EXPECT_TRUE(parser.m_vecRows.empty());
+        // Quiet for the user, but the reason is there for whoever reports it.
+        EXPECT_EQ(parser.m_strFailure.rfind(path + ": ", 0), 0u) << parser.m_strFailure;
+        EXPECT_NE(parser.m_strFailure.find(reason), std::string::npos) << parser.m_strFailure;
         parser.SetFile(path);
         CStringList names;
         EXPECT_EQ(parser.GetItemNames(names), 0) << path;

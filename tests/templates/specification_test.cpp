@@ -5,6 +5,7 @@
 
 #include "platform/ui/UserInterface.h"
 #include "resources/StringTable.h"
+#include "tests/support/ScratchLocale.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -92,18 +93,26 @@ TEST(TemplateModel, SeparatorNamesAreExactAndUnknownNamesGiveABlank)
     }
 }
 
-TEST(TemplateModel, UserLocaleSeparatorComesFromTheProcessLocale)
+TEST(TemplateModel, UserLocaleSeparatorComesFromTheEnvironmentNotTheProcess)
 {
+    using testsupport::LocaleEnvironment;
+    using testsupport::ScratchLocale;
+    const ScratchLocale& german = ScratchLocale::German();
+    if (!german.Available())
+        GTEST_SKIP() << "localedef cannot build de_DE.UTF-8 here (no localedef or no locale sources)";
     CString text;
-    EXPECT_EQ(CSpecification::MapSeparatorName("User Locale", text), 1);
-    EXPECT_EQ(text, "."); // the C locale the tests run in
-    const char* previous = std::setlocale(LC_NUMERIC, nullptr);
-    std::string saved = previous ? previous : "C";
-    if (std::setlocale(LC_NUMERIC, "de_DE.UTF-8") || std::setlocale(LC_NUMERIC, "de_DE")) {
-        CSpecification::MapSeparatorName("User Locale", text);
+    {
+        const LocaleEnvironment environment(german, nullptr, ScratchLocale::kName, nullptr);
+        EXPECT_EQ(CSpecification::MapSeparatorName("User Locale", text), 1);
         EXPECT_EQ(text, ",");
     }
-    std::setlocale(LC_NUMERIC, saved.c_str());
+    // A process that switched its own locale still gets the environment's separator.
+    const LocaleEnvironment environment(german, "C", nullptr, nullptr);
+    const std::string previous = std::setlocale(LC_NUMERIC, nullptr);
+    ASSERT_NE(std::setlocale(LC_NUMERIC, ScratchLocale::kName), nullptr);
+    CSpecification::MapSeparatorName("User Locale", text);
+    std::setlocale(LC_NUMERIC, previous.c_str());
+    EXPECT_EQ(text, ".");
 }
 
 TEST(TemplateModel, DelimiterString)

@@ -6,6 +6,8 @@
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
+#include <functional>
 #include <string>
 
 using namespace testsupport;
@@ -145,4 +147,84 @@ TEST(TemplateBadInput, FilesThatCannotBeRead)
         EXPECT_NE(spec.LastError().find(c.path), std::string::npos) << spec.LastError();
         EXPECT_NE(spec.LastError().find(c.messagePart), std::string::npos) << c.path << ": " << spec.LastError();
     }
+}
+
+// Documents a conforming XML parser refuses: each fails with the line and column of its fault and
+// leaves the template as it was, in UTF-8 and in UTF-16 alike.
+TEST(TemplateBadInput, DocumentsThatAreNotWellFormedDoNotLoad)
+{
+    const std::string declaration = "<?xml version='1.0'   encoding='UTF-16'?>\n";
+    const struct {
+        const char* label;
+        std::string document;
+        const char* position;
+    } cases[] = {
+        {"a repeated attribute", declaration + "<ASCIITSBridgeSpecification StartRow='3'\n StartRow='4'/>",
+         "line 3, column 2"},
+        {"a second root", declaration + Root("") + "\n<ASCIITSBridgeSpecification/>", "line 3, column 1"},
+        {"text before the root", declaration + "Delimiter\n" + Root(""), "line 2, column 1"},
+        {"text after the root", declaration + Root("") + "\nStartRow=3", "line 3, column 9"},
+        // An entity in an attribute is reported at the start of its element.
+        {"an undefined entity", declaration + Root("DeleteValue='&nbsp;'"), "line 2, column 1"},
+        {"a bare ampersand", declaration + Root("GlobalUnit='m & s'"), "line 2, column 44"},
+        {"< in an attribute value", declaration + Root("GlobalUnit='a<b'"), "line 2, column 42"},
+        {"a control character", declaration + Root("GlobalUnit='a\x01'"), "line 2, column 42"},
+        {"a character reference to a control character", declaration + Root("GlobalUnit='a&#1;'"),
+         "line 2, column 42"},
+        {"blanks before the declaration", " \n" + declaration + Root(""), "line 2, column 1"},
+        {"an unclosed element", declaration + "<ASCIITSBridgeSpecification>\n<ASCIITSBridgeSpecificationExtension>\n"
+                                              "</ASCIITSBridgeSpecification>",
+         "line 4, column 3"},
+    };
+    for (const auto& c : cases) {
+        for (const bool utf16 : {false, true}) {
+            CAsciiSpecification spec;
+            SetUnusualValues(spec);
+            const std::string before = Describe(spec);
+            const std::string bytes = utf16 ? Utf16(c.document, false, true) : c.document;
+            EXPECT_EQ(spec.LoadFromMemory(bytes, "bad.xml"), 0) << c.label;
+            EXPECT_EQ(Describe(spec), before) << c.label;
+            EXPECT_EQ(spec.LastError().rfind("bad.xml: not a well-formed XML document (", 0), 0u)
+                << c.label << ": " << spec.LastError();
+            EXPECT_NE(spec.LastError().find(c.position), std::string::npos) << c.label << ": " << spec.LastError();
+        }
+    }
+    // The same documents made right load in both encodings.
+    for (const bool utf16 : {false, true}) {
+        const std::string good = declaration + Root("GlobalUnit='m &amp; s &lt;1&gt;' DeleteValue='&#160;'");
+        CAsciiSpecification spec;
+        ASSERT_EQ(spec.LoadFromMemory(utf16 ? Utf16(good, false, true) : good, "good.xml"), 1) << spec.LastError();
+        EXPECT_EQ(spec.m_DataDesc.m_strGlobalUnit, "m & s <1>");
+        EXPECT_EQ(spec.m_DataDesc.m_strDeleteValue, "\xC2\xA0");
+    }
+}
+
+TEST(TemplateBadInput, TextsXmlCannotCarryAreNotSaved)
+{
+    ScratchFolder folder;
+    const struct {
+        std::function<void(CAsciiSpecification&)> set;
+        const char* messagePart;
+    } cases[] = {
+        {[](CAsciiSpecification& s) { s.m_strDefDelimiter = "\x1F"; }, "DefDelimiter holds the character U+001F"},
+        {[](CAsciiSpecification& s) { s.m_DataDesc.m_vecItemDefs = {{"ok", "", "", ""}, {"a\x01", "", "", ""}}; },
+         "item definition 2 holds the character U+0001"},
+        {[](CAsciiSpecification& s) { s.m_DataDesc.m_strGlobalUnit = "\xEF\xBF\xBF"; }, "U+FFFF"},
+    };
+    for (const auto& c : cases) {
+        CAsciiSpecification spec;
+        c.set(spec);
+        EXPECT_EQ(spec.Save(folder.File("t.xml")), 0) << c.messagePart;
+        EXPECT_NE(spec.LastError().find(c.messagePart), std::string::npos) << spec.LastError();
+        EXPECT_FALSE(std::filesystem::exists(folder.File("t.xml")));
+    }
+    // Tabs, line feeds and carriage returns are characters XML carries; they survive a round trip.
+    CAsciiSpecification spec;
+    spec.m_strDefDelimiter = "\t";
+    spec.m_DataDesc.m_strDeleteValue = "a\r\nb";
+    ASSERT_EQ(spec.Save(folder.File("t.xml")), 1) << spec.LastError();
+    CAsciiSpecification loaded;
+    ASSERT_EQ(loaded.Load(folder.File("t.xml")), 1) << loaded.LastError();
+    EXPECT_EQ(loaded.m_strDefDelimiter, "\t");
+    EXPECT_EQ(loaded.m_DataDesc.m_strDeleteValue, "a\r\nb");
 }
