@@ -6,6 +6,7 @@
 #include "platform/rbx/RbxReader.h"
 #include "platform/system/TextFileInput.h"
 #include "tests/support/ScratchLocale.h"
+#include "tests/support/Utf16.h"
 
 #include <gtest/gtest.h>
 
@@ -19,19 +20,7 @@ const std::string kText = "Date/time\tPegel \xC3\x96hringen\tRain\n"
                           "2020/01/01 00:00:00\t1.5\t0.1\n"
                           "2020/01/01 01:00:00\t2.5\t0.2\n";
 
-std::string Utf16(const std::string& utf8, bool bigEndian)
-{
-    std::string bytes;
-    for (size_t i = 0; i < utf8.size(); ++i) {
-        char16_t unit = static_cast<unsigned char>(utf8[i]);
-        if (unit == 0xC3) // the one two-byte character the samples hold
-            unit = 0xC0 | (static_cast<unsigned char>(utf8[++i]) & 0x3F);
-        const char high = static_cast<char>(unit >> 8), low = static_cast<char>(unit & 0xFF);
-        bytes += bigEndian ? high : low;
-        bytes += bigEndian ? low : high;
-    }
-    return bytes;
-}
+using testsupport::Utf16;
 
 FileReport Convert(const CSpecification& spec, const std::string& input, Format out, const std::string& output)
 {

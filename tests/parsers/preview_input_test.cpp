@@ -6,6 +6,7 @@
 #include "parsers/ParserFactory.h"
 #include "platform/system/TextFileInput.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/Utf16.h"
 
 #include <gtest/gtest.h>
 
@@ -16,15 +17,7 @@ namespace {
 
 using parsertest::MessageIds;
 
-std::string Utf16(const std::string& ascii, bool bigEndian)
-{
-    std::string bytes;
-    for (char c : ascii) {
-        bytes += bigEndian ? '\0' : c;
-        bytes += bigEndian ? c : '\0';
-    }
-    return bytes;
-}
+using testsupport::Utf16;
 
 bool Contains(const std::string& text, const std::string& part) { return text.find(part) != std::string::npos; }
 
