@@ -32,7 +32,7 @@ bool CTextLineReader::Walk(CString* line, size_t keep)
         const auto* newline = static_cast<const char*>(std::memchr(begin, '\n', m_nEnd - m_nBegin));
         const size_t piece = newline ? static_cast<size_t>(newline - begin) : m_nEnd - m_nBegin;
         length += piece;
-        if (length > sys::kLongestTextLine)
+        if (length >= sys::kLongestTextLine)
             Refuse(text::Format("no line break within %zu bytes; this is not a delimited text file",
                                 sys::kLongestTextLine),
                    m_nLine + 1);
