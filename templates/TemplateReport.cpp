@@ -27,39 +27,12 @@ std::vector<const AttributeRule*> ReportedValues()
     return rules;
 }
 
-// A JSON string literal; bytes that are not UTF-8 become U+FFFD so the output stays valid JSON.
+// A JSON string literal; text that is not UTF-8 is read as Windows-1252 (text::ToUtf8).
 CString JsonString(const CString& value)
 {
-    CString out = "\"";
-    for (size_t i = 0; i < value.size();) {
-        unsigned char c = static_cast<unsigned char>(value[i]);
-        if (c == '"' || c == '\\') {
-            out += '\\';
-            out += static_cast<char>(c);
-        } else if (c == '\n') {
-            out += "\\n";
-        } else if (c == '\t') {
-            out += "\\t";
-        } else if (c == '\r') {
-            out += "\\r";
-        } else if (c < 0x20) {
-            out += text::Format("\\u%04x", c);
-        } else if (c >= 0x80) {
-            size_t length = text::Utf8SequenceLength(value, i);
-            if (length == 0) {
-                out += "\xEF\xBF\xBD";
-                ++i;
-                continue;
-            }
-            out.append(value, i, length);
-            i += length;
-            continue;
-        } else {
-            out += static_cast<char>(c);
-        }
-        ++i;
-    }
-    return out + "\"";
+    CString out;
+    text::AppendJsonString(out, value);
+    return out;
 }
 
 // Text shown to a person: control characters written as C escapes, so a tab delimiter is visible.

@@ -60,8 +60,8 @@ TEST(TemplateReport, JsonEscapesTextsAndListsItems)
     std::string json = Json(spec, tmplfile::ExcelFileLayout());
     EXPECT_EQ(json.rfind("{\"kind\":\"excel\",", 0), 0u);
     for (const char* part : {"\"DefDelimiter\":\"\\t\"", "\"GlobalUnit\":\"m\xC2\xB3 \\\"q\\\" \\\\ \\u0001\"",
-                             "\"DeleteValue\":\"bad \xEF\xBF\xBD\xEF\xBF\xBD\xEF\xBF\xBD \xEF\xBF\xBD\xEF\xBF\xBD"
-                             "\xEF\xBF\xBD end\"",
+                             // Windows-1252, as every text that is not UTF-8
+                             "\"DeleteValue\":\"bad \xC3\xBF\xC3\x80\xC2\xAF \xC3\xAD\xC2\xA0\xE2\x82\xAC end\"",
                              "\"UseTFormat\":5", "\"SelItems\":[4,0]",
                              "\"items\":[{\"title\":\"A\",\"type\":\"Flow\",\"unit\":\"m3/s\",\"valueType\":"
                              "\"Accumulated\"},{\"title\":\"\",\"type\":\"\",\"unit\":\"\",\"valueType\":\"\"}]}"})
