@@ -67,6 +67,7 @@ TEST(PreviewCommand, EveryFailureSaysWhichFileAndWhy)
 {
     parsertest::ScratchFolder folder;
     const std::string notRbx = folder.Write("text.rbx0", "Time\tA\n");
+    const std::string notBook = folder.Write("text.xlsx", "Time\tA\n");
     const std::string bad = folder.Write("bad.txt", "h\nTime\tA\n2020/01/01 00:00:00\t3,5\n");
     const struct {
         std::string arguments;
@@ -76,6 +77,7 @@ TEST(PreviewCommand, EveryFailureSaysWhichFileAndWhy)
         {folder.Path("absent.xlsx") + " --format excel", folder.Path("absent.xlsx") + ": the file does not exist"},
         {folder.Path("absent.txt") + " --format ascii", folder.Path("absent.txt") + ": the file does not exist"},
         {notRbx + " --format rbx0", notRbx + ": "},
+        {notBook + " --format excel", notBook + ": "},
         {bad + " --format ascii", bad + ":1: the line gives no item type the unit catalogue knows"},
         {"/dev/zero --format ascii", "/dev/zero: it is a device, not a regular file"},
     };
