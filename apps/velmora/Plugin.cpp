@@ -57,6 +57,7 @@ bool Plugin::Resolve(std::string& error)
     return Bind(m_library, "SetWpxHandle", m_setHandle, error) && Bind(m_library, "GetWpxHandle", m_getHandle, error) &&
            Bind(m_library, "RunEngine", m_runEngine, error) &&
            Bind(m_library, "RunEngineSilent", m_runEngineSilent, error) &&
+           Bind(m_library, "ShowSetupGUI", m_showSetupGui, error) &&
            Bind(m_library, "LoadWpxDocument", m_load, error) && Bind(m_library, "SaveWpxDocument", m_save, error) &&
            Bind(m_library, "CloseWpxDocument", m_close, error);
 }
