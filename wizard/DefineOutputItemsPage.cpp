@@ -16,7 +16,7 @@ CDefineOutputItemsPage::CDefineOutputItemsPage(QWidget* parent) : CTSHarborPage(
     m_listItems = ui::Identify(new QTreeWidget(this), IDC_ITEMS, tr("Output Items"));
     auto* layout = new QVBoxLayout(this);
     layout->addWidget(m_listItems);
-    FinishPage(350, 180);
+    FinishPage(kPageWidthUnits, kPageHeightUnits);
 }
 
 bool CDefineOutputItemsPage::OnInitDialog()

@@ -33,6 +33,7 @@ CDefineTemplatePage::CDefineTemplatePage(QWidget* parent) : CTSHarborPage(IDD, p
 {
     setWindowTitle(tr("Define template"));
     setTitle(tr("Define template"));
+    setSubTitle(tr("Choose how the layout of the file is described."));
     // Every control is owned by the page.
     m_lines = {WrappedLabel(IDC_LINE1, this), WrappedLabel(IDC_LINE2, this), WrappedLabel(IDC_LINE3, this)};
     auto* separator = ui::Identify(new QFrame(this), IDC_SEPARATOR);
@@ -49,7 +50,7 @@ CDefineTemplatePage::CDefineTemplatePage(QWidget* parent) : CTSHarborPage(IDD, p
     options->addButton(m_radioModify);
     options->addButton(m_radioManual);
     m_editTemplate = ui::Identify(new QLineEdit(this), IDC_TEMPLATE);
-    m_btnBrowse = ui::Identify(new QPushButton(QStringLiteral("..."), this), IDC_BROWSE, tr("Browse for a template file"));
+    m_btnBrowse = ui::Identify(ui::BrowseButton(tr("Browse for a template file"), this), IDC_BROWSE);
 
     auto* layout = new QGridLayout(this);
     layout->setColumnStretch(1, 1);
@@ -65,7 +66,7 @@ CDefineTemplatePage::CDefineTemplatePage(QWidget* parent) : CTSHarborPage(IDD, p
     layout->addWidget(m_editTemplate, 9, 1);
     layout->addWidget(m_btnBrowse, 9, 2);
     layout->setRowStretch(10, 1);
-    FinishPage(350, 180);
+    FinishPage(kPageWidthUnits, kPageHeightUnits);
 
     connect(m_radioUnchanged, &QRadioButton::clicked, this,
             [this] { Apply([](DefineTemplateState& s) { ClickExistingTemplate(s, 1); }); });

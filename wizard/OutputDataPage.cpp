@@ -37,10 +37,9 @@ COutputDataPage::COutputDataPage(QWidget* parent) : CTSHarborPage(IDD, parent)
     for (QRadioButton* radio : {m_radioRbx0, m_radioAscii, m_radioExcel})
         formats->addButton(radio);
     m_editFile = ui::Identify(new QLineEdit(this), IDC_FILE);
-    m_btnFile = ui::Identify(new QPushButton(QStringLiteral("..."), this), IDC_BROWSE_FILE, tr("Browse for the output file"));
+    m_btnFile = ui::Identify(ui::BrowseButton(tr("Browse for the output file"), this), IDC_BROWSE_FILE);
     m_editFolder = ui::Identify(new QLineEdit(this), IDC_FOLDER);
-    m_btnFolder =
-        ui::Identify(new QPushButton(QStringLiteral("..."), this), IDC_BROWSE_FOLDER, tr("Browse for the output folder"));
+    m_btnFolder = ui::Identify(ui::BrowseButton(tr("Browse for the output folder"), this), IDC_BROWSE_FOLDER);
     m_editTitle = ui::Identify(new QLineEdit(this), IDC_TITLE);
 
     auto* layout = new QGridLayout(this);
@@ -63,7 +62,7 @@ COutputDataPage::COutputDataPage(QWidget* parent) : CTSHarborPage(IDD, parent)
     layout->addWidget(ui::LabelFor(tr("Title:"), m_editTitle, this), 7, 0);
     layout->addWidget(m_editTitle, 7, 1);
     layout->setRowStretch(8, 1);
-    FinishPage(350, 180);
+    FinishPage(kPageWidthUnits, kPageHeightUnits);
 
     connect(m_btnFile, &QPushButton::clicked, this, &COutputDataPage::OnBrowseOutputFile);
     connect(m_btnFolder, &QPushButton::clicked, this, &COutputDataPage::OnBrowseOutputFolder);

@@ -40,9 +40,9 @@ CSelectInputPage::CSelectInputPage(QWidget* parent) : CTSHarborPage(IDD, parent)
     layout->addWidget(m_radioSingleFile, 1, 0, 1, 2);
     layout->addWidget(m_radioFolder, 2, 0, 1, 2);
     layout->addWidget(new QLabel(tr("Input format:"), this), 0, 2);
-    layout->addWidget(m_radioRbx0, 1, 2);
-    layout->addWidget(m_radioAscii, 2, 2);
-    layout->addWidget(m_radioExcel, 3, 2);
+    layout->addWidget(m_radioRbx0, 1, 2, Qt::AlignLeft);
+    layout->addWidget(m_radioAscii, 2, 2, Qt::AlignLeft);
+    layout->addWidget(m_radioExcel, 3, 2, Qt::AlignLeft);
     layout->setRowMinimumHeight(4, 12);
     layout->addWidget(new QLabel(tr("Select time series file:"), this), 5, 0, 1, 3);
     layout->addWidget(ui::LabelFor(tr("File:"), m_ctrlFile->Edit(), this), 6, 0);
@@ -52,7 +52,7 @@ CSelectInputPage::CSelectInputPage(QWidget* parent) : CTSHarborPage(IDD, parent)
     layout->addWidget(ui::LabelFor(tr("Folder:"), m_ctrlFolder->Edit(), this), 9, 0);
     layout->addWidget(m_ctrlFolder, 9, 1, 1, 2);
     layout->setRowStretch(10, 1);
-    FinishPage(350, 180);
+    FinishPage(kPageWidthUnits, kPageHeightUnits);
 
     connect(m_radioFolder, &QRadioButton::clicked, this, [this] { Apply([this](SelectInputState& s) { ClickFolder(s, Engine()); }); });
     connect(m_radioSingleFile, &QRadioButton::clicked, this,

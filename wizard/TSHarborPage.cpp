@@ -52,6 +52,6 @@ void CTSHarborPage::SetPreviewButton(bool enabled, bool visible)
 
 void CTSHarborPage::FinishPage(int widthUnits, int heightUnits)
 {
-    setMinimumSize(ui::DialogUnitsToPixels(font(), widthUnits, heightUnits));
+    SetPageSize(widthUnits, heightUnits);
     ui::AssignMnemonics(this, kWizardMnemonics);
 }

@@ -2,6 +2,7 @@
 
 #include "platform/harbor/qt/HarborWizard.h"
 #include "platform/ui/UserInterface.h"
+#include "platform/ui/qt/Controls.h"
 
 CHarborPage::CHarborPage(int dialogId, QWidget* parent) : QWizardPage(parent), m_nDialogId(dialogId) {}
 
@@ -16,6 +17,11 @@ CHarborEngine* CHarborPage::GetEngine() const
 int CHarborPage::MessageBoxA(const CString& text, const char* caption, unsigned type)
 {
     return ui::MessageBox(text, caption ? caption : "", type);
+}
+
+void CHarborPage::SetPageSize(int widthUnits, int heightUnits)
+{
+    setMinimumSize(ui::DialogUnitsToPixels(font(), widthUnits, heightUnits));
 }
 
 void CHarborPage::InitializeOnce()

@@ -9,6 +9,10 @@
 class CHarborEngine;
 class CHarborWizard;
 
+// The size of the framework's own pages, in dialog units; tool pages match it.
+constexpr int kPageWidthUnits = 350;
+constexpr int kPageHeightUnits = 180;
+
 class CHarborPage : public QWizardPage {
     Q_OBJECT
 public:
@@ -43,6 +47,9 @@ public:
     virtual CString HelpText() const;
 
 protected:
+    // Gives the page its size in the dialog units of the toolbox's dialog templates.
+    void SetPageSize(int widthUnits, int heightUnits);
+
     unsigned m_dwFlags = 0;
 
 private:

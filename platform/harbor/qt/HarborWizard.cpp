@@ -9,13 +9,12 @@
 CHarborWizard::CHarborWizard(const CString& caption, QWidget* parentWnd, int selectPage) : QWizard(parentWnd)
 {
     setWindowTitle(QString::fromStdString(caption));
-    setWizardStyle(QWizard::ModernStyle);
+    setWizardStyle(QWizard::ClassicStyle);
     setOptions(QWizard::IndependentPages | QWizard::HaveCustomButton1 | QWizard::HelpButtonOnRight);
     // Qt's Back button walks Qt's history; this one asks the page.
     m_btnBack = new QPushButton(tr("< &Back"), this);
     setButton(QWizard::CustomButton1, m_btnBack);
-    setButtonLayout({QWizard::Stretch, QWizard::CustomButton1, QWizard::NextButton, QWizard::FinishButton,
-                     QWizard::CancelButton, QWizard::HelpButton});
+    ShowHelpButton(false);
     connect(m_btnBack, &QPushButton::clicked, this, &CHarborWizard::GoBack);
     connect(this, &QWizard::currentIdChanged, this, &CHarborWizard::OnCurrentIdChanged);
     connect(this, &QWizard::helpRequested, this, [this] {
@@ -131,6 +130,17 @@ void CHarborWizard::ReturnTo(int id)
     Activate(currentId());
 }
 
+void CHarborWizard::ShowHelpButton(bool show)
+{
+    // Buttons left out of the layout are hidden.
+    QList<QWizard::WizardButton> layout = {QWizard::Stretch, QWizard::CustomButton1, QWizard::NextButton,
+                                           QWizard::FinishButton, QWizard::CancelButton};
+    if (show)
+        layout << QWizard::HelpButton;
+    setOption(QWizard::HaveHelpButton, show);
+    setButtonLayout(layout);
+}
+
 void CHarborWizard::OnCurrentIdChanged(int id)
 {
     m_nPendingNext = -1;
@@ -145,6 +155,6 @@ void CHarborWizard::Activate(int id)
         return;
     page->InitializeOnce();
     page->OnSetActive();
-    setOption(QWizard::HaveHelpButton, page->HasHelp());
+    ShowHelpButton(page->HasHelp());
     m_btnBack->setEnabled(Resolve(0, id, -1) != -1);
 }

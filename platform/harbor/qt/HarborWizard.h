@@ -55,6 +55,7 @@ private:
     // order) from page `from`, `step` +1 forwards, -1 backwards; -1 when there is none.
     int Resolve(int result, int from, int step) const;
     int SheetIndex(int id) const;
+    void ShowHelpButton(bool show);
     // Returns to a page already passed, or to one before the active page that was skipped.
     void ReturnTo(int id);
 

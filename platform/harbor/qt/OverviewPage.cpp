@@ -18,6 +18,7 @@ COverviewPage::COverviewPage(QWidget* parent) : CHarborPage(IDD, parent)
     m_editSummary->setReadOnly(true);
     m_editSummary->setLineWrapMode(QPlainTextEdit::NoWrap);
     m_editSummary->setTabStopDistance(QFontMetricsF(m_editSummary->font()).horizontalAdvance(' ') * 4);
+    SetPageSize(kPageWidthUnits, kPageHeightUnits);
     auto* layout = new QVBoxLayout(this);
     layout->addWidget(m_editSummary);
 }

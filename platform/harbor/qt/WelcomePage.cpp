@@ -5,29 +5,21 @@
 
 CWelcomePage::CWelcomePage(QWidget* parent) : CHarborPage(IDD, parent)
 {
-    setTitle(tr("Welcome"));
-    // The labels are owned by the page.
-    m_labelTitle = new QLabel(this);
-    m_labelTitle->setObjectName("welcomeTitle");
-    QFont large = m_labelTitle->font();
-    large.setPointSizeF(large.pointSizeF() * 1.6);
-    large.setBold(true);
-    m_labelTitle->setFont(large);
-    m_labelText = new QLabel(this);
-    m_labelText->setObjectName("welcomeText");
-    m_labelText->setWordWrap(true);
-    auto* hint = new QLabel(tr("Press Next to describe the conversion, or Cancel to leave the setup as it is."), this);
+    // The label is owned by the page.
+    auto* hint = new QLabel(tr("The following pages ask for the input, how it is laid out, the items to convert and "
+                               "the output, and check each answer against the files.\n\n"
+                               "Press Next to begin, or Cancel to leave the setup as it is."),
+                            this);
+    hint->setObjectName("welcomeText");
     hint->setWordWrap(true);
+    SetPageSize(kPageWidthUnits, kPageHeightUnits);
     auto* layout = new QVBoxLayout(this);
-    layout->addWidget(m_labelTitle);
-    layout->addSpacing(12);
-    layout->addWidget(m_labelText);
-    layout->addStretch(1);
     layout->addWidget(hint);
+    layout->addStretch(1);
 }
 
 void CWelcomePage::SetToolText(const CString& title, const CString& text)
 {
-    m_labelTitle->setText(QString::fromStdString(title));
-    m_labelText->setText(QString::fromStdString(text));
+    setTitle(QString::fromStdString(title));
+    setSubTitle(QString::fromStdString(text));
 }

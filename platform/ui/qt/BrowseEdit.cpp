@@ -9,10 +9,8 @@
 CBrowseEdit::CBrowseEdit(int id, const QString& label, const QString& buttonName, QWidget* parent) : QWidget(parent)
 {
     m_edit = ui::Identify(new QLineEdit(this), id, label);
-    m_button = new QPushButton(QStringLiteral("..."), this);
+    m_button = ui::BrowseButton(buttonName, this);
     m_button->setObjectName(ui::ControlName(id) + "Browse");
-    m_button->setAccessibleName(buttonName);
-    m_button->setFixedWidth(m_button->fontMetrics().horizontalAdvance(QStringLiteral("....")) + 16);
     auto* layout = new QHBoxLayout(this);
     layout->setContentsMargins(0, 0, 0, 0);
     layout->addWidget(m_edit, 1);

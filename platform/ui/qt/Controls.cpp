@@ -3,6 +3,7 @@
 #include <QAbstractButton>
 #include <QFontMetrics>
 #include <QLabel>
+#include <QPushButton>
 #include <QWidget>
 
 namespace ui {
@@ -82,6 +83,14 @@ void IdentifyWidget(QWidget* widget, int id, const QString& accessibleName)
     widget->setObjectName(ControlName(id));
     if (!accessibleName.isEmpty())
         widget->setAccessibleName(WithoutAmpersands(accessibleName));
+}
+
+QPushButton* BrowseButton(const QString& accessibleName, QWidget* parent)
+{
+    auto* button = new QPushButton(QStringLiteral("..."), parent); // owned by `parent`
+    button->setAccessibleName(accessibleName);
+    button->setFixedWidth(button->fontMetrics().horizontalAdvance(QStringLiteral("....")) + 16);
+    return button;
 }
 
 QLabel* LabelFor(const QString& text, QWidget* buddy, QWidget* parent)

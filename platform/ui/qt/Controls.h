@@ -8,6 +8,7 @@
 
 class QAbstractButton;
 class QLabel;
+class QPushButton;
 class QWidget;
 
 namespace ui {
@@ -19,6 +20,9 @@ QString ControlName(int id);
 template <typename Widget>
 Widget* Identify(Widget* widget, int id, const QString& accessibleName = QString());
 void IdentifyWidget(QWidget* widget, int id, const QString& accessibleName);
+
+// A "..." button that opens a chooser, as narrow as its text; `accessibleName` says what it opens.
+QPushButton* BrowseButton(const QString& accessibleName, QWidget* parent);
 
 // A label for `buddy`: the buddy takes the label's text (without "&") as its accessible name.
 QLabel* LabelFor(const QString& text, QWidget* buddy, QWidget* parent);
