@@ -28,6 +28,7 @@ QTableView* ReportList(int id, const QString& name, QWidget* parent)
     list->verticalHeader()->setDefaultSectionSize(list->fontMetrics().height() + 4);
     list->horizontalHeader()->setDefaultAlignment(Qt::AlignLeft | Qt::AlignVCenter);
     list->horizontalHeader()->setHighlightSections(false);
+    list->horizontalHeader()->setMinimumSectionSize(1); // the widths are the fill rule's, however narrow
     return list;
 }
 

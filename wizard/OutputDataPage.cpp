@@ -7,7 +7,6 @@
 #include <QButtonGroup>
 #include <QFontDatabase>
 #include <QGridLayout>
-#include <QHBoxLayout>
 #include <QLabel>
 #include <QLineEdit>
 #include <QPushButton>
@@ -46,11 +45,7 @@ COutputDataPage::COutputDataPage(QWidget* parent) : CTSHarborPage(IDD, parent)
     layout->setColumnStretch(1, 1);
     layout->addWidget(Wrapped(tr("Furthermore you specify the format of  the output."), this), 0, 0, 1, 3);
     layout->addWidget(new QLabel(tr("Format of output"), this), 1, 0, 1, 3);
-    auto* radios = new QHBoxLayout();
-    for (QRadioButton* radio : {m_radioRbx0, m_radioAscii, m_radioExcel})
-        radios->addWidget(radio);
-    radios->addStretch(1);
-    layout->addLayout(radios, 2, 0, 1, 3);
+    layout->addLayout(ui::ButtonRow({m_radioRbx0, m_radioAscii, m_radioExcel}), 2, 0, 1, 3);
     layout->setRowMinimumHeight(3, 12);
     layout->addWidget(Wrapped(tr("Specify name and title for the output data file or folder."), this), 4, 0, 1, 3);
     layout->addWidget(ui::LabelFor(tr("File Name:"), m_editFile, this), 5, 0);

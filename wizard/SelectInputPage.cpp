@@ -35,23 +35,20 @@ CSelectInputPage::CSelectInputPage(QWidget* parent) : CTSHarborPage(IDD, parent)
     m_ctrlFolder = new CVelmoraBrowseDirEdit(IDC_FOLDER_PATH, tr("Folder:"), this);
 
     auto* layout = new QGridLayout(this);
-    layout->setColumnStretch(2, 1);
-    layout->addWidget(new QLabel(tr("Type of conversion:"), this), 0, 0, 1, 2);
-    layout->addWidget(m_radioSingleFile, 1, 0, 1, 2);
-    layout->addWidget(m_radioFolder, 2, 0, 1, 2);
-    layout->addWidget(new QLabel(tr("Input format:"), this), 0, 2);
-    layout->addWidget(m_radioRbx0, 1, 2, Qt::AlignLeft);
-    layout->addWidget(m_radioAscii, 2, 2, Qt::AlignLeft);
-    layout->addWidget(m_radioExcel, 3, 2, Qt::AlignLeft);
-    layout->setRowMinimumHeight(4, 12);
-    layout->addWidget(new QLabel(tr("Select time series file:"), this), 5, 0, 1, 3);
-    layout->addWidget(ui::LabelFor(tr("File:"), m_ctrlFile->Edit(), this), 6, 0);
-    layout->addWidget(m_ctrlFile, 6, 1, 1, 2);
-    layout->setRowMinimumHeight(7, 12);
-    layout->addWidget(new QLabel(tr("Select time series folder:"), this), 8, 0, 1, 3);
-    layout->addWidget(ui::LabelFor(tr("Folder:"), m_ctrlFolder->Edit(), this), 9, 0);
-    layout->addWidget(m_ctrlFolder, 9, 1, 1, 2);
-    layout->setRowStretch(10, 1);
+    layout->setColumnStretch(1, 1);
+    layout->addWidget(new QLabel(tr("Type of conversion:"), this), 0, 0);
+    layout->addLayout(ui::ButtonRow({m_radioSingleFile, m_radioFolder}), 0, 1);
+    layout->addWidget(new QLabel(tr("Input format:"), this), 1, 0);
+    layout->addLayout(ui::ButtonRow({m_radioRbx0, m_radioAscii, m_radioExcel}), 1, 1);
+    layout->setRowMinimumHeight(2, 12);
+    layout->addWidget(new QLabel(tr("Select time series file:"), this), 3, 0, 1, 2);
+    layout->addWidget(ui::LabelFor(tr("File:"), m_ctrlFile->Edit(), this), 4, 0);
+    layout->addWidget(m_ctrlFile, 4, 1);
+    layout->setRowMinimumHeight(5, 12);
+    layout->addWidget(new QLabel(tr("Select time series folder:"), this), 6, 0, 1, 2);
+    layout->addWidget(ui::LabelFor(tr("Folder:"), m_ctrlFolder->Edit(), this), 7, 0);
+    layout->addWidget(m_ctrlFolder, 7, 1);
+    layout->setRowStretch(8, 1);
     FinishPage(kPageWidthUnits, kPageHeightUnits);
 
     connect(m_radioFolder, &QRadioButton::clicked, this, [this] { Apply([this](SelectInputState& s) { ClickFolder(s, Engine()); }); });
