@@ -55,6 +55,7 @@ TEST(PreviewDialog, AnAsciiPreviewHasOneInputColumnAsWideAsTheList)
     EXPECT_EQ(shown.Widths(result), (std::vector<int>{half, half}));
     EXPECT_TRUE(input->isVisible());
     EXPECT_EQ(shown.dialog.findChild<QPushButton*>("id1")->text(), "&Close");
+    guitest::SavePicture(shown.dialog, "preview-ascii");
 }
 
 TEST(PreviewDialog, AnExcelPreviewSharesTheWidthAmongItsCellColumnsWithoutMinimum)
@@ -106,6 +107,7 @@ TEST(PreviewDialog, WithoutInputLinesTheResultTakesTheWholeDialog)
     EXPECT_EQ(moved.left(), resultList.left());
     EXPECT_EQ(moved.right(), resultList.right());
     EXPECT_EQ(moved.bottom(), resultList.bottom());
+    guitest::SavePicture(shown.dialog, "preview-rbx0");
 }
 
 TEST(PreviewDialog, TheListsReadTheCallersRowsInPlace)

@@ -122,7 +122,8 @@ TEST(QtInterface, TheRbx0SelectorListsTheFilesItemsAndReturnsTheTickedOnes)
         EXPECT_EQ(list->topLevelItem(1)->checkState(0), Qt::Checked);
         EXPECT_EQ(list->topLevelItem(0)->checkState(0), Qt::Unchecked);
         list->topLevelItem(2)->setCheckState(0, Qt::Checked);
-        static_cast<QDialog&>(dialog).accept(); // what the Open/Save button does
+        guitest::SavePicture(dialog, "rbx0-selector");
+        dialog.accept();
     });
     std::string file;
     CUIntArray items;
