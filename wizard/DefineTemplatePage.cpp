@@ -68,20 +68,13 @@ CDefineTemplatePage::CDefineTemplatePage(QWidget* parent) : CTSHarborPage(IDD, p
     layout->setRowStretch(10, 1);
     FinishPage(kPageWidthUnits, kPageHeightUnits);
 
-    connect(m_radioUnchanged, &QRadioButton::clicked, this,
-            [this] { Apply([](DefineTemplateState& s) { ClickExistingTemplate(s, 1); }); });
-    connect(m_radioModify, &QRadioButton::clicked, this,
-            [this] { Apply([](DefineTemplateState& s) { ClickExistingTemplate(s, 2); }); });
-    connect(m_radioManual, &QRadioButton::clicked, this, [this] { Apply([](DefineTemplateState& s) { ClickManual(s); }); });
+    auto onClick = [this](QRadioButton* radio, auto rule) {
+        connect(radio, &QRadioButton::clicked, this, [this, rule] { ApplyRule(*this, rule); });
+    };
+    onClick(m_radioUnchanged, [](DefineTemplateState& s) { ClickExistingTemplate(s, 1); });
+    onClick(m_radioModify, [](DefineTemplateState& s) { ClickExistingTemplate(s, 2); });
+    onClick(m_radioManual, [](DefineTemplateState& s) { ClickManual(s); });
     connect(m_btnBrowse, &QPushButton::clicked, this, &CDefineTemplatePage::OnBrowse);
-}
-
-template <typename Rule>
-void CDefineTemplatePage::Apply(Rule rule)
-{
-    DefineTemplateState state = ReadControls();
-    rule(state);
-    ShowState(state);
 }
 
 DefineTemplateState CDefineTemplatePage::ReadControls() const

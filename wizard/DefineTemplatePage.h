@@ -33,8 +33,6 @@ public:
 
 private:
     void OnBrowse();
-    template <typename Rule>
-    void Apply(Rule rule);
 
     int m_nOption = 1; // the page's option as last shown
     std::array<QLabel*, 3> m_lines{}; // the controls are owned by the page

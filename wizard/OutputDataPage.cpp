@@ -101,9 +101,7 @@ void COutputDataPage::ShowState(const OutputState& state)
 
 void COutputDataPage::EnableOutputControls()
 {
-    OutputState state = ReadControls();
-    ::EnableOutputControls(state, InputType());
-    ShowState(state);
+    ApplyRule(*this, [this](OutputState& state) { ::EnableOutputControls(state, InputType()); });
 }
 
 bool COutputDataPage::OnInitDialog()
@@ -132,24 +130,15 @@ bool COutputDataPage::OnSetActive()
 
 void COutputDataPage::OnClickedOutputFormat()
 {
-    OutputState state = ReadControls();
-    ClickOutputFormat(state, state.format);
-    ShowState(state);
+    ApplyRule(*this, [](OutputState& state) { ClickOutputFormat(state, state.format); });
 }
 
 void COutputDataPage::OnBrowseOutputFile()
 {
-    OutputState state = ReadControls();
-    BrowseOutputFile(state, ExcelVersionFor(state.format));
-    ShowState(state);
+    ApplyRule(*this, [](OutputState& state) { BrowseOutputFile(state, ExcelVersionFor(state.format)); });
 }
 
-void COutputDataPage::OnBrowseOutputFolder()
-{
-    OutputState state = ReadControls();
-    BrowseOutputFolder(state);
-    ShowState(state);
-}
+void COutputDataPage::OnBrowseOutputFolder() { ApplyRule(*this, BrowseOutputFolder); }
 
 int COutputDataPage::ValidateOutput()
 {

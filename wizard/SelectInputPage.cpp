@@ -51,22 +51,16 @@ CSelectInputPage::CSelectInputPage(QWidget* parent) : CTSHarborPage(IDD, parent)
     layout->setRowStretch(8, 1);
     FinishPage(kPageWidthUnits, kPageHeightUnits);
 
-    connect(m_radioFolder, &QRadioButton::clicked, this, [this] { Apply([this](SelectInputState& s) { ClickFolder(s, Engine()); }); });
-    connect(m_radioSingleFile, &QRadioButton::clicked, this,
-            [this] { Apply([this](SelectInputState& s) { ClickSingleFile(s, Engine()); }); });
-    connect(m_radioRbx0, &QRadioButton::clicked, this, [this] { Apply([](SelectInputState& s) { ClickFormat(s, 1); }); });
-    connect(m_radioAscii, &QRadioButton::clicked, this, [this] { Apply([](SelectInputState& s) { ClickFormat(s, 2); }); });
-    connect(m_radioExcel, &QRadioButton::clicked, this, [this] { Apply([](SelectInputState& s) { ClickFormat(s, 3); }); });
+    auto onClick = [this](QRadioButton* radio, auto rule) {
+        connect(radio, &QRadioButton::clicked, this, [this, rule] { ApplyRule(*this, rule); });
+    };
+    onClick(m_radioFolder, [this](SelectInputState& s) { ClickFolder(s, Engine()); });
+    onClick(m_radioSingleFile, [this](SelectInputState& s) { ClickSingleFile(s, Engine()); });
+    onClick(m_radioRbx0, [](SelectInputState& s) { ClickFormat(s, 1); });
+    onClick(m_radioAscii, [](SelectInputState& s) { ClickFormat(s, 2); });
+    onClick(m_radioExcel, [](SelectInputState& s) { ClickFormat(s, 3); });
     connect(m_ctrlFile, &CVelmoraBrowseCtrl::SelectorOpening, this,
             [this](COkaFileSelectorDlg* dialog) { SelectorOpening(ReadControls(), Engine(), dialog); });
-}
-
-template <typename Rule>
-void CSelectInputPage::Apply(Rule rule)
-{
-    SelectInputState state = ReadControls();
-    rule(state);
-    ShowState(state);
 }
 
 SelectInputState CSelectInputPage::ReadControls() const

@@ -26,9 +26,6 @@ public:
     void ShowState(const SelectInputState& state);
 
 private:
-    // Runs a click's rule on the controls' state and shows the outcome.
-    template <typename Rule>
-    void Apply(Rule rule);
 
     QRadioButton* m_radioSingleFile = nullptr; // the controls are owned by the page
     QRadioButton* m_radioFolder = nullptr;

@@ -31,3 +31,13 @@ protected:
     // buttons theirs; called once the page's controls exist.
     void FinishPage(int widthUnits, int heightUnits);
 };
+
+// Runs a rule (a click, a browse) on the state of `page`'s controls and shows the outcome: what a
+// page decides lives in plain functions over that state, the page only reads and shows it.
+template <typename Page, typename Rule>
+void ApplyRule(Page& page, Rule rule)
+{
+    auto state = page.ReadControls();
+    rule(state);
+    page.ShowState(state);
+}

@@ -1,6 +1,6 @@
 // The define-template page's decisions without a window: what activation shows for a stored
 // setup, what the radios change, and what Next and Preview check, say and store.
-#include "tests/wizard/WizardTestSupport.h"
+#include "tests/wizard/FormTestSupport.h"
 
 #include "engine/Engine.h"
 #include "platform/system/FileSystem.h"
@@ -14,19 +14,8 @@ namespace {
 
 using namespace wizardtest;
 
-class DefineTemplate : public testing::Test {
+class DefineTemplate : public FormTest {
 protected:
-    // The record as the select-input page leaves it.
-    void ChooseInput(int format, bool singleFile, const std::string& path)
-    {
-        SelectInputState input = InitialSelectInput();
-        if (!singleFile)
-            ClickFolder(input, nullptr);
-        ClickFormat(input, format);
-        (singleFile ? input.file : input.folder) = path;
-        ASSERT_TRUE(AcceptSelectInput(input, &engine));
-        screen.boxes.clear();
-    }
     DefineTemplateState Shown()
     {
         DefineTemplateState state;
@@ -43,19 +32,6 @@ protected:
         state.path = path;
         return state;
     }
-    std::vector<std::string> Messages() const
-    {
-        std::vector<std::string> texts;
-        for (const auto& box : screen.boxes)
-            texts.push_back(box.text);
-        return texts;
-    }
-
-    TempFolder scratch;
-    Inputs inputs{scratch};
-    ui::ScriptedUserInterface screen;
-    ui::ScopedUserInterface watching{screen};
-    CEngine engine;
 };
 
 TEST_F(DefineTemplate, AStoredOptionShowsAdjustedButTheFieldFollowsTheRecord)

@@ -1,6 +1,6 @@
 // The item selection page's decisions without a window: which rows are ticked on activation, the
 // refusal of an empty selection, and what Next and Preview store.
-#include "tests/wizard/WizardTestSupport.h"
+#include "tests/wizard/FormTestSupport.h"
 
 #include "engine/Engine.h"
 #include "resources/StringTable.h"
@@ -14,32 +14,7 @@ namespace {
 
 using namespace wizardtest;
 
-class ItemSelectionTest : public testing::Test {
-protected:
-    void ChooseInput(int format, bool singleFile, const std::string& path, const std::string& templatePath = "")
-    {
-        SelectInputState input = InitialSelectInput();
-        if (!singleFile)
-            ClickFolder(input, nullptr);
-        ClickFormat(input, format);
-        (singleFile ? input.file : input.folder) = path;
-        ASSERT_TRUE(AcceptSelectInput(input, &engine));
-        if (!templatePath.empty()) {
-            DefineTemplateState choice;
-            LoadDefineTemplate(choice, engine);
-            ClickExistingTemplate(choice, 1);
-            choice.path = templatePath;
-            ASSERT_TRUE(AcceptDefineTemplate(choice, &engine));
-        }
-        screen.boxes.clear();
-    }
-
-    TempFolder scratch;
-    Inputs inputs{scratch};
-    ui::ScriptedUserInterface screen;
-    ui::ScopedUserInterface watching{screen};
-    CEngine engine;
-};
+using ItemSelectionTest = FormTest;
 
 TEST_F(ItemSelectionTest, TicksComeFromTheRecordElseTheTemplateElseAllItems)
 {

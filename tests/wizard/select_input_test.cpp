@@ -1,6 +1,6 @@
 // The select-input page's decisions without a window: the controls each click leaves, what Next
 // accepts and refuses (with which message), and what it stores in the setup record.
-#include "tests/wizard/WizardTestSupport.h"
+#include "tests/wizard/FormTestSupport.h"
 
 #include "engine/Engine.h"
 #include "platform/system/FileSystem.h"
@@ -14,36 +14,10 @@ namespace {
 
 using namespace wizardtest;
 
-class SelectInput : public testing::Test {
+class SelectInput : public FormTest {
 protected:
-    SelectInputState Single(int format, const std::string& file)
-    {
-        SelectInputState state = InitialSelectInput();
-        ClickFormat(state, format);
-        state.file = file;
-        return state;
-    }
-    SelectInputState Folder(int format, const std::string& folder)
-    {
-        SelectInputState state = InitialSelectInput();
-        ClickFolder(state, nullptr);
-        ClickFormat(state, format);
-        state.folder = folder;
-        return state;
-    }
-    std::vector<std::string> Messages() const
-    {
-        std::vector<std::string> texts;
-        for (const auto& box : screen.boxes)
-            texts.push_back(box.text);
-        return texts;
-    }
-
-    TempFolder scratch;
-    Inputs inputs{scratch};
-    ui::ScriptedUserInterface screen;
-    ui::ScopedUserInterface watching{screen};
-    CEngine engine;
+    static SelectInputState Single(int format, const std::string& file) { return InputChoice(format, true, file); }
+    static SelectInputState Folder(int format, const std::string& folder) { return InputChoice(format, false, folder); }
 };
 
 TEST_F(SelectInput, Rbx0ExtensionIsAPatternFromTheRecordAndSingleFileButBareFromTheStartAndItsRadio)

@@ -1,4 +1,5 @@
 #include "tests/wizard_gui/GuiTestSupport.h"
+#include "tests/wizard_gui/QtTestApplication.h"
 
 #include <QDir>
 #include <QPixmap>
@@ -9,30 +10,8 @@
 namespace guitest {
 namespace {
 
-// One QApplication for the whole test program, on the offscreen platform unless told otherwise.
-class QtApplicationEnvironment : public testing::Environment {
-public:
-    void SetUp() override
-    {
-        if (qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM"))
-            qputenv("QT_QPA_PLATFORM", "offscreen");
-        m_application = new QApplication(s_argc, s_argv);
-    }
-    void TearDown() override
-    {
-        delete m_application;
-        m_application = nullptr;
-    }
-
-private:
-    static inline int s_argc = 1;
-    static inline char s_name[] = "velmora-tests";
-    static inline char* s_argv[] = {s_name, nullptr};
-    QApplication* m_application = nullptr;
-};
-
-[[maybe_unused]] testing::Environment* const g_environment =
-    testing::AddGlobalTestEnvironment(new QtApplicationEnvironment);
+[[maybe_unused]] testing::Environment* const g_application =
+    testing::AddGlobalTestEnvironment(new QtTestApplication("velmora-wizard-tests"));
 
 CWizard* ShownWizard()
 {

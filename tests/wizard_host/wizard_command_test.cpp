@@ -3,6 +3,7 @@
 // (as an automation tool would), and the host's code writes the document back. The wizard also
 // starts as a program of its own, on a real X server and offscreen.
 #include "tests/checks/CheckTestSupport.h"
+#include "tests/wizard_gui/QtTestApplication.h"
 
 #include "apps/velmora/WizardDocument.h"
 #include "converter/RbxSeriesWriter.h"
@@ -43,25 +44,8 @@ int Shell(const std::string& command)
     return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }
 
-class QtApplicationEnvironment : public testing::Environment {
-public:
-    void SetUp() override
-    {
-        if (qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM"))
-            qputenv("QT_QPA_PLATFORM", "offscreen");
-        m_application = new QApplication(s_argc, s_argv);
-    }
-    void TearDown() override { delete m_application; }
-
-private:
-    static inline int s_argc = 1;
-    static inline char s_name[] = "velmora-host-tests";
-    static inline char* s_argv[] = {s_name, nullptr};
-    QApplication* m_application = nullptr;
-};
-
-[[maybe_unused]] testing::Environment* const g_environment =
-    testing::AddGlobalTestEnvironment(new QtApplicationEnvironment);
+[[maybe_unused]] testing::Environment* const g_application =
+    testing::AddGlobalTestEnvironment(new QtTestApplication("velmora-host-tests"));
 
 // Drives the plug-in's wizard by control names only.
 class Automation {

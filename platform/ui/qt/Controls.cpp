@@ -2,6 +2,7 @@
 
 #include <QAbstractButton>
 #include <QFontMetrics>
+#include <QHBoxLayout>
 #include <QLabel>
 #include <QPushButton>
 #include <QWidget>
@@ -91,6 +92,15 @@ QPushButton* BrowseButton(const QString& accessibleName, QWidget* parent)
     button->setAccessibleName(accessibleName);
     button->setFixedWidth(button->fontMetrics().horizontalAdvance(QStringLiteral("....")) + 16);
     return button;
+}
+
+QHBoxLayout* ButtonRow(std::initializer_list<QAbstractButton*> buttons)
+{
+    auto* row = new QHBoxLayout(); // owned by the layout it is added to
+    for (QAbstractButton* button : buttons)
+        row->addWidget(button);
+    row->addStretch(1);
+    return row;
 }
 
 QLabel* LabelFor(const QString& text, QWidget* buddy, QWidget* parent)

@@ -6,7 +6,10 @@
 #include <QSize>
 #include <QString>
 
+#include <initializer_list>
+
 class QAbstractButton;
+class QHBoxLayout;
 class QLabel;
 class QPushButton;
 class QWidget;
@@ -23,6 +26,9 @@ void IdentifyWidget(QWidget* widget, int id, const QString& accessibleName);
 
 // A "..." button that opens a chooser, as narrow as its text; `accessibleName` says what it opens.
 QPushButton* BrowseButton(const QString& accessibleName, QWidget* parent);
+
+// Buttons side by side, each as wide as its text, the rest of the line left empty.
+QHBoxLayout* ButtonRow(std::initializer_list<QAbstractButton*> buttons);
 
 // A label for `buddy`: the buddy takes the label's text (without "&") as its accessible name.
 QLabel* LabelFor(const QString& text, QWidget* buddy, QWidget* parent);
