@@ -32,6 +32,15 @@ protected:
         state.path = path;
         return state;
     }
+    // An ASCII template that splits at commas, which the tab-separated input does not have.
+    std::string MisfitAsciiTemplate()
+    {
+        CAsciiSpecification comma;
+        comma.m_strDelimiter = "Comma";
+        const std::string path = scratch / "comma.xml";
+        EXPECT_EQ(comma.Save(path), 1);
+        return path;
+    }
 };
 
 TEST_F(DefineTemplate, AStoredOptionShowsAdjustedButTheFieldFollowsTheRecord)
@@ -160,10 +169,7 @@ TEST_F(DefineTemplate, AnUnchangedTemplateIsCheckedParsedAndStored)
 
 TEST_F(DefineTemplate, ASingleFileTheTemplateDoesNotFitKeepsTheUserWithoutAMessage)
 {
-    CAsciiSpecification comma;
-    comma.m_strDelimiter = "Comma";
-    const std::string misfit = scratch / "comma.xml";
-    ASSERT_EQ(comma.Save(misfit), 1);
+    const std::string misfit = MisfitAsciiTemplate();
     ChooseInput(2, true, inputs.asciiFile);
     EXPECT_FALSE(AcceptDefineTemplate(Choice(1, misfit), &engine));
     EXPECT_TRUE(screen.boxes.empty()) << screen.boxes[0].text;
@@ -192,10 +198,7 @@ TEST_F(DefineTemplate, PreviewShowsTheFileThroughTheTemplateAndRemovesTheWorking
 
 TEST_F(DefineTemplate, PreviewWithAMisfitTemplateStillShowsTheFileAsItStands)
 {
-    CAsciiSpecification comma;
-    comma.m_strDelimiter = "Comma";
-    const std::string misfit = scratch / "comma.xml";
-    ASSERT_EQ(comma.Save(misfit), 1);
+    const std::string misfit = MisfitAsciiTemplate();
     ChooseInput(2, true, inputs.asciiFile);
     EXPECT_EQ(PreviewDefineTemplate(Choice(1, misfit), &engine), 1);
     ASSERT_EQ(screen.previews.size(), 1u);
