@@ -1,6 +1,7 @@
 #include "wizard/SetupGui.h"
 
 #include "engine/Engine.h"
+#include "platform/system/FileSystem.h"
 #include "platform/ui/qt/QtUserInterface.h"
 #include "wizard/Wizard.h"
 
@@ -45,5 +46,8 @@ int ShowSetupWizard()
     const int result = wizard.DoModal();
     if (result == CHarborWizard::ID_WIZFINISH)
         WriteSetup(engine);
+    // The working copy of the template served the checks and previews only.
+    if (!engine.m_strWorkTemplate.empty())
+        sys::DeleteFile(engine.m_strWorkTemplate);
     return result;
 }

@@ -77,6 +77,7 @@ protected:
             script(driver);
         });
         EXPECT_EQ(result, kFinished) << road;
+        EXPECT_TRUE(std::filesystem::is_empty(inputs.temp)) << road << ": the wizard left a working file";
         if (result != kFinished || !GetModuleWpxHandle())
             return std::string();
         const std::string document = scratch / (road + ".wpx");
