@@ -1,50 +1,19 @@
 // The rbx0 preview reads every time step into the result table. Measures the time of a parse and its
 // memory: the table's own bytes (vectors and strings, counted from their capacities) against the
 // process's peak resident memory during the parse, and what showing the preview adds to that peak.
+#include "bench/RbxBenchFiles.h"
 #include "parsers/RbxPreviewFileParser.h"
-#include "platform/rbx/RbxWriter.h"
-#include "platform/units/Units.h"
 
 #include <benchmark/benchmark.h>
 
 #include <cstdio>
-#include <fstream>
-#include <map>
 #include <string>
-#include <unistd.h>
 
 namespace {
 
-constexpr int kItems = 10;
-
-std::string MakeFile(long steps)
-{
-    static std::map<long, std::string> made;
-    if (auto found = made.find(steps); found != made.end())
-        return found->second;
-    const std::string path = "/tmp/velmora-bench-" + std::to_string(::getpid()) + "-" + std::to_string(steps) + ".rbx0";
-    rbx::FileDefinition definition;
-    definition.timeUnitKey = units::kUnitSecond;
-    definition.calendarStart = COleDateTime(2000, 1, 1, 0, 0, 0);
-    for (int i = 0; i < kItems; ++i) {
-        rbx::ItemInfo item;
-        item.name = "Item" + std::to_string(i + 1);
-        item.dataType = rbx::kFloat32;
-        definition.items.push_back(item);
-    }
-    rbx::CRbxWriter writer;
-    if (!writer.Open(path, definition))
-        return std::string();
-    double values[kItems];
-    for (long t = 0; t < steps; ++t) {
-        for (int i = 0; i < kItems; ++i)
-            values[i] = (t % 1000) * 0.25 + i;
-        writer.WriteStep(t * 600.0, values);
-    }
-    writer.Close();
-    made[steps] = path;
-    return path;
-}
+using benchfiles::MakeRbxFile;
+using benchfiles::ResetPeak;
+using benchfiles::StatusKilobytes;
 
 // The bytes the table holds on the heap, without allocator overhead.
 double TableBytes(const ui::Rows& rows)
@@ -59,22 +28,9 @@ double TableBytes(const ui::Rows& rows)
     return bytes;
 }
 
-long StatusKilobytes(const char* key)
-{
-    std::ifstream status("/proc/self/status");
-    std::string line;
-    while (std::getline(status, line))
-        if (line.rfind(key, 0) == 0)
-            return std::stol(line.substr(std::string(key).size()));
-    return 0;
-}
-
-// Makes the kernel's peak resident size start again from the current one.
-void ResetPeak() { std::ofstream("/proc/self/clear_refs") << "5"; }
-
 void BM_RbxPreviewParse(benchmark::State& state)
 {
-    const std::string path = MakeFile(state.range(0));
+    const std::string path = MakeRbxFile(state.range(0));
     if (path.empty()) {
         state.SkipWithError("cannot write the rbx0 file");
         return;

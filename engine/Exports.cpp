@@ -2,6 +2,7 @@
 // the entry point's failure value.
 #include "engine/Engine.h"
 #include "platform/wpx/Wpx.h"
+#include "wizard/SetupGui.h"
 
 #include <algorithm>
 #include <cstring>
@@ -48,6 +49,10 @@ VELMORA_EXPORT int RunEngine() { return Guarded(-1, [] { return RunWithSetup(0);
 VELMORA_EXPORT int RunEngineSilent() { return Guarded(-1, [] { return RunWithSetup(1); }); }
 
 VELMORA_EXPORT int MyFunc() { return -1; }
+
+// Runs the setup wizard on the module's document; 12325 after Finish (the new document is then
+// the module's), 2 after Cancel, -1 when it could not run.
+VELMORA_EXPORT int ShowSetupGUI() { return Guarded(-1, [] { return ShowSetupWizard(); }); }
 
 // Documents live in the plug-in's handle table, so the host opens, saves and closes them here.
 // LoadWpxDocument returns the new document's handle, or 0 with the reason ("file:line: ...") in

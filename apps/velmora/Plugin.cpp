@@ -33,7 +33,9 @@ std::unique_ptr<Plugin> Plugin::Load(std::string& error)
 {
     std::unique_ptr<Plugin> plugin(new Plugin());
     plugin->m_path = PluginPath();
-    plugin->m_library = ::dlopen(plugin->m_path.c_str(), RTLD_NOW | RTLD_LOCAL);
+    // The plug-in brings Qt, whose libraries cannot be unloaded cleanly: it stays mapped until the
+    // process ends, and dlclose only drops the reference.
+    plugin->m_library = ::dlopen(plugin->m_path.c_str(), RTLD_NOW | RTLD_LOCAL | RTLD_NODELETE);
     if (!plugin->m_library) {
         const char* reason = ::dlerror();
         error = "cannot load the plug-in " + plugin->m_path + ": " + (reason ? reason : "unknown reason");
@@ -57,6 +59,7 @@ bool Plugin::Resolve(std::string& error)
     return Bind(m_library, "SetWpxHandle", m_setHandle, error) && Bind(m_library, "GetWpxHandle", m_getHandle, error) &&
            Bind(m_library, "RunEngine", m_runEngine, error) &&
            Bind(m_library, "RunEngineSilent", m_runEngineSilent, error) &&
+           Bind(m_library, "ShowSetupGUI", m_showSetupGui, error) &&
            Bind(m_library, "LoadWpxDocument", m_load, error) && Bind(m_library, "SaveWpxDocument", m_save, error) &&
            Bind(m_library, "CloseWpxDocument", m_close, error);
 }

@@ -25,6 +25,7 @@ public:
     int GetWpxHandle() const { return m_getHandle(); }
     int RunEngine() const { return m_runEngine(); }
     int RunEngineSilent() const { return m_runEngineSilent(); }
+    int ShowSetupGUI() const { return m_showSetupGui(); }
 
 private:
     Plugin() = default;
@@ -36,6 +37,7 @@ private:
     int (*m_getHandle)() = nullptr;
     int (*m_runEngine)() = nullptr;
     int (*m_runEngineSilent)() = nullptr;
+    int (*m_showSetupGui)() = nullptr;
     int (*m_load)(const char*, char*, int) = nullptr;
     int (*m_save)(int, const char*) = nullptr;
     int (*m_close)(int) = nullptr;

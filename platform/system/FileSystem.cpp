@@ -129,6 +129,15 @@ std::string FileTitle(const std::string& path)
     return slash == std::string::npos ? path : path.substr(slash + 1);
 }
 
+std::string FileExtension(const std::string& path)
+{
+    const size_t slash = path.find_last_of('/');
+    const size_t point = path.find_last_of('.');
+    if (point == std::string::npos || (slash != std::string::npos && point < slash))
+        return std::string();
+    return path.substr(point);
+}
+
 std::string FolderOf(const std::string& path)
 {
     size_t slash = path.find_last_of('/');

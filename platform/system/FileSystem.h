@@ -39,6 +39,9 @@ std::optional<std::vector<std::string>> ListFolder(const std::string& folder);
 
 // The display title of a file: its name without the folder.
 std::string FileTitle(const std::string& path);
+// The extension of a path: from the last point of its last element, point included; empty when
+// that element has none.
+std::string FileExtension(const std::string& path);
 // The folder part of a path, without the trailing "/"; empty for a bare name.
 std::string FolderOf(const std::string& path);
 // `folder` joined with `name`, with exactly one "/" between.

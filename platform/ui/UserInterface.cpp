@@ -39,6 +39,15 @@ UserInterface& Current()
 
 void SetProcessUserInterface(UserInterface* ui) { g_process = ui; }
 
+UserInterface* InstalledUserInterface() { return t_scoped ? t_scoped : g_process; }
+
+bool UserInterface::BrowseForFolder(const FolderDialogRequest& request, std::string& path)
+{
+    return ChooseFolder(request.prompt, path);
+}
+
+bool UserInterface::ChooseRbxItems(const RbxSelectionRequest&, std::string&, std::vector<unsigned>&) { return false; }
+
 ScopedUserInterface::ScopedUserInterface(UserInterface& ui) : m_previous(t_scoped) { t_scoped = &ui; }
 ScopedUserInterface::~ScopedUserInterface() { t_scoped = m_previous; }
 
@@ -105,7 +114,7 @@ void ScriptedUserInterface::ShowPreview(const PreviewContent& content)
                         Rows(content.resultRows.begin(), content.resultRows.end())});
 }
 
-bool ScriptedUserInterface::ChooseFile(const FileDialogRequest&, std::string& path)
+bool ScriptedUserInterface::NextPath(std::string& path)
 {
     if (chosenPaths.empty())
         return false;
@@ -114,9 +123,37 @@ bool ScriptedUserInterface::ChooseFile(const FileDialogRequest&, std::string& pa
     return true;
 }
 
-bool ScriptedUserInterface::ChooseFolder(const std::string&, std::string& path)
+bool ScriptedUserInterface::ChooseFile(const FileDialogRequest& request, std::string& path)
 {
-    return ChooseFile(FileDialogRequest{}, path);
+    fileRequests.push_back(request);
+    return NextPath(path);
+}
+
+bool ScriptedUserInterface::ChooseFolder(const std::string& prompt, std::string& path)
+{
+    return BrowseForFolder(FolderDialogRequest{prompt, path, 0}, path);
+}
+
+bool ScriptedUserInterface::BrowseForFolder(const FolderDialogRequest& request, std::string& path)
+{
+    folderRequests.push_back(request);
+    return NextPath(path);
+}
+
+bool ScriptedUserInterface::ChooseRbxItems(const RbxSelectionRequest& request, std::string& file,
+                                           std::vector<unsigned>& items)
+{
+    rbxRequests.push_back(request);
+    if (request.opening)
+        request.opening(nullptr);
+    if (!NextPath(file))
+        return false;
+    items.clear();
+    if (!chosenItems.empty()) {
+        items = chosenItems.front();
+        chosenItems.pop_front();
+    }
+    return true;
 }
 
 } // namespace ui

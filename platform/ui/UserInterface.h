@@ -3,9 +3,12 @@
 // Parsers, pages and the setup record call these functions; which implementation answers is chosen
 // at the edge (Qt in the wizard, console in the host program, scripted in tests, silent in the bridge).
 #include <deque>
+#include <functional>
 #include <span>
 #include <string>
 #include <vector>
+
+class COkaFileSelectorDlg; // the rbx0 file-and-item selector of the Qt layer
 
 namespace ui {
 
@@ -13,14 +16,24 @@ namespace ui {
 enum : unsigned {
     MB_OK = 0x0,
     MB_OKCANCEL = 0x1,
+    MB_ABORTRETRYIGNORE = 0x2,
     MB_YESNOCANCEL = 0x3,
     MB_YESNO = 0x4,
+    MB_RETRYCANCEL = 0x5,
     MB_ICONSTOP = 0x10,
     MB_ICONQUESTION = 0x20,
     MB_ICONEXCLAMATION = 0x30,
     MB_ICONINFORMATION = 0x40,
 };
-enum : int { IDOK = 1, IDCANCEL = 2, IDYES = 6, IDNO = 7 };
+enum : int { IDOK = 1, IDCANCEL = 2, IDABORT = 3, IDRETRY = 4, IDIGNORE = 5, IDYES = 6, IDNO = 7 };
+
+// File dialog flags the pages pass, with the values the toolbox uses.
+enum : unsigned {
+    OFN_OVERWRITEPROMPT = 0x2,
+    OFN_HIDEREADONLY = 0x4,
+    OFN_ALLOWMULTISELECT = 0x200,
+    OFN_FILEMUSTEXIST = 0x1000,
+};
 
 using Row = std::vector<std::string>;
 using Rows = std::vector<Row>;
@@ -50,6 +63,24 @@ struct FileDialogRequest {
     unsigned flags = 0;
 };
 
+// The folder browser: `startFolder` is where it opens (empty: the desktop).
+struct FolderDialogRequest {
+    std::string prompt;
+    std::string startFolder;
+    unsigned flags = 0; // the shell's BIF_ flags, as the page passes them
+};
+
+// The rbx0 file-and-item selector: a file and the items of it to use.
+struct RbxSelectionRequest {
+    std::string filter; // "Name (*.x)|*.x|...||" for its file chooser
+    std::string extension;
+    std::string initialFile;
+    std::vector<unsigned> initialItems; // 0-based positions
+    // Called once the selector exists, before it is shown, so the caller may narrow it (null in
+    // implementations that show no selector).
+    std::function<void(COkaFileSelectorDlg*)> opening;
+};
+
 class UserInterface {
 public:
     virtual ~UserInterface() = default;
@@ -60,6 +91,10 @@ public:
     // File and folder choosers: true with `path` set when the user chose one.
     virtual bool ChooseFile(const FileDialogRequest& request, std::string& path) = 0;
     virtual bool ChooseFolder(const std::string& prompt, std::string& path) = 0;
+    // The folder browser with its start folder and flags; by default the plain ChooseFolder.
+    virtual bool BrowseForFolder(const FolderDialogRequest& request, std::string& path);
+    // The rbx0 selector: true with the chosen file and items; none where nothing can be shown.
+    virtual bool ChooseRbxItems(const RbxSelectionRequest& request, std::string& file, std::vector<unsigned>& items);
 };
 
 // The implementation in force on the calling thread: the one installed for this thread by a
@@ -67,6 +102,8 @@ public:
 UserInterface& Current();
 // Replaces the process-wide implementation (null restores the console); not owned.
 void SetProcessUserInterface(UserInterface* ui);
+// The implementation someone installed (thread or process), or null when the console answers.
+UserInterface* InstalledUserInterface();
 
 // Installs an implementation for the calling thread for the lifetime of this object.
 class ScopedUserInterface {
@@ -115,11 +152,22 @@ public:
     std::vector<RecordedPreview> previews;
     std::deque<int> answers;            // next message-box answers; default button when empty
     std::deque<std::string> chosenPaths; // next file/folder choices; cancelled when empty
+    std::vector<FileDialogRequest> fileRequests;
+    std::vector<FolderDialogRequest> folderRequests;
+    std::vector<RbxSelectionRequest> rbxRequests;
+    std::deque<std::vector<unsigned>> chosenItems; // items of the next rbx0 selections; none when empty
 
     int MessageBox(const std::string& text, const std::string& caption, unsigned type) override;
     void ShowPreview(const PreviewContent& content) override;
     bool ChooseFile(const FileDialogRequest& request, std::string& path) override;
     bool ChooseFolder(const std::string& prompt, std::string& path) override;
+    bool BrowseForFolder(const FolderDialogRequest& request, std::string& path) override;
+    // Tells the caller the selector opens (with no dialog), then answers from chosenPaths and
+    // chosenItems.
+    bool ChooseRbxItems(const RbxSelectionRequest& request, std::string& file, std::vector<unsigned>& items) override;
+
+private:
+    bool NextPath(std::string& path);
 };
 
 // The button a box answers with when nobody presses one: OK, or Yes for a yes/no box.

@@ -321,4 +321,55 @@ int wpxGetParamFilename(WPXHANDLE section, const CString& key, CString* value, i
     return 1;
 }
 
+namespace {
+
+// `path` relative to `folder` when it lies inside it (lexically, after dropping "." and ".."),
+// else empty.
+std::string RelativeInside(const std::string& path, const std::filesystem::path& folder)
+{
+    const std::filesystem::path target = std::filesystem::path(path).lexically_normal();
+    const std::filesystem::path relative = target.lexically_relative(folder);
+    if (relative.empty() || relative == "." || *relative.begin() == "..")
+        return std::string();
+    return relative.string();
+}
+
+int RelativizeContainer(Container& container, const std::filesystem::path& folder)
+{
+    int changed = 0;
+    for (Entry& entry : container.entries) {
+        if (entry.section) {
+            changed += RelativizeContainer(*entry.section, folder);
+            continue;
+        }
+        for (auto& param : entry.keyword->params) {
+            if (param->type != wpxFilename || param->text.empty() || param->text.front() != '/')
+                continue;
+            std::string relative = RelativeInside(param->text, folder);
+            if (!relative.empty()) {
+                // A folder name keeps its closing "/", which the pages rely on.
+                if (param->text.back() == '/' && relative.back() != '/')
+                    relative += '/';
+                param->text = relative;
+                ++changed;
+            }
+        }
+    }
+    return changed;
+}
+
+} // namespace
+
+int wpxMakeFileNamesRelative(WPXHANDLE doc, const CString& folder)
+{
+    Document* document = FindDocument(doc);
+    if (!document || folder.empty() || folder.front() != '/')
+        return 0;
+    const std::filesystem::path base = std::filesystem::path(folder).lexically_normal() / "";
+    int changed = 0;
+    for (auto& target : document->targets)
+        changed += RelativizeContainer(*target, base.parent_path());
+    return changed;
+}
+
 int wpxHandlesInUse() { return InUse(); }

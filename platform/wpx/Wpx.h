@@ -99,5 +99,10 @@ int wpxGetParam(WPXHANDLE section, const CString& key, int* value, int keyNum, i
 int wpxGetParam(WPXHANDLE section, const CString& key, CString* value, int keyNum, int paramNum);
 int wpxGetParamFilename(WPXHANDLE section, const CString& key, CString* value, int keyNum, int paramNum);
 
+// Rewrites every absolute file-name parameter that names something inside `folder` (an absolute
+// folder) relative to it, so a document saved there keeps working when the folder moves. Names
+// outside the folder, empty names and texts stay as they are. Returns the number rewritten.
+int wpxMakeFileNamesRelative(WPXHANDLE doc, const CString& folder);
+
 // Number of handles in use, for tests that look for leaks.
 int wpxHandlesInUse();

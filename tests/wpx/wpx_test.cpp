@@ -169,6 +169,51 @@ TEST(WpxRead, RelativeFileNamesAreAnchoredAtTheDocumentsFolder)
     wpxClose(&doc);
 }
 
+TEST(WpxRelative, NamesInsideTheFolderAreWrittenRelativeAndReadBackTheSame)
+{
+    ScratchFolder scratch;
+    const std::string docs = scratch.File("docs");
+    fs::create_directory(docs);
+    const std::string inside = docs + "/data/in.csv";
+    const std::string folder = docs + "/out/";
+    const std::string outside = scratch.File("docsx/a.txt");
+    const std::string nested = docs + "/t.xml";
+    const std::string text = "wpx 1\n"
+                             "target \"T\"\n"
+                             "  File = file \"" + inside + "\", file \"" + folder + "\", file \"" + outside +
+                             "\", file \"\", file \"" + docs + "\"\n"
+                             "  Text = \"" + inside + "\"\n"
+                             "  section \"S\"\n"
+                             "    Name = file \"" + nested + "\"\n"
+                             "  end\n"
+                             "end\n"
+                             "wpx end\n";
+    WPXHANDLE doc = nullptr;
+    std::string error;
+    ASSERT_EQ(wpxParse(text, "built", "", &doc, &error), 1) << error;
+    EXPECT_EQ(wpxMakeFileNamesRelative(doc, docs + "/"), 3);
+    const std::string written = wpxFormat(doc);
+    EXPECT_NE(written.find("file \"data/in.csv\""), std::string::npos) << written;
+    EXPECT_NE(written.find("file \"out/\""), std::string::npos) << written;
+    EXPECT_NE(written.find("file \"t.xml\""), std::string::npos) << written;
+    EXPECT_NE(written.find("file \"" + outside + "\""), std::string::npos) << "outside the folder stays absolute";
+    EXPECT_NE(written.find("Text = \"" + inside + "\""), std::string::npos) << "texts are no file names";
+    ASSERT_EQ(wpxWrite(doc, docs + "/setup.wpx"), 1);
+    wpxClose(&doc);
+
+    ASSERT_EQ(wpxRead(docs + "/setup.wpx", &doc, &error), 1) << error;
+    WPXHANDLE file = wpxKeywordByNameNum(wpxTargetByNum(doc, 1), "File", 1);
+    EXPECT_EQ(wpxGetText(wpxParamByNum(file, 1)), inside);
+    EXPECT_EQ(wpxGetText(wpxParamByNum(file, 2)), folder) << "a folder keeps its closing /";
+    EXPECT_EQ(wpxGetText(wpxParamByNum(file, 3)), outside);
+    EXPECT_EQ(wpxGetText(wpxParamByNum(file, 5)), docs);
+    CString name;
+    wpxGetParamFilename(wpxSectionByNameNum(wpxTargetByNum(doc, 1), "S", 1), "Name", &name, 1, 1);
+    EXPECT_EQ(name, nested);
+    EXPECT_EQ(wpxMakeFileNamesRelative(doc, "relative/folder"), 0) << "only an absolute folder anchors";
+    wpxClose(&doc);
+}
+
 TEST(WpxRead, CommentsBlankLinesIndentationCrLfAndByteOrderMarkAreAccepted)
 {
     WPXHANDLE doc = nullptr;

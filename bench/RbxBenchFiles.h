@@ -1,0 +1,62 @@
+#pragma once
+// What the rbx0 preview benchmarks share: a file of 10 float32 items with a given number of steps,
+// and the process's resident memory from the kernel.
+#include "platform/rbx/RbxWriter.h"
+#include "platform/units/Units.h"
+
+#include <fstream>
+#include <map>
+#include <string>
+#include <unistd.h>
+
+namespace benchfiles {
+
+constexpr int kItems = 10;
+
+// Writes (once per process) an rbx0 file of `steps` ten-minute steps; empty when it cannot.
+inline std::string MakeRbxFile(long steps)
+{
+    static std::map<long, std::string> made;
+    if (auto found = made.find(steps); found != made.end())
+        return found->second;
+    const std::string path = "/tmp/velmora-bench-" + std::to_string(::getpid()) + "-" + std::to_string(steps) + ".rbx0";
+    rbx::FileDefinition definition;
+    definition.timeUnitKey = units::kUnitSecond;
+    definition.calendarStart = COleDateTime(2000, 1, 1, 0, 0, 0);
+    for (int i = 0; i < kItems; ++i) {
+        rbx::ItemInfo item;
+        item.name = "Item" + std::to_string(i + 1);
+        item.dataType = rbx::kFloat32;
+        definition.items.push_back(item);
+    }
+    rbx::CRbxWriter writer;
+    if (!writer.Open(path, definition))
+        return std::string();
+    double values[kItems];
+    for (long t = 0; t < steps; ++t) {
+        for (int i = 0; i < kItems; ++i)
+            values[i] = (t % 1000) * 0.25 + i;
+        writer.WriteStep(t * 600.0, values);
+    }
+    writer.Close();
+    made[steps] = path;
+    return path;
+}
+
+// A value of /proc/self/status in kB ("VmRSS:", "VmHWM:").
+inline long StatusKilobytes(const char* key)
+{
+    std::ifstream status("/proc/self/status");
+    std::string line;
+    while (std::getline(status, line))
+        if (line.rfind(key, 0) == 0)
+            return std::stol(line.substr(std::string(key).size()));
+    return 0;
+}
+
+inline double StatusBytes(const char* key) { return static_cast<double>(StatusKilobytes(key)) * 1024.0; }
+
+// Makes the kernel's peak resident size start again from the current one.
+inline void ResetPeak() { std::ofstream("/proc/self/clear_refs") << "5"; }
+
+} // namespace benchfiles

@@ -1,0 +1,156 @@
+#include "platform/ui/qt/Controls.h"
+
+#include <QAbstractButton>
+#include <QFontMetrics>
+#include <QHBoxLayout>
+#include <QLabel>
+#include <QPushButton>
+#include <QWidget>
+
+namespace ui {
+namespace {
+
+QString WithoutAmpersands(QString text)
+{
+    text.remove('&');
+    return text;
+}
+
+// The letter after a single "&", lower case; a null character when there is none.
+QChar MnemonicOf(const QString& text)
+{
+    for (qsizetype i = 0; i + 1 < text.size(); ++i) {
+        if (text[i] != '&')
+            continue;
+        if (text[i + 1] == '&') {
+            ++i;
+            continue;
+        }
+        return text[i + 1].toLower();
+    }
+    return QChar();
+}
+
+QString TextOf(QWidget* widget)
+{
+    if (auto* button = qobject_cast<QAbstractButton*>(widget))
+        return button->text();
+    if (auto* label = qobject_cast<QLabel*>(widget); label && label->buddy())
+        return label->text();
+    return QString();
+}
+
+void SetTextOf(QWidget* widget, const QString& text)
+{
+    if (auto* button = qobject_cast<QAbstractButton*>(widget))
+        button->setText(text);
+    else if (auto* label = qobject_cast<QLabel*>(widget))
+        label->setText(text);
+}
+
+// Where to put the "&": the first free letter that starts a word, else the first free letter.
+qsizetype MnemonicPosition(const QString& text, const QString& taken)
+{
+    for (int wordStartsOnly = 1; wordStartsOnly >= 0; --wordStartsOnly) {
+        for (qsizetype i = 0; i < text.size(); ++i) {
+            const QChar c = text[i];
+            if (!c.isLetterOrNumber() || taken.contains(c.toLower()))
+                continue;
+            if (wordStartsOnly && i > 0 && text[i - 1].isLetterOrNumber())
+                continue;
+            return i;
+        }
+    }
+    return -1;
+}
+
+QList<QWidget*> MnemonicCandidates(QWidget* root)
+{
+    QList<QWidget*> candidates;
+    for (QWidget* widget : root->findChildren<QWidget*>()) {
+        const QString text = TextOf(widget);
+        if (!text.isEmpty())
+            candidates << widget;
+    }
+    return candidates;
+}
+
+} // namespace
+
+QString ControlName(int id) { return QStringLiteral("id%1").arg(id); }
+
+void IdentifyWidget(QWidget* widget, int id, const QString& accessibleName)
+{
+    widget->setObjectName(ControlName(id));
+    if (!accessibleName.isEmpty())
+        widget->setAccessibleName(WithoutAmpersands(accessibleName));
+}
+
+QPushButton* BrowseButton(const QString& accessibleName, QWidget* parent)
+{
+    auto* button = new QPushButton(QStringLiteral("..."), parent); // owned by `parent`
+    button->setAccessibleName(accessibleName);
+    button->setFixedWidth(button->fontMetrics().horizontalAdvance(QStringLiteral("....")) + 16);
+    return button;
+}
+
+QHBoxLayout* ButtonRow(std::initializer_list<QAbstractButton*> buttons)
+{
+    auto* row = new QHBoxLayout(); // owned by the layout it is added to
+    for (QAbstractButton* button : buttons)
+        row->addWidget(button);
+    row->addStretch(1);
+    return row;
+}
+
+QLabel* LabelFor(const QString& text, QWidget* buddy, QWidget* parent)
+{
+    auto* label = new QLabel(text, parent); // owned by `parent`
+    label->setBuddy(buddy);
+    buddy->setAccessibleName(WithoutAmpersands(text));
+    return label;
+}
+
+void AssignMnemonics(QWidget* root, const QString& reserved)
+{
+    QString taken = reserved.toLower();
+    const QList<QWidget*> candidates = MnemonicCandidates(root);
+    for (QWidget* widget : candidates) {
+        const QChar letter = MnemonicOf(TextOf(widget));
+        if (!letter.isNull())
+            taken += letter;
+    }
+    for (QWidget* widget : candidates) {
+        const QString text = TextOf(widget);
+        if (!MnemonicOf(text).isNull() || text.contains("&&"))
+            continue;
+        const qsizetype at = MnemonicPosition(text, taken);
+        if (at < 0)
+            continue;
+        taken += text[at].toLower();
+        SetTextOf(widget, text.left(at) + '&' + text.mid(at));
+    }
+}
+
+QString MnemonicsUnder(QWidget* root)
+{
+    QString letters;
+    for (QWidget* widget : MnemonicCandidates(root)) {
+        if (!widget->isVisibleTo(root))
+            continue;
+        const QChar letter = MnemonicOf(TextOf(widget));
+        if (!letter.isNull())
+            letters += letter;
+    }
+    return letters;
+}
+
+QSize DialogUnitsToPixels(const QFont& font, int width, int height)
+{
+    const QFontMetrics metrics(font);
+    static const QString alphabet = QStringLiteral("ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz");
+    const int averageWidth = (metrics.horizontalAdvance(alphabet) / 26 + 1) / 2;
+    return QSize(width * averageWidth / 4, height * metrics.height() / 8);
+}
+
+} // namespace ui
