@@ -3,11 +3,18 @@
 #include "platform/spreadsheet/LittleEndian.h"
 #include "platform/spreadsheet/WorkbookImport.h"
 
+#include <set>
+
 namespace sheet {
 
 namespace {
 
 constexpr std::uint32_t kLastRegularSector = 0xFFFFFFF9u;
+constexpr std::uint32_t kFreeSector = 0xFFFFFFFFu;
+constexpr std::uint32_t kEndOfChain = 0xFFFFFFFEu;
+// The header lists the first 109 sectors of the allocation table; further table sectors are
+// listed in a chain of DIFAT sectors.
+constexpr unsigned kHeaderTableSectors = 109;
 
 } // namespace
 
@@ -32,15 +39,7 @@ CompoundFile::CompoundFile(const std::string& path) : m_path(path), m_in(path, s
     m_sectorCount = m_fileSize > m_sectorSize ? (m_fileSize - m_sectorSize) / m_sectorSize : 0;
     m_miniCutoff = Load32(&header[56]);
 
-    // The FAT from the sectors the header lists (the header holds room for 109 of them).
-    std::vector<unsigned char> sector;
-    const std::uint32_t fatSectors = Load32(&header[44]);
-    for (std::uint32_t i = 0; i < fatSectors && i < 109; ++i) {
-        if (!ReadSector(Load32(&header[76 + 4 * i]), sector))
-            Fail("its allocation table lies outside the file");
-        for (std::uint64_t k = 0; k + 4 <= m_sectorSize; k += 4)
-            m_fat.push_back(Load32(&sector[k]));
-    }
+    ReadAllocationTable(header);
 
     const std::uint32_t directoryStart = Load32(&header[48]);
     if (directoryStart >= m_sectorCount)
@@ -62,6 +61,46 @@ CompoundFile::CompoundFile(const std::string& path) : m_path(path), m_in(path, s
     if (m_entries.empty() || m_entries[0].type != 5)
         Fail("no root entry");
     m_miniFat = ReadTable(Load32(&header[60]), Load32(&header[64]));
+}
+
+// The allocation table is made of the sectors the header lists, then of those the DIFAT chain
+// lists, each DIFAT sector ending with the number of the next. The chain may neither loop nor
+// leave the file, and the table may not claim more sectors than the file has. (The header's count
+// of DIFAT sectors is not needed to follow the chain and is not relied on.)
+void CompoundFile::ReadAllocationTable(const std::vector<unsigned char>& header)
+{
+    const std::uint32_t tableSectors = Load32(&header[44]);
+    if (tableSectors > m_sectorCount)
+        Fail("its allocation table claims " + std::to_string(tableSectors) + " sectors of the file's " +
+             std::to_string(m_sectorCount));
+    std::vector<std::uint32_t> tableSectorNumbers;
+    tableSectorNumbers.reserve(tableSectors);
+    for (unsigned i = 0; i < kHeaderTableSectors && tableSectorNumbers.size() < tableSectors; ++i)
+        tableSectorNumbers.push_back(Load32(&header[76 + 4 * i]));
+
+    const std::uint64_t perDifatSector = m_sectorSize / 4 - 1;
+    std::set<std::uint32_t> difatSeen;
+    std::vector<unsigned char> sector;
+    for (std::uint32_t next = Load32(&header[68]); tableSectorNumbers.size() < tableSectors;) {
+        if (next == kEndOfChain || next == kFreeSector)
+            Fail("its DIFAT chain ends after " + std::to_string(tableSectorNumbers.size()) + " of " +
+                 std::to_string(tableSectors) + " allocation table sectors");
+        if (!difatSeen.insert(next).second)
+            Fail("its DIFAT chain comes back to sector " + std::to_string(next));
+        if (!ReadSector(next, sector))
+            Fail("its DIFAT chain leaves the file at sector " + std::to_string(next));
+        for (std::uint64_t k = 0; k < perDifatSector && tableSectorNumbers.size() < tableSectors; ++k)
+            tableSectorNumbers.push_back(Load32(&sector[4 * k]));
+        next = Load32(&sector[4 * perDifatSector]);
+    }
+
+    m_fat.reserve(static_cast<std::size_t>(tableSectors) * (m_sectorSize / 4));
+    for (std::uint32_t number : tableSectorNumbers) {
+        if (!ReadSector(number, sector))
+            Fail("its allocation table lies outside the file");
+        for (std::uint64_t k = 0; k + 4 <= m_sectorSize; k += 4)
+            m_fat.push_back(Load32(&sector[k]));
+    }
 }
 
 std::optional<CompoundFile::Entry> CompoundFile::Find(const std::string& name) const
@@ -126,7 +165,7 @@ std::vector<unsigned char> CompoundFile::ReadChain(std::uint32_t start, std::uin
                 Fail("a sector lies outside the file");
             out.insert(out.end(), sector.begin(), sector.end());
         }
-        next = next < table.size() ? table[next] : 0xFFFFFFFEu;
+        next = next < table.size() ? table[next] : kEndOfChain;
     }
     if (size != m_fileSize && out.size() < size && size <= m_fileSize)
         Fail("a stream is shorter than its directory entry says");

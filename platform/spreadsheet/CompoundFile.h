@@ -28,6 +28,7 @@ public:
     std::vector<unsigned char> Read(const Entry& entry);
 
 private:
+    void ReadAllocationTable(const std::vector<unsigned char>& header);
     bool ReadSector(std::uint32_t index, std::vector<unsigned char>& out);
     std::vector<unsigned char> ReadChain(std::uint32_t start, std::uint64_t size, const std::vector<std::uint32_t>& table,
                                          std::uint64_t unit, bool mini);
