@@ -16,6 +16,7 @@ struct RowCell {
     Variant value;  // Number (dates as serial numbers), Text, Boolean or Error
     std::string text; // what the sheet displays; empty for a non-text cell outside the text columns
     unsigned style = 0;
+    bool formulaWithoutResult = false; // an empty text that stands for a formula's missing result
 };
 
 class WorkbookReader {

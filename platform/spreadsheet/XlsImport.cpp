@@ -271,6 +271,7 @@ void XlsReader::ReadCellRecord(const BiffRecord& record, int sheet)
         if (m_formulaAwaitingText) {
             ImportedCell cell = *std::exchange(m_formulaAwaitingText, std::nullopt);
             Guarded(record, [&] { cell.text = m_stream.Continued(record).Text(m_textForm, 2); });
+            cell.formulaWithoutResult = cell.text.empty();
             Emit(sheet, cell);
         }
         return;
@@ -360,7 +361,8 @@ void XlsReader::ReadCellRecord(const BiffRecord& record, int sheet)
 }
 
 // A formula cell shows its last result: a number, or when the top two bytes are FF FF a typed
-// result; a text result comes in the STRING record that follows.
+// result; a text result comes in the STRING record that follows. An empty result (a tool that
+// does not calculate writes every formula so) or one of no known type reads as the empty text.
 void XlsReader::ReadFormula(BiffCursor& body, ImportedCell& cell, int sheet)
 {
     unsigned char result[8];
@@ -381,10 +383,9 @@ void XlsReader::ReadFormula(BiffCursor& body, ImportedCell& cell, int sheet)
     } else if (result[0] == 2) {
         cell.type = Variant::Error;
         cell.text = BiffErrorText(result[2]);
-    } else if (result[0] == 3) {
-        cell.type = Variant::Text;
     } else {
-        return;
+        cell.type = Variant::Text;
+        cell.formulaWithoutResult = true;
     }
     Emit(sheet, cell);
 }
