@@ -1,5 +1,9 @@
 #include "converter/XlsxParts.h"
 
+#include "converter/OutputText.h"
+#include "converter/SheetLayout.h"
+#include "platform/system/Text.h"
+
 #include <ctime>
 
 namespace converter::xlsx {
@@ -9,29 +13,6 @@ namespace {
 constexpr const char* kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-8\" standalone=\"yes\"?>\n";
 constexpr const char* kMainNamespace = "http://schemas.openxmlformats.org/spreadsheetml/2006/main";
 constexpr const char* kRelationshipNamespace = "http://schemas.openxmlformats.org/officeDocument/2006/relationships";
-
-// Length of the valid UTF-8 sequence at `p` (at most `left` bytes), or 0.
-size_t Utf8Length(const unsigned char* p, size_t left)
-{
-    auto continuation = [&](size_t i, unsigned char low = 0x80, unsigned char high = 0xBF) {
-        return i < left && p[i] >= low && p[i] <= high;
-    };
-    const unsigned char c = p[0];
-    if (c >= 0xC2 && c <= 0xDF)
-        return continuation(1) ? 2 : 0;
-    if (c >= 0xE0 && c <= 0xEF) {
-        // No overlong forms (E0 needs A0 and up) and no surrogates (ED stops at 9F).
-        const unsigned char low = c == 0xE0 ? 0xA0 : 0x80;
-        const unsigned char high = c == 0xED ? 0x9F : 0xBF;
-        return continuation(1, low, high) && continuation(2) ? 3 : 0;
-    }
-    if (c >= 0xF0 && c <= 0xF4) {
-        const unsigned char low = c == 0xF0 ? 0x90 : 0x80;
-        const unsigned char high = c == 0xF4 ? 0x8F : 0xBF;
-        return continuation(1, low, high) && continuation(2) && continuation(3) ? 4 : 0;
-    }
-    return 0;
-}
 
 void AppendAscii(std::string& out, char c)
 {
@@ -69,26 +50,14 @@ std::string XmlText(std::string_view text)
 {
     std::string out;
     out.reserve(text.size());
-    const auto* bytes = reinterpret_cast<const unsigned char*>(text.data());
     for (size_t i = 0; i < text.size();) {
-        if (bytes[i] < 0x80) {
-            AppendAscii(out, text[i++]);
-            continue;
-        }
-        const size_t length = Utf8Length(bytes + i, text.size() - i);
-        if (length == 0) {
-            // Text from a file in a Latin-1 code page: keep the character it meant there.
-            out += static_cast<char>(0xC0 | (bytes[i] >> 6));
-            out += static_cast<char>(0x80 | (bytes[i] & 0x3F));
-            ++i;
-            continue;
-        }
-        const bool nonCharacter = length == 3 && bytes[i] == 0xEF && bytes[i + 1] == 0xBF && bytes[i + 2] >= 0xBE;
-        if (nonCharacter)
-            out += ' '; // U+FFFE and U+FFFF are not XML characters
+        const char32_t c = NextTextCharacter(text, i);
+        if (c < 0x80)
+            AppendAscii(out, static_cast<char>(c));
+        else if (c == 0xFFFE || c == 0xFFFF)
+            out += ' '; // not XML characters
         else
-            out.append(text.substr(i, length));
-        i += length;
+            text::AppendUtf8(out, c);
     }
     return out;
 }
@@ -155,7 +124,7 @@ std::string Workbook()
     return std::string(kDeclaration) + "<workbook xmlns=\"" + kMainNamespace + "\" xmlns:r=\"" +
            kRelationshipNamespace + "\">"
            "<bookViews><workbookView/></bookViews>"
-           "<sheets><sheet name=\"Sheet1\" sheetId=\"1\" r:id=\"rId1\"/></sheets>"
+           "<sheets><sheet name=\"" + std::string(sheet_layout::kSheetName) + "\" sheetId=\"1\" r:id=\"rId1\"/></sheets>"
            "</workbook>";
 }
 
@@ -173,7 +142,7 @@ std::string WorkbookRelationships()
 std::string Styles()
 {
     return std::string(kDeclaration) + "<styleSheet xmlns=\"" + kMainNamespace + "\">"
-           "<numFmts count=\"1\"><numFmt numFmtId=\"164\" formatCode=\"yyyy/mm/dd hh:mm:ss\"/></numFmts>"
+           "<numFmts count=\"1\"><numFmt numFmtId=\"164\" formatCode=\"" + std::string(sheet_layout::kStampFormat) + "\"/></numFmts>"
            "<fonts count=\"1\"><font><sz val=\"11\"/><name val=\"Calibri\"/><family val=\"2\"/></font></fonts>"
            "<fills count=\"2\"><fill><patternFill patternType=\"none\"/></fill>"
            "<fill><patternFill patternType=\"gray125\"/></fill></fills>"
