@@ -1,0 +1,305 @@
+// Workbooks other tools write, read by the preview parser and by the engine: both must find the same
+// data rows, end the data at the same row, and read sheets of any size. The sheets come from
+// openpyxl (the system's Python) and libxlsxwriter.
+#include "XlsxFile.h"
+#include "tests/tools/PythonTools.h"
+
+#include "converter/Converter.h"
+#include "parsers/ExcelFilePreviewParser.h"
+#include "platform/spreadsheet/SpreadsheetApplication.h"
+#include "platform/system/FileSystem.h"
+#include "templates/ExcelSpecification.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+
+namespace {
+
+std::string TempFolder()
+{
+    std::string folder;
+    sys::GetTempPath(4096, folder);
+    return folder + "velmora_excel_writers_" + std::to_string(::getpid()) + "/";
+}
+
+// Each sheet has the engine's layout: types, units and value types in row 1, names in row 2, data
+// from row 3: one date-time and two values a row, then what the case puts below them.
+const char* kEndOfDataSheets = R"(
+import sys, datetime, openpyxl
+folder = sys.argv[1]
+def sheet(name, rows):
+    book = openpyxl.Workbook()
+    s = book.active
+    s.append(["", "Rain[mm]:Accumulated", "Level[m]:Instantaneous"])
+    s.append(["Date", "Rain", "Level"])
+    for row in rows:
+        s.append(row)
+    book.save(folder + name + ".xlsx")
+def data(n):
+    return [[datetime.datetime(2021, 5, 17, h), h * 0.5, 10 + h] for h in range(n)]
+sheet("to-the-end", data(5))
+sheet("empty-row-then-note", data(3) + [[], ["Source: gauge 7"]])
+sheet("blank-date-with-values", data(3) + [[None, 1, 2], [datetime.datetime(2021, 5, 18), 3, 4]])
+sheet("note-below-data", data(3) + [["Total", 12, 34]])
+sheet("date-formula-without-result", data(2) + [["=A4+1/24", "=B4*2", 7]])
+sheet("first-row-is-no-date", [["n/a", 1, 2]] + data(2))
+)";
+
+struct EngineRead {
+    bool converted = false;
+    std::uint64_t rows = 0;
+    std::vector<std::string> notes;
+    std::string problem;
+};
+
+EngineRead Convert(const std::string& input, const std::string& output)
+{
+    converter::Status status;
+    std::unique_ptr<CSpecification> spec = converter::LoadTemplate(converter::Format::Excel, "", status);
+    converter::FileJob job{converter::Format::Excel, input, spec.get(), {}, converter::Format::Ascii, output, ""};
+    const converter::FileReport report = converter::ConvertFile(job);
+    return {report.converted, report.rows, report.notes, report.problem.Describe()};
+}
+
+class OtherWritersTest : public ::testing::Test {
+protected:
+    void SetUp() override { std::filesystem::create_directories(m_folder); }
+    void TearDown() override { std::filesystem::remove_all(m_folder); }
+
+    // The data rows the preview parser shows for `path` with a new template's defaults.
+    int PreviewRows(const std::string& path)
+    {
+        CExcelSpecification spec;
+        CExcelFilePreviewParser parser([] { return sheet::StartApplication(sheet::ApplicationSettings()); });
+        parser.m_pSpecification = &spec;
+        parser.SetFile(path);
+        if (!parser.Parse(""))
+            return -1;
+        return static_cast<int>(parser.m_vecRows.size()) - 3; // after the three header rows
+    }
+
+    const std::string m_folder = TempFolder();
+    ui::ScriptedUserInterface m_ui;
+    ui::ScopedUserInterface m_scope {m_ui};
+};
+
+} // namespace
+
+TEST_F(OtherWritersTest, PreviewAndEngineEndTheDataAtTheSameRow)
+{
+    if (!pytools::Has("openpyxl"))
+        GTEST_SKIP() << "/usr/bin/python3 with openpyxl is not available";
+    const pytools::Result made = pytools::Run(kEndOfDataSheets, pytools::Quote(m_folder));
+    ASSERT_EQ(made.status, 0) << made.output;
+
+    struct Case {
+        const char* name;
+        int rows;
+        const char* note; // the note on where the data end, "" for none
+    } cases[] = {
+        {"to-the-end", 5, ""},
+        {"empty-row-then-note", 3, "the data end at row 6, which is empty"},
+        {"blank-date-with-values", 3, "the data end at row 6, whose date/time cell is empty"},
+        {"note-below-data", 3, "the data end at row 6, whose date/time 'Total' cannot be read"},
+        {"date-formula-without-result", 2, "the data end at row 5, whose date/time cell is empty"},
+    };
+    for (const Case& c : cases) {
+        const std::string input = m_folder + c.name + ".xlsx";
+        EXPECT_EQ(PreviewRows(input), c.rows) << c.name;
+        const EngineRead engine = Convert(input, m_folder + c.name + ".txt");
+        ASSERT_TRUE(engine.converted) << c.name << ": " << engine.problem;
+        EXPECT_EQ(engine.rows, static_cast<std::uint64_t>(c.rows)) << c.name;
+        std::string notes;
+        for (const std::string& note : engine.notes)
+            notes += note + "\n";
+        if (*c.note == '\0')
+            EXPECT_EQ(notes, "") << c.name;
+        else
+            EXPECT_NE(notes.find(c.note), std::string::npos) << c.name << ": " << notes;
+    }
+
+    // A data start row that holds no date/time shows no data rows; the engine refuses the file.
+    const std::string misfit = m_folder + "first-row-is-no-date.xlsx";
+    EXPECT_EQ(PreviewRows(misfit), 0);
+    const EngineRead refused = Convert(misfit, m_folder + "misfit.txt");
+    EXPECT_FALSE(refused.converted);
+    EXPECT_NE(refused.problem.find(misfit + ":3: "), std::string::npos) << refused.problem;
+    EXPECT_NE(refused.problem.find("'n/a'"), std::string::npos) << refused.problem;
+}
+
+TEST_F(OtherWritersTest, FormulasWithoutResultAreEmptyValuesNamedOnceInTheLog)
+{
+    if (!pytools::Has("openpyxl"))
+        GTEST_SKIP() << "/usr/bin/python3 with openpyxl is not available";
+    const pytools::Result made = pytools::Run(R"(
+import sys, datetime, openpyxl
+book = openpyxl.Workbook()
+s = book.active
+s.append(["", "A[m]:Instantaneous", "B[m]:Instantaneous", "Sum[m]:Instantaneous"])
+s.append(["Date", "A", "B", "Sum"])
+for i in range(14):
+    s.append([datetime.datetime(2021, 1, 1, i), i, 2, "=B%d+C%d" % (i + 3, i + 3)])
+book.save(sys.argv[1])
+)",
+                                              pytools::Quote(m_folder + "sums.xlsx"));
+    ASSERT_EQ(made.status, 0) << made.output;
+
+    CExcelSpecification spec;
+    CExcelFilePreviewParser parser([] { return sheet::StartApplication(sheet::ApplicationSettings()); });
+    parser.m_pSpecification = &spec;
+    parser.SetFile(m_folder + "sums.xlsx");
+    ASSERT_EQ(parser.Parse(""), 1) << "the preview reads the workbook";
+    ASSERT_EQ(parser.m_vecRows.size(), 3u + 14u);
+    EXPECT_EQ(parser.m_vecRows[3], (ui::Row{"2021/01/01 00:00:00", "0", "2", ""}));
+
+    const EngineRead engine = Convert(m_folder + "sums.xlsx", m_folder + "sums.txt");
+    ASSERT_TRUE(engine.converted) << engine.problem;
+    EXPECT_EQ(engine.rows, 14u);
+    ASSERT_EQ(engine.notes.size(), 1u);
+    EXPECT_EQ(engine.notes[0], "14 formula cells without a result (or with an empty one) read as empty: "
+                               "D3, D4, D5, D6, D7, D8, D9, D10, D11, D12 and 4 more");
+    std::ifstream text(m_folder + "sums.txt");
+    std::stringstream content;
+    content << text.rdbuf();
+    EXPECT_NE(content.str().find("2021/01/01 13:00:00\t13\t2\t\n"), std::string::npos) << content.str();
+}
+
+// 100,000 rows of 11 cells, more than the object model hands out as one array: the preview reads
+// the used range's size and the first rows only.
+TEST_F(OtherWritersTest, PreviewOfASheetOfMoreThanAMillionCells)
+{
+    XlsxFile book("million_cells");
+    book.Text(1, 2, "Undefined[Undefined]:Instantaneous");
+    for (int column = 2; column <= 11; ++column) {
+        book.Text(1, column, "Undefined[Undefined]:Instantaneous");
+        book.Text(2, column, ("V" + std::to_string(column)).c_str());
+    }
+    book.Text(2, 1, "Date");
+    for (int row = 3; row < 100003; ++row) {
+        book.Number(row, 1, 44333 + row / 1440.0);
+        for (int column = 2; column <= 11; ++column)
+            book.Number(row, column, row + column);
+    }
+    book.Close();
+    EXPECT_EQ(PreviewRows(book.path), 18);
+    CExcelSpecification spec;
+    CExcelFilePreviewParser parser([] { return sheet::StartApplication(sheet::ApplicationSettings()); });
+    parser.m_pSpecification = &spec;
+    parser.SetFile(book.path);
+    int count = 0;
+    CString message;
+    ASSERT_EQ(parser.OpenWorkbook(book.path, message), 1);
+    ASSERT_EQ(parser.GetItemCount(count), 1);
+    EXPECT_EQ(count, 10);
+    parser.CloseWorkbook();
+}
+
+// January and February 1900 as the sheet's own calendar numbers them (it has a 29 February), in
+// workbooks of the 1900 and of the 1904 date system, written by openpyxl and by xlwt.
+TEST_F(OtherWritersTest, StampsOfEitherDateSystemReadAsTheToolWroteThem)
+{
+    if (!pytools::Has("openpyxl xlwt"))
+        GTEST_SKIP() << "/usr/bin/python3 with openpyxl and xlwt is not available";
+    const pytools::Result made = pytools::Run(R"(
+import sys, datetime, openpyxl, xlwt
+from openpyxl.utils.datetime import CALENDAR_MAC_1904
+folder = sys.argv[1]
+stamps = [datetime.datetime(1900, 1, 1, 12), datetime.datetime(1900, 2, 28), datetime.datetime(1900, 3, 1, 6),
+          datetime.datetime(1904, 1, 1, 12), datetime.datetime(2021, 5, 17, 23, 59, 59)]
+for system in (1900, 1904):
+    shown = [s for s in stamps if s.year >= system]
+    book = openpyxl.Workbook()
+    if system == 1904:
+        book.epoch = CALENDAR_MAC_1904
+    sheet = book.active
+    sheet.append(["", "V[m]:Instantaneous"])
+    sheet.append(["Date", "V"])
+    for i, s in enumerate(shown):
+        sheet.append([s, i])
+    book.save("%sopenpyxl-%d.xlsx" % (folder, system))
+    book = xlwt.Workbook()
+    book.dates_1904 = system == 1904
+    sheet = book.add_sheet("S")
+    sheet.write(0, 1, "V[m]:Instantaneous")
+    sheet.write(1, 0, "Date")
+    sheet.write(1, 1, "V")
+    date = xlwt.easyxf(num_format_str="yyyy-mm-dd hh:mm:ss")
+    for i, s in enumerate(shown):
+        sheet.write(i + 2, 0, s, date)
+        sheet.write(i + 2, 1, i)
+    book.save("%sxlwt-%d.xls" % (folder, system))
+)",
+                                              pytools::Quote(m_folder));
+    ASSERT_EQ(made.status, 0) << made.output;
+    const std::string all = "V[m]:Instantaneous\nDate\tV\n"
+                            "1900/01/01 12:00:00\t0\n1900/02/28 00:00:00\t1\n1900/03/01 06:00:00\t2\n"
+                            "1904/01/01 12:00:00\t3\n2021/05/17 23:59:59\t4\n";
+    const std::string from1904 = "V[m]:Instantaneous\nDate\tV\n1904/01/01 12:00:00\t0\n2021/05/17 23:59:59\t1\n";
+    for (const char* name : {"openpyxl-1900.xlsx", "xlwt-1900.xls", "openpyxl-1904.xlsx", "xlwt-1904.xls"}) {
+        const EngineRead engine = Convert(m_folder + name, m_folder + "out.txt");
+        ASSERT_TRUE(engine.converted) << name << ": " << engine.problem;
+        std::ifstream text(m_folder + "out.txt");
+        std::stringstream content;
+        content << text.rdbuf();
+        EXPECT_EQ(content.str(), std::string(name).find("1900") != std::string::npos ? all : from1904) << name;
+    }
+}
+
+// The year of a stamp always has four digits in the preview, for the years 100 to 999 too.
+TEST_F(OtherWritersTest, PreviewStampsHaveFourDigitYears)
+{
+    XlsxFile book("early_years");
+    book.Text(1, 2, "V[m]:Instantaneous");
+    book.Text(2, 1, "Date");
+    book.Text(2, 2, "V");
+    book.Number(3, 1, -657434); // 1 January 100, in automation days
+    book.Number(3, 2, 1);
+    book.Text(4, 1, "0999/12/31 23:00:00");
+    book.Number(4, 2, 2);
+    book.Close();
+    CExcelSpecification spec;
+    CExcelFilePreviewParser parser([] { return sheet::StartApplication(sheet::ApplicationSettings()); });
+    parser.m_pSpecification = &spec;
+    parser.SetFile(book.path);
+    ASSERT_EQ(parser.Parse(""), 1);
+    ASSERT_EQ(parser.m_vecRows.size(), 5u);
+    EXPECT_EQ(parser.m_vecRows[3].front(), "0100/01/01 00:00:00");
+    EXPECT_EQ(parser.m_vecRows[4].front(), "0999/12/31 23:00:00");
+}
+
+// 16,000 item columns: the engine and the preview read every name; the time this takes is measured
+// in bench/excel_parser_bench.cpp (docs/performance.md).
+TEST_F(OtherWritersTest, SixteenThousandColumnsAreReadWhole)
+{
+    XlsxFile book("wide_16000");
+    book.Text(2, 1, "Date");
+    for (int column = 2; column <= 16001; ++column) {
+        book.Text(1, column, "Undefined[Undefined]:Instantaneous");
+        book.Text(2, column, ("N" + std::to_string(column - 1)).c_str());
+        book.Number(3, column, column);
+    }
+    book.Number(3, 1, 44333);
+    book.Close();
+
+    converter::Status status;
+    std::unique_ptr<CSpecification> spec = converter::LoadTemplate(converter::Format::Excel, "", status);
+    std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(converter::Format::Excel, spec.get());
+    ASSERT_TRUE(reader->Open(book.path)) << reader->status().problem().Describe();
+    ASSERT_EQ(reader->Header().items.size(), 16000u);
+    EXPECT_EQ(reader->Header().items[0].name, "N1");
+    EXPECT_EQ(reader->Header().items[15999].name, "N16000");
+    converter::Row row;
+    ASSERT_TRUE(reader->Next(row));
+    EXPECT_EQ(row.values[15999], 16001);
+
+    CExcelSpecification preview;
+    CExcelFilePreviewParser parser([] { return sheet::StartApplication(sheet::ApplicationSettings()); });
+    parser.m_pSpecification = &preview;
+    parser.SetFile(book.path);
+    ASSERT_EQ(parser.Parse(""), 1);
+    ASSERT_EQ(parser.m_vecItemNames.size(), 16001u);
+    EXPECT_EQ(parser.m_vecItemNames.back(), "N16000");
+}
