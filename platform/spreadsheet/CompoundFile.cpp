@@ -3,6 +3,7 @@
 #include "platform/spreadsheet/LittleEndian.h"
 #include "platform/spreadsheet/WorkbookImport.h"
 
+#include <algorithm>
 #include <set>
 
 namespace sheet {
@@ -122,6 +123,59 @@ std::vector<unsigned char> CompoundFile::Read(const Entry& entry)
         m_miniStreamRead = true;
     }
     return ReadChain(entry.start, entry.size, m_miniFat, 64, true);
+}
+
+CompoundFile::Stream CompoundFile::Open(const Entry& entry)
+{
+    if (entry.size > m_fileSize)
+        Fail("the stream " + entry.name + " is larger than the file");
+    Stream stream;
+    stream.m_file = this;
+    stream.m_size = entry.size;
+    if (entry.size < m_miniCutoff) {
+        stream.m_bytes = Read(entry);
+        return stream;
+    }
+    std::uint64_t offset = 0;
+    std::uint32_t next = entry.start;
+    for (std::uint64_t steps = 0; offset < entry.size; ++steps) {
+        if (next > kLastRegularSector)
+            Fail("a stream is shorter than its directory entry says");
+        if (steps > m_sectorCount || next >= m_sectorCount)
+            Fail("a sector chain is broken");
+        const std::uint64_t position = (next + 1ull) * m_sectorSize;
+        std::vector<Stream::Run>& runs = stream.m_runs;
+        if (runs.empty() || runs.back().filePosition + runs.back().length != position)
+            runs.push_back({offset, position, 0});
+        const std::uint64_t length = std::min(m_sectorSize, entry.size - offset);
+        runs.back().length += length;
+        offset += length;
+        next = next < m_fat.size() ? m_fat[next] : kEndOfChain;
+    }
+    return stream;
+}
+
+void CompoundFile::Stream::ReadAt(std::uint64_t offset, unsigned char* out, std::size_t size)
+{
+    if (offset > m_size || size > m_size - offset)
+        m_file->Fail("a read runs past the end of a stream");
+    if (m_runs.empty()) {
+        std::copy_n(m_bytes.begin() + static_cast<std::ptrdiff_t>(offset), size, out);
+        return;
+    }
+    auto run = std::upper_bound(m_runs.begin(), m_runs.end(), offset,
+                                [](std::uint64_t at, const Run& r) { return at < r.offset; }) - 1;
+    while (size > 0) {
+        const std::uint64_t within = offset - run->offset;
+        const std::size_t piece = static_cast<std::size_t>(std::min<std::uint64_t>(size, run->length - within));
+        std::ifstream& in = m_file->m_in;
+        in.clear();
+        in.seekg(static_cast<std::streamoff>(run->filePosition + within));
+        if (!in.read(reinterpret_cast<char*>(out), static_cast<std::streamsize>(piece)))
+            m_file->Fail("a sector cannot be read");
+        out += piece, offset += piece, size -= piece;
+        ++run;
+    }
 }
 
 bool CompoundFile::ReadSector(std::uint32_t index, std::vector<unsigned char>& out)

@@ -390,9 +390,8 @@ void XlsReader::ReadFormula(BiffCursor& body, ImportedCell& cell, int sheet)
     Emit(sheet, cell);
 }
 
-std::vector<unsigned char> WorkbookStream(const std::string& path)
+CompoundFile::Stream WorkbookStream(CompoundFile& file, const std::string& path)
 {
-    CompoundFile file(path);
     if (file.Find("EncryptedPackage"))
         throw OpenError(path, "the workbook is password-protected.");
     std::optional<CompoundFile::Entry> workbook = file.Find("Workbook");
@@ -400,7 +399,7 @@ std::vector<unsigned char> WorkbookStream(const std::string& path)
         workbook = file.Find("Book");
     if (!workbook)
         throw OpenError(path, "the compound file holds no workbook stream.");
-    return file.Read(*workbook);
+    return file.Open(*workbook);
 }
 
 } // namespace
@@ -411,7 +410,11 @@ void ImportXls(const std::string& path, ImportSink& sink, StyleTable& styles, co
     if (probe && static_cast<std::uint64_t>(probe.tellg()) > limits.maxFileBytes)
         throw OpenError(path, "the file is larger than " + std::to_string(limits.maxFileBytes >> 20) + " MiB.");
     probe.close();
-    BiffStream stream(path, WorkbookStream(path));
+    CompoundFile file(path);
+    CompoundFile::Stream workbook = WorkbookStream(file, path);
+    BiffStream stream(path, workbook.Size(), [&workbook](std::uint64_t offset, unsigned char* out, std::size_t size) {
+        workbook.ReadAt(offset, out, size);
+    });
     XlsReader reader(path, stream, sink, styles, limits);
     reader.ReadGlobals();
     reader.ReadSheets();
