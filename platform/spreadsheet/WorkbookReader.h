@@ -1,7 +1,7 @@
 #pragma once
 // Reads whole sheets of a workbook row by row, for conversions: each row's cells come with their
 // raw value and the text the sheet displays. Memory stays bounded by one row plus what the
-// reader holds for the whole workbook (.xlsx: the shared strings; .xls: the workbook stream).
+// reader holds for the whole workbook (.xlsx: the shared strings; .xls: the shared texts).
 #include "platform/spreadsheet/Spreadsheet.h"
 #include "platform/spreadsheet/WorkbookImport.h"
 
