@@ -5,6 +5,8 @@
 #include "parsers/ExcelFilePreviewParser.h"
 #include "templates/ExcelSpecification.h"
 
+#include "PeakMemory.h"
+
 #include <benchmark/benchmark.h>
 #include <xlsxwriter.h>
 
@@ -71,18 +73,8 @@ void BM_ExcelOpen(benchmark::State& state)
     std::remove(path.c_str());
 }
 
-long StatusKilobytes(const char* key)
-{
-    std::ifstream status("/proc/self/status");
-    std::string line;
-    while (std::getline(status, line))
-        if (line.rfind(key, 0) == 0)
-            return std::stol(line.substr(std::string(key).size()));
-    return 0;
-}
-
-// Makes the kernel's peak resident size start again from the current one.
-void ResetPeak() { std::ofstream("/proc/self/clear_refs") << "5"; }
+using benchmemory::ResetPeak;
+using benchmemory::StatusKilobytes;
 
 // A sheet in the engine's layout: types in row 1, names in row 2, then `rows` rows of a date and
 // `items` values, written row by row (libxlsxwriter's constant memory mode).

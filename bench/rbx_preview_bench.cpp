@@ -5,6 +5,8 @@
 #include "platform/rbx/RbxWriter.h"
 #include "platform/units/Units.h"
 
+#include "PeakMemory.h"
+
 #include <benchmark/benchmark.h>
 
 #include <cstdio>
@@ -59,18 +61,8 @@ double TableBytes(const ui::Rows& rows)
     return bytes;
 }
 
-long StatusKilobytes(const char* key)
-{
-    std::ifstream status("/proc/self/status");
-    std::string line;
-    while (std::getline(status, line))
-        if (line.rfind(key, 0) == 0)
-            return std::stol(line.substr(std::string(key).size()));
-    return 0;
-}
-
-// Makes the kernel's peak resident size start again from the current one.
-void ResetPeak() { std::ofstream("/proc/self/clear_refs") << "5"; }
+using benchmemory::ResetPeak;
+using benchmemory::StatusKilobytes;
 
 void BM_RbxPreviewParse(benchmark::State& state)
 {

@@ -39,12 +39,7 @@ Status WriteXls(const std::string& path, const SeriesHeader& header, const std::
                 const std::string& title = "")
 {
     XlsSeriesWriter writer;
-    if (Status begun = writer.Begin(path, header, title); !begun)
-        return begun;
-    for (const Row& row : rows)
-        if (Status written = writer.Write(row); !written)
-            return written;
-    return writer.Finish();
+    return convtest::WriteSeries(writer, path, header, rows, title);
 }
 
 // Every cell as xlrd sees it, one line each: "A1 <type> <value>" with numbers in hexadecimal

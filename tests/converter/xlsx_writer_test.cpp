@@ -40,12 +40,7 @@ Status WriteWorkbook(const std::string& path, const SeriesHeader& header, const 
                      const std::string& title = "")
 {
     XlsxSeriesWriter writer;
-    if (Status begun = writer.Begin(path, header, title); !begun)
-        return begun;
-    for (const Row& row : rows)
-        if (Status written = writer.Write(row); !written)
-            return written;
-    return writer.Finish();
+    return convtest::WriteSeries(writer, path, header, rows, title);
 }
 
 ReadBack ReadWorkbook(const std::string& path)
