@@ -417,11 +417,16 @@ ExcelSeriesReader::StampRead ExcelSeriesReader::ReadStamp(const SheetRow& sheetR
             return StampRead::Blank;
         std::optional<Stamp> value;
         if (cell->value.type == sheet::Variant::Number) {
-            value = StampFromSheetSerial(cell->value.number);
-            if (!value) {
-                Fail(m_path, sheetRow.number, "the date/time cell holds the day number " + cell->text +
-                                                  ", which is no day of the calendar");
+            const double serial = cell->value.number;
+            if (serial >= 60 && serial < 61) {
+                Fail(m_path, sheetRow.number, "the date/time cell holds 29 February 1900 (day 60 of the sheet's "
+                                              "calendar), which the calendar does not have");
                 return StampRead::Failed;
+            }
+            value = StampFromSheetSerial(serial);
+            if (!value) {
+                unreadable = text::Format("%.15g", serial); // no date of the years 100 to 9999
+                return StampRead::Unreadable;
             }
         } else {
             StampFields parsed = option == 0 ? StampFields() : m_start;

@@ -46,6 +46,8 @@ sheet("blank-date-with-values", data(3) + [[None, 1, 2], [datetime.datetime(2021
 sheet("note-below-data", data(3) + [["Total", 12, 34]])
 sheet("date-formula-without-result", data(2) + [["=A4+1/24", "=B4*2", 7]])
 sheet("first-row-is-no-date", [["n/a", 1, 2]] + data(2))
+sheet("number-beyond-the-calendar", data(3) + [[1e10, 1, 2]])
+sheet("twenty-ninth-of-february-1900", data(2) + [[60, 1, 2]])
 )";
 
 struct EngineRead {
@@ -105,6 +107,7 @@ TEST_F(OtherWritersTest, PreviewAndEngineEndTheDataAtTheSameRow)
         {"blank-date-with-values", 3, "the data end at row 6, whose date/time cell is empty"},
         {"note-below-data", 3, "the data end at row 6, whose date/time 'Total' cannot be read"},
         {"date-formula-without-result", 2, "the data end at row 5, whose date/time cell is empty"},
+        {"number-beyond-the-calendar", 3, "the data end at row 6, whose date/time '10000000000' cannot be read"},
     };
     for (const Case& c : cases) {
         const std::string input = m_folder + c.name + ".xlsx";
@@ -128,6 +131,13 @@ TEST_F(OtherWritersTest, PreviewAndEngineEndTheDataAtTheSameRow)
     EXPECT_FALSE(refused.converted);
     EXPECT_NE(refused.problem.find(misfit + ":3: "), std::string::npos) << refused.problem;
     EXPECT_NE(refused.problem.find("'n/a'"), std::string::npos) << refused.problem;
+
+    // Day 60 of the sheet's calendar is 29 February 1900, which no calendar has: the file fails.
+    const std::string leap = m_folder + "twenty-ninth-of-february-1900.xlsx";
+    const EngineRead failed = Convert(leap, m_folder + "leap.txt");
+    EXPECT_FALSE(failed.converted);
+    EXPECT_NE(failed.problem.find(leap + ":5: the date/time cell holds 29 February 1900"), std::string::npos)
+        << failed.problem;
 }
 
 TEST_F(OtherWritersTest, FormulasWithoutResultAreEmptyValuesNamedOnceInTheLog)
