@@ -26,8 +26,9 @@ const StoredCell* SheetModel::Find(int row, int column) const
 
 std::optional<long long> SheetModel::CountValues(const CellRect& block) const
 {
-    if (block.IsEmpty() || m_used.IsEmpty())
-        return 0;
+    if (block.IsEmpty() || m_used.IsEmpty() || block.lastRow < m_used.firstRow || block.firstRow > m_used.lastRow ||
+        block.lastColumn < m_used.firstColumn || block.firstColumn > m_used.lastColumn)
+        return 0; // no cell of the sheet lies there
     long long count = 0;
     if (block.firstRow <= m_used.firstRow && block.lastRow >= m_used.lastRow) {
         const int last = std::min<int>(block.lastColumn, static_cast<int>(m_valuesInColumn.size()) - 1);

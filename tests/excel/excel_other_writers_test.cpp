@@ -4,6 +4,7 @@
 #include "XlsxFile.h"
 #include "tests/tools/PythonTools.h"
 
+#include "converter/ConversionJob.h"
 #include "converter/Converter.h"
 #include "parsers/ExcelFilePreviewParser.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
@@ -312,4 +313,83 @@ TEST_F(OtherWritersTest, SixteenThousandColumnsAreReadWhole)
     ASSERT_EQ(parser.Parse(""), 1);
     ASSERT_EQ(parser.m_vecItemNames.size(), 16001u);
     EXPECT_EQ(parser.m_vecItemNames.back(), "N16000");
+}
+
+// A folder of workbooks as other tools write them, awkward ones among them: the engine converts
+// every file it can and refuses the others, each by name and reason.
+TEST_F(OtherWritersTest, AFolderOfOtherToolsWorkbooksConvertsWhatItCan)
+{
+    if (!pytools::Has("openpyxl xlwt"))
+        GTEST_SKIP() << "/usr/bin/python3 with openpyxl and xlwt is not available";
+    const std::string in = m_folder + "in/", out = m_folder + "out/";
+    std::filesystem::create_directories(in);
+    std::filesystem::create_directories(out);
+    const pytools::Result made = pytools::Run(R"(
+import sys, datetime, openpyxl, xlwt
+from openpyxl.utils.datetime import CALENDAR_MAC_1904
+folder = sys.argv[1]
+def layout(sheet_append):
+    sheet_append(["", "A[m]:Instantaneous", "B[m]:Instantaneous"])
+    sheet_append(["Date", "A", "B"])
+def openpyxl_book(name, rows, epoch=None):
+    book = openpyxl.Workbook()
+    if epoch:
+        book.epoch = epoch
+    layout(book.active.append)
+    for row in rows:
+        book.active.append(row)
+    book.save(folder + name)
+day = datetime.datetime(2021, 5, 17)
+openpyxl_book("formulas.xlsx", [[day, 1, "=B3*2"], [day + datetime.timedelta(hours=1), 2, "=B4*2"]])
+openpyxl_book("note-below.xlsx", [[day, 1, 2], [], ["Source: gauge 7"]])
+openpyxl_book("dates-1904.xlsx", [[day, 1, 2]], CALENDAR_MAC_1904)
+openpyxl_book("misfit.xlsx", [["n/a", 1, 2], [day, 1, 2]])
+book = xlwt.Workbook()
+sheet = book.add_sheet("Data")
+sheet.write(1, 0, "Date")
+for c in range(1, 12):
+    sheet.write(0, c, "V[m]:Instantaneous")
+    sheet.write(1, c, "V%d" % c)
+date = xlwt.easyxf(num_format_str="yyyy/mm/dd hh:mm:ss")
+for r in range(2, 65536):
+    row = sheet.row(r)
+    row.set_cell_date(0, day + datetime.timedelta(minutes=r), date)
+    for c in range(1, 12):
+        row.set_cell_number(c, r + c * 0.5)
+    if r % 1000 == 0:
+        sheet.flush_row_data()
+book.save(folder + "large.xls")
+)",
+                                              pytools::Quote(in));
+    ASSERT_EQ(made.status, 0) << made.output;
+    // A copy of the large workbook whose DIFAT chain points out of the file.
+    std::ifstream large(in + "large.xls", std::ios::binary);
+    std::string bytes((std::istreambuf_iterator<char>(large)), std::istreambuf_iterator<char>());
+    ASSERT_GT(bytes.size(), 512u);
+    bytes[68] = bytes[69] = bytes[70] = '\x7F';
+    std::ofstream(in + "damaged.xls", std::ios::binary) << bytes;
+
+    converter::JobSetup setup;
+    setup.inputType = 2;
+    setup.inputFormat = 3;
+    setup.inputFolder = in;
+    setup.outputFormat = 2;
+    setup.outputFolder = out;
+    converter::ConversionLog log(m_folder + "run.log", nullptr);
+    EXPECT_EQ(converter::RunJob(setup, log, {2, nullptr}), converter::kExitSomeFailed);
+    std::ifstream logFile(m_folder + "run.log");
+    std::stringstream text;
+    text << logFile.rdbuf();
+    for (const char* name : {"formulas", "note-below", "dates-1904", "large"})
+        EXPECT_TRUE(std::filesystem::exists(out + name + ".txt")) << name << "\n" << text.str();
+    for (const char* name : {"misfit", "damaged"})
+        EXPECT_FALSE(std::filesystem::exists(out + name + ".txt")) << name;
+    EXPECT_NE(text.str().find(in + "misfit.xlsx:3: "), std::string::npos) << text.str();
+    EXPECT_NE(text.str().find(in + "damaged.xls: the compound file is damaged (its DIFAT chain leaves the file"),
+              std::string::npos)
+        << text.str();
+    EXPECT_NE(text.str().find("converted " + in + "large.xls -> " + out + "large.txt: 65534 time steps"), std::string::npos)
+        << text.str();
+    EXPECT_NE(text.str().find("note: 2 formula cells without a result"), std::string::npos) << text.str();
+    EXPECT_NE(text.str().find("4 converted, 2 skipped or failed"), std::string::npos) << text.str();
 }
