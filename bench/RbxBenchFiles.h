@@ -1,6 +1,7 @@
 #pragma once
 // What the rbx0 preview benchmarks share: a file of 10 float32 items with a given number of steps,
 // and the process's resident memory from the kernel.
+#include "bench/PeakMemory.h"
 #include "platform/rbx/RbxWriter.h"
 #include "platform/units/Units.h"
 
@@ -43,20 +44,9 @@ inline std::string MakeRbxFile(long steps)
     return path;
 }
 
-// A value of /proc/self/status in kB ("VmRSS:", "VmHWM:").
-inline long StatusKilobytes(const char* key)
-{
-    std::ifstream status("/proc/self/status");
-    std::string line;
-    while (std::getline(status, line))
-        if (line.rfind(key, 0) == 0)
-            return std::stol(line.substr(std::string(key).size()));
-    return 0;
-}
+using benchmemory::ResetPeak;
+using benchmemory::StatusKilobytes;
 
 inline double StatusBytes(const char* key) { return static_cast<double>(StatusKilobytes(key)) * 1024.0; }
-
-// Makes the kernel's peak resident size start again from the current one.
-inline void ResetPeak() { std::ofstream("/proc/self/clear_refs") << "5"; }
 
 } // namespace benchfiles

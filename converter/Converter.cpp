@@ -7,6 +7,7 @@
 #include "converter/RbxSeriesReader.h"
 #include "converter/RbxSeriesWriter.h"
 #include "converter/StampText.h"
+#include "converter/XlsSeriesWriter.h"
 #include "converter/XlsxSeriesWriter.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
@@ -126,12 +127,15 @@ std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* sp
     return nullptr;
 }
 
-std::unique_ptr<SeriesWriter> MakeWriter(Format format)
+std::unique_ptr<SeriesWriter> MakeWriter(Format format, const std::string& output)
 {
     switch (format) {
     case Format::Rbx0: return std::make_unique<RbxSeriesWriter>();
     case Format::Ascii: return std::make_unique<AsciiSeriesWriter>();
-    case Format::Excel: return std::make_unique<XlsxSeriesWriter>();
+    case Format::Excel:
+        if (ExtensionOf(output) == ".xls")
+            return std::make_unique<XlsSeriesWriter>();
+        return std::make_unique<XlsxSeriesWriter>();
     }
     return nullptr;
 }
@@ -211,7 +215,7 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     report.itemsWritten = header.items.size();
 
     OutputFile output(job.output);
-    std::unique_ptr<SeriesWriter> writer = MakeWriter(job.outputFormat);
+    std::unique_ptr<SeriesWriter> writer = MakeWriter(job.outputFormat, job.output);
     if (Status begun = writer->Begin(output.TemporaryPath(), header, job.title); !begun)
         return Refuse(report, Status::Fail(job.output, 0, begun.problem().message), true);
 
@@ -227,6 +231,7 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
         if (progress && report.rows % kProgressEvery == 0)
             progress(report.rows, reader->BytesConsumed());
     }
+    report.notes.insert(report.notes.end(), reader->Notes().begin(), reader->Notes().end());
     if (!reader->status())
         return Refuse(report, reader->status(), report.rows > 0 || !throughTemplate);
     if (report.rows > 0)

@@ -34,7 +34,9 @@ std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& p
 
 // A reader of `format`; its template (ASCII and Excel) must outlive it.
 std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* spec);
-std::unique_ptr<SeriesWriter> MakeWriter(Format format);
+// The writer of `format`; Excel output whose name ends in ".xls" gets an .xls workbook, any
+// other an .xlsx package.
+std::unique_ptr<SeriesWriter> MakeWriter(Format format, const std::string& output);
 
 // True when the engine would convert `file` with this template: its extension suits the format and
 // the reader accepts its header and its first data row. `reason` (may be null) says why not.

@@ -1,6 +1,7 @@
 #include "converter/ExcelSeriesReader.h"
 
 #include "parsers/HeaderCells.h"
+#include "platform/spreadsheet/CellAddress.h"
 #include "platform/spreadsheet/WorkbookReader.h"
 #include "platform/system/Text.h"
 #include "resources/StringTable.h"
@@ -18,6 +19,8 @@ namespace {
 // instead of once a row.
 constexpr size_t kBatchRows = 256;
 constexpr size_t kQueuedBatches = 4;
+// Formula cells without a result the log names; the rest it counts.
+constexpr size_t kListedFormulaCells = 10;
 
 const sheet::RowCell* CellAt(const std::vector<sheet::RowCell>& cells, int column)
 {
@@ -114,6 +117,9 @@ Status ExcelSeriesReader::ReadHeader()
     }, &noNumberTexts);
     if (!read)
         return Status::Fail(m_path, 0, workbook.Error());
+    for (const auto& [row, header] : headerRows)
+        if (row < data.m_nStartRow)
+            NoteFormulasWithoutResult(header);
     if (last < 2 || last - first < 1)
         return Status::Fail(m_path, 0, "the sheet has fewer than two used columns");
     m_firstColumn = first;
@@ -136,9 +142,10 @@ Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
     m_itemCount = valueColumns.size();
     if (m_itemCount == 0)
         return Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_NO_ITEM_COLUMN));
-    auto rowCells = [&](int row) {
+    static const std::vector<sheet::RowCell> kNoCells;
+    auto rowCells = [&](int row) -> const std::vector<sheet::RowCell>& {
         auto it = headerRows.find(row);
-        return it == headerRows.end() ? std::vector<sheet::RowCell>() : it->second.cells;
+        return it == headerRows.end() ? kNoCells : it->second.cells;
     };
 
     // The sheet's own date/time title when it has one, so a round trip keeps it.
@@ -221,15 +228,17 @@ Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
 void ExcelSeriesReader::Select(const std::vector<size_t>& items)
 {
     SeriesReader::Select(items);
+    // An item selected twice fills only its last slot, as in the text reader.
+    std::vector<int> slotOfItem(m_itemCount, -1);
+    for (size_t slot = 0; slot < items.size(); ++slot)
+        if (items[slot] < m_itemCount)
+            slotOfItem[items[slot]] = static_cast<int>(slot);
     m_slotOfColumn.assign(static_cast<size_t>(m_lastColumn) + 1, -1);
     size_t item = 0;
     for (int x = m_firstValueColumn; x <= m_lastColumn; ++x) {
         if (x >= m_stampColumn && x < m_stampColumn + m_formatColumns)
             continue;
-        for (size_t slot = 0; slot < items.size(); ++slot)
-            if (items[slot] == item)
-                m_slotOfColumn[static_cast<size_t>(x)] = static_cast<int>(slot);
-        ++item;
+        m_slotOfColumn[static_cast<size_t>(x)] = slotOfItem[item++];
     }
 }
 
@@ -296,31 +305,88 @@ bool ExcelSeriesReader::NextSheetRow(SheetRow& sheetRow)
 
 bool ExcelSeriesReader::Next(Row& row)
 {
-    while (m_status) {
-        SheetRow sheetRow;
-        if (!NextSheetRow(sheetRow)) {
-            std::lock_guard<std::mutex> lock(m_mutex);
-            if (!m_producerError.empty())
-                return Fail(m_path, m_rowNumber, m_producerError);
-            return false;
-        }
-        m_rowNumber = sheetRow.number;
-        bool endOfData = false;
-        if (!ReadDataRow(sheetRow, row, endOfData))
-            return false;
-        if (endOfData) {
-            // A row without a date/time ends the data, as in the preview; later rows are notes.
-            std::lock_guard<std::mutex> lock(m_mutex);
-            m_stop = true;
-            m_queue.clear();
-            m_batch.clear();
-            m_batchAt = 0;
-            m_changed.notify_all();
-            return false;
-        }
+    if (NextRow(row))
         return true;
-    }
+    NoteFormulaCells();
     return false;
+}
+
+bool ExcelSeriesReader::NextRow(Row& row)
+{
+    if (!m_status || m_dataEnded)
+        return false;
+    SheetRow sheetRow;
+    if (!NextSheetRow(sheetRow)) {
+        std::lock_guard<std::mutex> lock(m_mutex);
+        if (!m_producerError.empty())
+            return Fail(m_path, m_rowNumber, m_producerError);
+        return false;
+    }
+    // Rows without cells are not handed over: a gap is an empty row, which ends the data.
+    const int expected = m_rowNumber == 0 ? m_spec.m_DataDesc.m_nStartRow : static_cast<int>(m_rowNumber) + 1;
+    if (sheetRow.number > expected)
+        return EndData(expected, "which is empty: the rows below it are not converted");
+    m_rowNumber = sheetRow.number;
+    NoteFormulasWithoutResult(sheetRow);
+    std::string unreadable;
+    switch (ReadStamp(sheetRow, row.stamp, unreadable)) {
+    case StampRead::Read:
+        break;
+    case StampRead::Blank:
+        return EndData(sheetRow.number, "whose date/time cell is empty: it and the rows below it are not converted");
+    case StampRead::Unreadable:
+        // A start row that is no data row means the template does not describe the sheet.
+        if (m_rowsRead == 0)
+            return Fail(m_path, sheetRow.number, res::LoadString(res::IDS_DATETIME_UNPARSABLE) + " '" + unreadable + "'");
+        return EndData(sheetRow.number, "whose date/time '" + unreadable +
+                                            "' cannot be read: it and the rows below it are not converted");
+    case StampRead::Failed:
+        return false;
+    }
+    if (!ReadValues(sheetRow, row))
+        return false;
+    ++m_rowsRead;
+    return true;
+}
+
+// The first row whose date/time cannot be read ends the data, as in the preview; later rows are
+// notes. The log says where the data ended.
+bool ExcelSeriesReader::EndData(int row, const std::string& why)
+{
+    m_dataEnded = true;
+    m_notes.push_back("the data end at row " + std::to_string(row) + ", " + why);
+    std::lock_guard<std::mutex> lock(m_mutex);
+    m_stop = true;
+    m_queue.clear();
+    m_batch.clear();
+    m_batchAt = 0;
+    m_changed.notify_all();
+    return false;
+}
+
+void ExcelSeriesReader::NoteFormulasWithoutResult(const SheetRow& sheetRow)
+{
+    for (const sheet::RowCell& cell : sheetRow.cells) {
+        if (!cell.formulaWithoutResult)
+            continue;
+        if (m_formulaCells.size() < kListedFormulaCells)
+            m_formulaCells.push_back(sheet::ColumnLetters(cell.column) + std::to_string(sheetRow.number));
+        ++m_formulaCellCount;
+    }
+}
+
+void ExcelSeriesReader::NoteFormulaCells()
+{
+    if (m_formulaCellCount == 0 || m_formulaNoted)
+        return;
+    std::string cells;
+    for (const std::string& cell : m_formulaCells)
+        cells += (cells.empty() ? "" : ", ") + cell;
+    if (m_formulaCellCount > m_formulaCells.size())
+        cells += " and " + std::to_string(m_formulaCellCount - m_formulaCells.size()) + " more";
+    m_notes.push_back(std::to_string(m_formulaCellCount) + (m_formulaCellCount == 1 ? " formula cell" : " formula cells") +
+                      " without a result (or with an empty one) read as empty: " + cells);
+    m_formulaNoted = true;
 }
 
 bool ExcelSeriesReader::IsDeleted(const std::string& text) const
@@ -328,7 +394,8 @@ bool ExcelSeriesReader::IsDeleted(const std::string& text) const
     return m_deleteInUse && text::EqualsNoCase(text, m_deleteValue);
 }
 
-bool ExcelSeriesReader::ReadStamp(const SheetRow& sheetRow, Stamp& stamp, bool& endOfData)
+ExcelSeriesReader::StampRead ExcelSeriesReader::ReadStamp(const SheetRow& sheetRow, Stamp& stamp,
+                                                           std::string& unreadable)
 {
     const CTimeDescription& time = m_spec.m_TimeDesc;
     const int option = time.m_nDateTimeOption;
@@ -338,28 +405,38 @@ bool ExcelSeriesReader::ReadStamp(const SheetRow& sheetRow, Stamp& stamp, bool& 
         for (int w = 0; w < m_formatColumns; ++w)
             joined += TextAt(sheetRow.cells, m_stampColumn + w) + " ";
         joined = text::Trim(joined);
-        if (joined.empty()) {
-            endOfData = true;
-            return true;
+        if (joined.empty())
+            return StampRead::Blank;
+        if (!m_format->Read(joined, fields)) {
+            unreadable = joined;
+            return StampRead::Unreadable;
         }
-        if (!m_format->Read(joined, fields))
-            return Fail(m_path, sheetRow.number, res::LoadString(res::IDS_DATETIME_UNPARSABLE) + " '" + joined + "'");
     } else {
         const sheet::RowCell* cell = CellAt(sheetRow.cells, m_stampColumn);
-        if (!cell || (cell->value.type == sheet::Variant::Text && text::Trim(cell->text).empty())) {
-            endOfData = true;
-            return true;
-        }
+        if (!cell || (cell->value.type == sheet::Variant::Text && text::Trim(cell->text).empty()))
+            return StampRead::Blank;
         std::optional<Stamp> value;
         if (cell->value.type == sheet::Variant::Number) {
-            value = StampFromSerialDays(cell->value.number);
+            const double serial = cell->value.number;
+            if (serial >= 60 && serial < 61) {
+                Fail(m_path, sheetRow.number, "the date/time cell holds 29 February 1900 (day 60 of the sheet's "
+                                              "calendar), which the calendar does not have");
+                return StampRead::Failed;
+            }
+            value = StampFromSheetSerial(serial);
+            if (!value) {
+                unreadable = text::Format("%.15g", serial); // no date of the years 100 to 9999
+                return StampRead::Unreadable;
+            }
         } else {
             StampFields parsed = option == 0 ? StampFields() : m_start;
             if (m_format->Read(cell->text, parsed))
                 value = StampFromFields(parsed);
         }
-        if (!value)
-            return Fail(m_path, sheetRow.number, "the date/time cell '" + cell->text + "' is not a date");
+        if (!value) {
+            unreadable = cell->text;
+            return StampRead::Unreadable;
+        }
         const StampFields cellFields = FieldsFromStamp(*value);
         if (option == 0)
             fields = cellFields;
@@ -369,16 +446,16 @@ bool ExcelSeriesReader::ReadStamp(const SheetRow& sheetRow, Stamp& stamp, bool& 
             fields.year = cellFields.year, fields.month = cellFields.month, fields.day = cellFields.day;
     }
     std::optional<Stamp> value = StampFromFields(fields);
-    if (!value)
-        return Fail(m_path, sheetRow.number, "the date/time of the row does not exist in the calendar");
+    if (!value) {
+        Fail(m_path, sheetRow.number, "the date/time of the row does not exist in the calendar");
+        return StampRead::Failed;
+    }
     stamp = *value;
-    return true;
+    return StampRead::Read;
 }
 
-bool ExcelSeriesReader::ReadDataRow(const SheetRow& sheetRow, Row& row, bool& endOfData)
+bool ExcelSeriesReader::ReadValues(const SheetRow& sheetRow, Row& row)
 {
-    if (!ReadStamp(sheetRow, row.stamp, endOfData) || endOfData)
-        return m_status.ok();
     row.values.assign(m_selection.size(), kMissing);
     for (const sheet::RowCell& cell : sheetRow.cells) {
         if (cell.column < 0 || cell.column > m_lastColumn)

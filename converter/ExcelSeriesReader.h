@@ -1,6 +1,7 @@
 #pragma once
 // Reads a worksheet through an Excel template over the whole sheet: the header rows give the items
-// as the preview parser reads them, every row from the data start row one row of the series. The
+// as the preview parser reads them, every row from the data start row one row of the series, up to
+// the first row whose date/time cannot be read. The
 // workbook is read on a second thread that hands rows over through a small bounded queue, so
 // memory holds a few rows whatever the sheet's length.
 #include "converter/NumberText.h"
@@ -42,9 +43,17 @@ private:
     void StartRows();
     std::vector<bool> TextColumns() const;
     bool NextSheetRow(SheetRow& sheetRow);
-    bool ReadDataRow(const SheetRow& sheetRow, Row& row, bool& endOfData);
-    bool ReadStamp(const SheetRow& sheetRow, Stamp& stamp, bool& endOfData);
+    bool NextRow(Row& row);
+    // Ends the data at `row` (the reason follows "the data end at row N, "); always false.
+    bool EndData(int row, const std::string& why);
+    enum class StampRead { Read, Blank, Unreadable, Failed };
+    // Failed sets the status; Unreadable gives the text that could not be read.
+    StampRead ReadStamp(const SheetRow& sheetRow, Stamp& stamp, std::string& unreadable);
+    bool ReadValues(const SheetRow& sheetRow, Row& row);
     bool IsDeleted(const std::string& text) const;
+    void NoteFormulasWithoutResult(const SheetRow& sheetRow);
+    // Once the rows are read: one note naming the formula cells read as empty.
+    void NoteFormulaCells();
 
     const CSpecification& m_spec;
     std::string m_path;
@@ -62,7 +71,12 @@ private:
     std::unique_ptr<DateFormat> m_format;
     bool m_useFormat = false;
     StampFields m_start;
-    long m_rowNumber = 0;
+    long m_rowNumber = 0; // the sheet row last read
+    std::uint64_t m_rowsRead = 0;
+    bool m_dataEnded = false;
+    std::vector<std::string> m_formulaCells; // the first few, by address
+    std::uint64_t m_formulaCellCount = 0;
+    bool m_formulaNoted = false;
 
     // The rows in flight between the reading thread and Next.
     std::thread m_producer;

@@ -22,6 +22,9 @@ public:
     virtual std::uint64_t BytesConsumed() const { return 0; }
     // Where the last row came from: its line (text), worksheet row (Excel) or step number (rbx0).
     virtual long Location() const { return 0; }
+    // What the log should say about the file beside its rows (where the data ended, cells read in
+    // an unusual way), complete once Next has returned false.
+    const std::vector<std::string>& Notes() const { return m_notes; }
 
     // Every item of the file, in file order.
     const SeriesHeader& Header() const { return m_header; }
@@ -40,6 +43,7 @@ protected:
     SeriesHeader m_header;
     std::vector<size_t> m_selection;
     Status m_status;
+    std::vector<std::string> m_notes;
 };
 
 } // namespace converter

@@ -205,17 +205,34 @@ StampFields FieldsFromStamp(Stamp stamp)
     return f;
 }
 
-double StampToSerialDays(Stamp stamp)
+namespace {
+
+// OLE (automation) day numbers of the first day the sheet numbers as serial 1 (1 January 1900)
+// and of the first day after its 29 February 1900 (1 March 1900, serial 61).
+constexpr double kOleFirstSheetDay = 2;
+constexpr double kOleMarch1900 = 61;
+
+} // namespace
+
+std::optional<double> SheetSerialFromStamp(Stamp stamp)
 {
-    return static_cast<double>(stamp) / kSecondsPerDay + static_cast<double>(kEpochDays);
+    const double ole = static_cast<double>(stamp) / kSecondsPerDay + static_cast<double>(kEpochDays);
+    if (ole < kOleFirstSheetDay)
+        return std::nullopt;
+    return ole < kOleMarch1900 ? ole - 1 : ole;
 }
 
-std::optional<Stamp> StampFromSerialDays(double days)
+std::optional<Stamp> StampFromSheetSerial(double serial)
 {
-    // Years 100 to 9999 in serial days, as the date type allows.
-    if (!std::isfinite(days) || days < -657434.0 || days >= 2958466.0)
+    // Years 100 to 9999, as the date type allows.
+    if (!std::isfinite(serial) || serial < -657434.0 || serial >= 2958466.0)
         return std::nullopt;
-    return static_cast<Stamp>(std::llround((days - static_cast<double>(kEpochDays)) * kSecondsPerDay));
+    double ole = serial;
+    if (serial >= kOleMarch1900 - 1 && serial < kOleMarch1900)
+        return std::nullopt; // 29 February 1900
+    if (serial >= 1 && serial < kOleMarch1900 - 1)
+        ole = serial + 1;
+    return static_cast<Stamp>(std::llround((ole - static_cast<double>(kEpochDays)) * kSecondsPerDay));
 }
 
 } // namespace converter

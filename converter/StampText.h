@@ -86,9 +86,13 @@ private:
 };
 StampFields FieldsFromStamp(Stamp stamp);
 
-// Days since 30 December 1899 (the spreadsheet's and OLE's date serial) and back, to the second.
-double StampToSerialDays(Stamp stamp);
-std::optional<Stamp> StampFromSerialDays(double days);
+// The spreadsheet's day numbers (serials), to the second. The sheet's calendar has a 29 February
+// 1900 (serial 60), so serial 1 is 1 January 1900 and serials from 61 on count the days since
+// 30 December 1899, as automation dates do. Below 1 (a time of day; a date before 1900 as other
+// tools write it) a serial counts from 30 December 1899 too. Serial 60 is no stamp.
+std::optional<Stamp> StampFromSheetSerial(double serial);
+// Nothing for stamps before 1 January 1900, which a sheet cannot show as dates.
+std::optional<double> SheetSerialFromStamp(Stamp stamp);
 
 // Writes "YYYY/MM/DD HH:mm:ss" (19 characters) at `out`; returns the position after it.
 char* FormatStamp(Stamp stamp, char* out);

@@ -1,5 +1,6 @@
 #include "converter/XlsxParts.h"
 
+#include "converter/SheetLayout.h"
 #include "platform/system/Text.h"
 
 #include <ctime>
@@ -129,7 +130,7 @@ std::string Workbook()
     return std::string(kDeclaration) + "<workbook xmlns=\"" + kMainNamespace + "\" xmlns:r=\"" +
            kRelationshipNamespace + "\">"
            "<bookViews><workbookView/></bookViews>"
-           "<sheets><sheet name=\"Sheet1\" sheetId=\"1\" r:id=\"rId1\"/></sheets>"
+           "<sheets><sheet name=\"" + std::string(sheet_layout::kSheetName) + "\" sheetId=\"1\" r:id=\"rId1\"/></sheets>"
            "</workbook>";
 }
 
@@ -147,7 +148,7 @@ std::string WorkbookRelationships()
 std::string Styles()
 {
     return std::string(kDeclaration) + "<styleSheet xmlns=\"" + kMainNamespace + "\">"
-           "<numFmts count=\"1\"><numFmt numFmtId=\"164\" formatCode=\"yyyy/mm/dd hh:mm:ss\"/></numFmts>"
+           "<numFmts count=\"1\"><numFmt numFmtId=\"164\" formatCode=\"" + std::string(sheet_layout::kStampFormat) + "\"/></numFmts>"
            "<fonts count=\"1\"><font><sz val=\"11\"/><name val=\"Calibri\"/><family val=\"2\"/></font></fonts>"
            "<fills count=\"2\"><fill><patternFill patternType=\"none\"/></fill>"
            "<fill><patternFill patternType=\"gray125\"/></fill></fills>"

@@ -1,6 +1,7 @@
 #include "converter/XlsxSeriesWriter.h"
 
 #include "converter/NumberText.h"
+#include "converter/SheetLayout.h"
 #include "converter/StampText.h"
 #include "converter/XlsxParts.h"
 
@@ -22,19 +23,6 @@ constexpr size_t kRowBytes = 64;
 constexpr size_t kSlack = 32;
 constexpr int kNoString = -1;
 
-std::string MetadataCell(const ItemInfo& item)
-{
-    // The units cell must hold text in brackets, or the workbook reader refuses the unit row.
-    auto part = [](std::string text, const std::string& fallback) {
-        for (char& c : text)
-            if (c == '[' || c == ']' || c == ':')
-                c = ' ';
-        return text.empty() ? fallback : text;
-    };
-    return part(item.type, "Undefined") + "[" + part(item.unit, "Undefined") + "]:" +
-           part(item.valueType, "Instantaneous");
-}
-
 template <size_t N>
 char* Copy(char* out, const char (&text)[N])
 {
@@ -55,8 +43,8 @@ struct XlsxSeriesWriter::HeaderCells {
     explicit HeaderCells(const SeriesHeader& header)
     {
         for (const ItemInfo& item : header.items)
-            metadata.push_back(Intern(MetadataCell(item)));
-        timeTitle = Intern(header.timeTitle.empty() ? "Date/time" : header.timeTitle);
+            metadata.push_back(Intern(sheet_layout::MetadataText(item)));
+        timeTitle = Intern(sheet_layout::TimeTitle(header));
         // An empty name would read back as "Item<n>"; the cell stays blank as the input had it.
         for (const ItemInfo& item : header.items)
             names.push_back(item.name.empty() ? kNoString : Intern(item.name));
@@ -182,9 +170,16 @@ Status XlsxSeriesWriter::Write(const Row& row)
     out += digits;
     out = Copy(out, "\">");
     openCell(0);
-    out = Copy(out, "\" s=\"1\"><v>");
-    out = FormatValue(StampToSerialDays(row.stamp), out);
-    out = Copy(out, "</v></c>");
+    if (const std::optional<double> serial = SheetSerialFromStamp(row.stamp)) {
+        out = Copy(out, "\" s=\"1\"><v>");
+        out = FormatValue(*serial, out);
+        out = Copy(out, "</v></c>");
+    } else {
+        // Before 1900 a sheet has no dates: the stamp as text, which the default template reads too.
+        out = Copy(out, "\" t=\"inlineStr\"><is><t>");
+        out = FormatStamp(row.stamp, out);
+        out = Copy(out, "</t></is></c>");
+    }
     const size_t count = std::min(row.values.size(), m_cellOpenings.size() - 1);
     for (size_t i = 0; i < count; ++i) {
         // A cell holds finite numbers only: missing and infinite values stay blank.

@@ -1,11 +1,7 @@
 #pragma once
-// Writes an .xlsx workbook of one sheet in the layout a new Excel template reads with its defaults:
-//   row 1  column A empty, then per item "Type[unit]:ValueType"
-//   row 2  the date/time title, then the item names (an empty name stays a blank cell)
-//   row 3+ a date cell ("yyyy/mm/dd hh:mm:ss"), then one number per item; a missing value is a
-//          blank cell.
-// Header texts are shared strings. The sheet's XML is built in a buffer and deflated into the
-// package as the buffer fills, so memory stays the same whatever the row count.
+// Writes an .xlsx workbook of one sheet in the layout of converter/SheetLayout.h. Header texts are
+// shared strings. The sheet's XML is built in a buffer and deflated into the package as the buffer
+// fills, so memory stays the same whatever the row count.
 #include "converter/SeriesWriter.h"
 #include "converter/ZipWriter.h"
 

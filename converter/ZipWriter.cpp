@@ -1,15 +1,13 @@
 #include "converter/ZipWriter.h"
 
 #include "platform/rbx/Crc32.h"
+#include "platform/spreadsheet/LittleEndian.h"
 
 #include <zlib.h>
 
 #include <algorithm>
-#include <cerrno>
 #include <cstring>
 #include <ctime>
-#include <fcntl.h>
-#include <unistd.h>
 
 namespace converter {
 
@@ -22,23 +20,8 @@ constexpr size_t kStoredBlockHeaderBytes = 5;
 constexpr std::uint16_t kVersionNeeded = 20; // deflate
 constexpr std::uint16_t kDeflated = 8;
 
-void Put16(std::string& out, std::uint32_t value)
-{
-    out += static_cast<char>(value & 0xFF);
-    out += static_cast<char>((value >> 8) & 0xFF);
-}
-
-void Put32(std::string& out, std::uint32_t value)
-{
-    Put16(out, value & 0xFFFF);
-    Put16(out, value >> 16);
-}
-
-void Put32At(unsigned char* out, std::uint32_t value)
-{
-    for (int i = 0; i < 4; ++i)
-        out[i] = static_cast<unsigned char>(value >> (8 * i));
-}
+using sheet::Append16;
+using sheet::Append32;
 
 // Zip packages carry local wall-clock time in the MS-DOS form, to two seconds.
 void DosNow(std::uint16_t& time, std::uint16_t& date)
@@ -53,33 +36,40 @@ void DosNow(std::uint16_t& time, std::uint16_t& date)
 
 } // namespace
 
-ZipWriter::ZipWriter(size_t bufferBytes) : m_zip(std::make_unique<z_stream>()), m_out(std::max<size_t>(bufferBytes, 1)) {}
+ZipWriter::ZipWriter(size_t bufferBytes) : m_file(bufferBytes), m_zip(std::make_unique<z_stream>()) {}
 
 ZipWriter::~ZipWriter()
 {
     if (m_zipReady)
         deflateEnd(m_zip.get());
-    if (m_fd >= 0)
-        ::close(m_fd);
+}
+
+Status ZipWriter::Failed(Status status)
+{
+    if (!status)
+        m_failed = true;
+    return status;
 }
 
 Status ZipWriter::Fail(const std::string& message)
 {
-    m_failed = true;
-    return Status::Fail(m_path, 0, message);
+    return Failed(m_file.Fail(message));
 }
 
-Status ZipWriter::WriteError(const char* what)
+Status ZipWriter::Output(const void* data, size_t size)
 {
-    return Fail(std::string(what) + ": " + std::strerror(errno));
+    return Failed(m_file.Write(data, size));
+}
+
+Status ZipWriter::WriteAt(std::uint64_t offset, const void* data, size_t size)
+{
+    return Failed(m_file.WriteAt(offset, data, size));
 }
 
 Status ZipWriter::Open(const std::string& path)
 {
-    m_path = path;
-    m_fd = ::open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666);
-    if (m_fd < 0)
-        return WriteError("cannot create the file");
+    if (Status opened = Failed(m_file.Open(path)); !opened)
+        return opened;
     *m_zip = z_stream{};
     // Negative window bits: raw deflate, the zip entry carries its own CRC and sizes.
     if (deflateInit2(m_zip.get(), kLevel, Z_DEFLATED, -15, 8, Z_DEFAULT_STRATEGY) != Z_OK)
@@ -100,13 +90,13 @@ Status ZipWriter::AddEntry(const std::string& name, std::string_view data)
 
 Status ZipWriter::BeginEntry(const std::string& name, std::string_view head)
 {
-    if (m_failed || m_fd < 0)
+    if (m_failed || !m_file.IsOpen())
         return Fail("the package is not open for writing");
     if (m_streaming)
         return Fail("the part " + m_current.name + " is still being written");
     if (head.size() > 0xFFFF || name.size() > 0xFFFF)
         return Fail("the part " + name + " has a name or head too long for a zip entry");
-    m_current = Entry{name, m_written};
+    m_current = Entry{name, m_file.Size()};
     m_streaming = true;
     m_head = head;
     m_restCrc = 0;
@@ -118,11 +108,11 @@ Status ZipWriter::BeginEntry(const std::string& name, std::string_view head)
         // A stored block that is not the last: its bytes appear in the file as they are.
         std::string block;
         block += '\0';
-        Put16(block, static_cast<std::uint32_t>(head.size()));
-        Put16(block, static_cast<std::uint32_t>(~head.size() & 0xFFFF));
+        Append16(block, static_cast<std::uint32_t>(head.size()));
+        Append16(block, static_cast<std::uint32_t>(~head.size() & 0xFFFF));
         if (Status out = Output(block.data(), block.size()); !out)
             return out;
-        m_headOffset = m_written;
+        m_headOffset = m_file.Size();
         if (Status out = Output(head.data(), head.size()); !out)
             return out;
     }
@@ -153,17 +143,17 @@ Status ZipWriter::Deflate(std::string_view data, int flush)
         const int mode = last ? flush : Z_NO_FLUSH;
         int result = Z_OK;
         do {
-            if (m_outUsed == m_out.size())
-                if (Status flushed = FlushOutput(); !flushed)
-                    return flushed;
-            m_zip->next_out = m_out.data() + m_outUsed;
-            m_zip->avail_out = static_cast<uInt>(m_out.size() - m_outUsed);
+            unsigned char* room = nullptr;
+            size_t roomSize = 0;
+            if (Status free = Failed(m_file.Room(room, roomSize)); !free)
+                return free;
+            m_zip->next_out = room;
+            m_zip->avail_out = static_cast<uInt>(roomSize);
+            const size_t offered = m_zip->avail_out;
             result = deflate(m_zip.get(), mode);
             if (result == Z_STREAM_ERROR)
                 return Fail("the compressor failed on the part " + m_current.name);
-            const size_t produced = m_out.size() - m_outUsed - m_zip->avail_out;
-            m_outUsed += produced;
-            m_written += produced;
+            m_file.Used(offered - m_zip->avail_out);
         } while (m_zip->avail_in > 0 || m_zip->avail_out == 0 || (mode == Z_FINISH && result != Z_STREAM_END));
         done += piece;
         if (last)
@@ -201,17 +191,17 @@ Status ZipWriter::EndEntry(std::string_view finalHead)
 Status ZipWriter::WriteLocalHeader(const Entry& entry)
 {
     std::string header;
-    Put32(header, 0x04034b50);
-    Put16(header, kVersionNeeded);
-    Put16(header, 0); // flags: sizes are in this header, not in a descriptor after the data
-    Put16(header, kDeflated);
-    Put16(header, m_dosTime);
-    Put16(header, m_dosDate);
-    Put32(header, 0); // CRC and sizes, filled in by PatchLocalHeader
-    Put32(header, 0);
-    Put32(header, 0);
-    Put16(header, static_cast<std::uint32_t>(entry.name.size()));
-    Put16(header, 0);
+    Append32(header, 0x04034b50);
+    Append16(header, kVersionNeeded);
+    Append16(header, 0); // flags: sizes are in this header, not in a descriptor after the data
+    Append16(header, kDeflated);
+    Append16(header, m_dosTime);
+    Append16(header, m_dosDate);
+    Append32(header, 0); // CRC and sizes, filled in by PatchLocalHeader
+    Append32(header, 0);
+    Append32(header, 0);
+    Append16(header, static_cast<std::uint32_t>(entry.name.size()));
+    Append16(header, 0);
     header += entry.name;
     return Output(header.data(), header.size());
 }
@@ -219,113 +209,55 @@ Status ZipWriter::WriteLocalHeader(const Entry& entry)
 Status ZipWriter::PatchLocalHeader(const Entry& entry)
 {
     unsigned char fields[12];
-    Put32At(fields, entry.crc);
-    Put32At(fields + 4, static_cast<std::uint32_t>(entry.packedSize));
-    Put32At(fields + 8, static_cast<std::uint32_t>(entry.size));
+    sheet::Store32(fields, entry.crc);
+    sheet::Store32(fields + 4, static_cast<std::uint32_t>(entry.packedSize));
+    sheet::Store32(fields + 8, static_cast<std::uint32_t>(entry.size));
     return WriteAt(entry.headerOffset + 14, fields, sizeof fields);
 }
 
 Status ZipWriter::Close()
 {
-    if (m_failed || m_fd < 0)
+    if (m_failed || !m_file.IsOpen())
         return Fail("the package is not open for writing");
     if (m_streaming)
         return Fail("the part " + m_current.name + " was not completed");
-    const std::uint64_t directoryOffset = m_written;
+    const std::uint64_t directoryOffset = m_file.Size();
     std::string directory;
     for (const Entry& entry : m_entries) {
-        Put32(directory, 0x02014b50);
-        Put16(directory, kVersionNeeded); // made by: MS-DOS attributes, zip 2.0
-        Put16(directory, kVersionNeeded);
-        Put16(directory, 0);
-        Put16(directory, kDeflated);
-        Put16(directory, m_dosTime);
-        Put16(directory, m_dosDate);
-        Put32(directory, entry.crc);
-        Put32(directory, static_cast<std::uint32_t>(entry.packedSize));
-        Put32(directory, static_cast<std::uint32_t>(entry.size));
-        Put16(directory, static_cast<std::uint32_t>(entry.name.size()));
-        Put16(directory, 0); // extra
-        Put16(directory, 0); // comment
-        Put16(directory, 0); // disk
-        Put16(directory, 0); // internal attributes
-        Put32(directory, 0); // external attributes
-        Put32(directory, static_cast<std::uint32_t>(entry.headerOffset));
+        Append32(directory, 0x02014b50);
+        Append16(directory, kVersionNeeded); // made by: MS-DOS attributes, zip 2.0
+        Append16(directory, kVersionNeeded);
+        Append16(directory, 0);
+        Append16(directory, kDeflated);
+        Append16(directory, m_dosTime);
+        Append16(directory, m_dosDate);
+        Append32(directory, entry.crc);
+        Append32(directory, static_cast<std::uint32_t>(entry.packedSize));
+        Append32(directory, static_cast<std::uint32_t>(entry.size));
+        Append16(directory, static_cast<std::uint32_t>(entry.name.size()));
+        Append16(directory, 0); // extra
+        Append16(directory, 0); // comment
+        Append16(directory, 0); // disk
+        Append16(directory, 0); // internal attributes
+        Append32(directory, 0); // external attributes
+        Append32(directory, static_cast<std::uint32_t>(entry.headerOffset));
         directory += entry.name;
     }
     if (m_entries.size() > 0xFFFF || directoryOffset + directory.size() > kZipLimit)
         return Fail("the package passes 4 GiB or 65,535 parts, more than a zip package without 64-bit sizes holds");
     std::string end;
-    Put32(end, 0x06054b50);
-    Put16(end, 0);
-    Put16(end, 0);
-    Put16(end, static_cast<std::uint32_t>(m_entries.size()));
-    Put16(end, static_cast<std::uint32_t>(m_entries.size()));
-    Put32(end, static_cast<std::uint32_t>(directory.size()));
-    Put32(end, static_cast<std::uint32_t>(directoryOffset));
-    Put16(end, 0);
+    Append32(end, 0x06054b50);
+    Append16(end, 0);
+    Append16(end, 0);
+    Append16(end, static_cast<std::uint32_t>(m_entries.size()));
+    Append16(end, static_cast<std::uint32_t>(m_entries.size()));
+    Append32(end, static_cast<std::uint32_t>(directory.size()));
+    Append32(end, static_cast<std::uint32_t>(directoryOffset));
+    Append16(end, 0);
     directory += end;
     if (Status out = Output(directory.data(), directory.size()); !out)
         return out;
-    if (Status flushed = FlushOutput(); !flushed)
-        return flushed;
-    const int fd = m_fd;
-    m_fd = -1;
-    if (::close(fd) != 0)
-        return WriteError("write error");
-    return Status::Ok();
-}
-
-Status ZipWriter::Output(const void* data, size_t size)
-{
-    const auto* bytes = static_cast<const unsigned char*>(data);
-    while (size > 0) {
-        if (m_outUsed == m_out.size())
-            if (Status flushed = FlushOutput(); !flushed)
-                return flushed;
-        const size_t piece = std::min(size, m_out.size() - m_outUsed);
-        std::memcpy(m_out.data() + m_outUsed, bytes, piece);
-        m_outUsed += piece;
-        m_written += piece;
-        bytes += piece;
-        size -= piece;
-    }
-    return Status::Ok();
-}
-
-Status ZipWriter::FlushOutput()
-{
-    size_t done = 0;
-    while (done < m_outUsed) {
-        const ssize_t wrote = ::write(m_fd, m_out.data() + done, m_outUsed - done);
-        if (wrote < 0 && errno == EINTR)
-            continue;
-        if (wrote <= 0)
-            return WriteError("write error");
-        done += static_cast<size_t>(wrote);
-    }
-    m_outUsed = 0;
-    return Status::Ok();
-}
-
-Status ZipWriter::WriteAt(std::uint64_t offset, const void* data, size_t size)
-{
-    // Bytes before the buffer are in the file already; the rest are still in the buffer.
-    const std::uint64_t buffered = m_written - m_outUsed;
-    const auto* bytes = static_cast<const unsigned char*>(data);
-    size_t done = 0;
-    while (offset + done < buffered && done < size) {
-        const size_t piece = static_cast<size_t>(std::min<std::uint64_t>(size - done, buffered - offset - done));
-        const ssize_t wrote = ::pwrite(m_fd, bytes + done, piece, static_cast<off_t>(offset + done));
-        if (wrote < 0 && errno == EINTR)
-            continue;
-        if (wrote <= 0)
-            return WriteError("write error");
-        done += static_cast<size_t>(wrote);
-    }
-    if (done < size)
-        std::memcpy(m_out.data() + (offset + done - buffered), bytes + done, size - done);
-    return Status::Ok();
+    return Failed(m_file.Close());
 }
 
 } // namespace converter

@@ -5,6 +5,7 @@
 //
 // No 64-bit extensions: an entry or the package that would pass 4 GiB fails with a message
 // instead (the workbook reader does not take 64-bit packages either).
+#include "converter/BufferedFile.h"
 #include "converter/Problem.h"
 
 #include <cstdint>
@@ -58,19 +59,15 @@ private:
     Status WriteLocalHeader(const Entry& entry);
     Status Deflate(std::string_view data, int flush);
     Status PatchLocalHeader(const Entry& entry);
+    // Each marks the package failed when the file refuses the bytes.
     Status Output(const void* data, size_t size);
-    Status FlushOutput();
     Status WriteAt(std::uint64_t offset, const void* data, size_t size);
+    Status Failed(Status status);
     Status Fail(const std::string& message);
-    Status WriteError(const char* what);
 
-    std::string m_path;
-    int m_fd = -1;
+    BufferedFile m_file;
     std::unique_ptr<z_stream> m_zip;
     bool m_zipReady = false;
-    std::vector<unsigned char> m_out; // packed bytes waiting for the file
-    size_t m_outUsed = 0;
-    std::uint64_t m_written = 0; // bytes in the file plus those in m_out
     std::vector<Entry> m_entries;
     bool m_streaming = false;
     Entry m_current;

@@ -186,24 +186,24 @@ std::shared_ptr<sheet::Worksheet> CExcelFilePreviewParser::ReachSheet(bool allow
     }
 }
 
+// A column of the used range counts when one of its cells holds a value. The application counts
+// each column's values itself, so no sheet's values are ever fetched at once, however long.
 int CExcelFilePreviewParser::CountUsedColumnsOf(sheet::Worksheet& sheet, int& count) const
 {
     try {
         auto used = Require(sheet.UsedRange(), "UsedRange");
-        const sheet::Variant values = used->Value2();
         const int cells = used->Count();
         count = 0;
-        if (cells < 2 || values.type != sheet::Variant::Array)
+        if (cells < 2)
             return 0;
-        if (values.cells.size() != static_cast<size_t>(values.rows) * static_cast<size_t>(values.columns))
-            return 0;
-        for (int column = 1; column <= values.columns; ++column) {
-            for (int row = 1; row <= values.rows; ++row) {
-                if (!values.At(row, column).IsEmpty()) {
-                    ++count;
-                    break;
-                }
-            }
+        auto functions = Require(m_dispApplication ? m_dispApplication->WorksheetFunction() : nullptr, "WorksheetFunction");
+        const int top = used->Row();
+        const int bottom = top + used->RowCount() - 1;
+        const int left = used->Column();
+        for (int column = left; column < left + used->ColumnCount(); ++column) {
+            auto values = Require(sheet.Range(CellAddress(top, column), CellAddress(bottom, column)), "Range");
+            if (functions->CountA(values) > 0)
+                ++count;
         }
         return 1;
     } catch (const sheet::AutomationError&) {

@@ -121,6 +121,33 @@ public:
         return m_rect.firstColumn;
     }
 
+    int Row() const override
+    {
+        m_book->CheckOpen();
+        return m_rect.firstRow;
+    }
+
+    int RowCount() const override
+    {
+        m_book->CheckOpen();
+        return static_cast<int>(m_rect.Rows());
+    }
+
+    int ColumnCount() const override
+    {
+        m_book->CheckOpen();
+        return static_cast<int>(m_rect.Columns());
+    }
+
+    // Cells with a value, from what the workbook holds, or by reading the file once more.
+    long long CountValues() const
+    {
+        m_book->CheckOpen();
+        if (std::optional<long long> held = m_book->Sheet(m_sheet).CountValues(m_rect))
+            return *held;
+        return CountValuesInFile(m_book->model->path, m_sheet, m_rect, m_book->app->settings.load.limits);
+    }
+
 private:
     void CheckArraySize() const
     {
@@ -134,6 +161,23 @@ private:
     std::shared_ptr<BookState> m_book;
     int m_sheet;
     CellRect m_rect;
+};
+
+class WorksheetFunctionImpl : public WorksheetFunction {
+public:
+    explicit WorksheetFunctionImpl(std::shared_ptr<AppState> app) : m_app(std::move(app)) {}
+
+    double CountA(const std::shared_ptr<CellRange>& range) override
+    {
+        m_app->CheckRunning();
+        const auto* ours = dynamic_cast<const RangeImpl*>(range.get());
+        if (ours == nullptr)
+            throw AutomationError("Unable to get the CountA property of the WorksheetFunction class: not a range of this application.");
+        return static_cast<double>(ours->CountValues());
+    }
+
+private:
+    std::shared_ptr<AppState> m_app;
 };
 
 class WorksheetImpl : public Worksheet {
@@ -252,6 +296,11 @@ public:
     {
         m_app->CheckRunning();
         return std::make_shared<WorkbooksImpl>(m_app);
+    }
+    std::shared_ptr<sheet::WorksheetFunction> WorksheetFunction() override
+    {
+        m_app->CheckRunning();
+        return std::make_shared<WorksheetFunctionImpl>(m_app);
     }
     std::string Version() override
     {

@@ -4,6 +4,7 @@
 #include "platform/spreadsheet/WorkbookImport.h"
 #include "platform/system/Text.h"
 
+#include <algorithm>
 #include <cstdio>
 #include <cstring>
 #include <utility>
@@ -14,6 +15,8 @@ namespace {
 
 constexpr unsigned kContinue = 0x003C;
 constexpr unsigned kLongestBody = 8224;
+// The part of the stream held at a time; a record with its header always fits.
+constexpr std::size_t kWindowBytes = 256 * 1024;
 
 // Windows-1252 differs from Latin-1 only in 0x80-0x9F; its five holes stay as they are.
 constexpr char16_t kWindows1252High[32] = {
@@ -53,6 +56,12 @@ std::string Hex(unsigned value)
 } // namespace
 
 BiffCursor::BiffCursor(std::vector<std::span<const unsigned char>> segments) : m_segments(std::move(segments)) {}
+
+BiffCursor::BiffCursor(std::vector<std::vector<unsigned char>> bodies) : m_owned(std::move(bodies))
+{
+    for (const std::vector<unsigned char>& body : m_owned)
+        m_segments.emplace_back(body.data(), body.size());
+}
 
 bool BiffCursor::NextSegment()
 {
@@ -185,43 +194,58 @@ std::string BiffCursor::Text(const BiffTextForm& form, unsigned countBytes)
     }
 }
 
-BiffStream::BiffStream(std::string path, std::vector<unsigned char> bytes) : m_path(std::move(path)), m_bytes(std::move(bytes)) {}
+BiffStream::BiffStream(std::string path, std::uint64_t size, Source read)
+    : m_path(std::move(path)), m_size(size), m_read(std::move(read)), m_window(kWindowBytes)
+{
+}
+
+const unsigned char* BiffStream::Bytes(std::uint64_t offset, std::size_t count)
+{
+    if (offset < m_windowStart || offset + count > m_windowStart + m_windowBytes) {
+        m_windowStart = offset;
+        m_windowBytes = static_cast<std::size_t>(std::min<std::uint64_t>(m_window.size(), m_size - offset));
+        m_read(offset, m_window.data(), m_windowBytes);
+    }
+    return m_window.data() + (offset - m_windowStart);
+}
 
 bool BiffStream::Seek(std::uint64_t offset)
 {
-    if (offset + 4 > m_bytes.size())
+    if (offset > m_size || m_size - offset < 4)
         return false;
-    m_at = static_cast<std::size_t>(offset);
+    m_at = offset;
     return true;
 }
 
 bool BiffStream::Next(BiffRecord& record)
 {
-    if (m_at + 4 > m_bytes.size())
+    if (m_at > m_size || m_size - m_at < 4)
         return false;
     record.offset = m_at;
-    record.id = Load16(&m_bytes[m_at]);
-    const std::size_t length = Load16(&m_bytes[m_at + 2]);
+    const unsigned char* header = Bytes(m_at, 4);
+    record.id = Load16(header);
+    const std::size_t length = Load16(header + 2);
     if (length > kLongestBody)
         Fail(record, "is longer than a record may be");
-    if (m_at + 4 + length > m_bytes.size())
+    if (m_size - m_at - 4 < length)
         Fail(record, "is cut short");
-    record.body = std::span<const unsigned char>(m_bytes.data() + m_at + 4, length);
+    record.body = std::span<const unsigned char>(Bytes(m_at + 4, length), length);
     m_at += 4 + length;
     return true;
 }
 
 BiffCursor BiffStream::Continued(const BiffRecord& record)
 {
-    std::vector<std::span<const unsigned char>> segments{record.body};
+    // Reading on moves the window: the bodies are copied out of it.
+    std::vector<std::vector<unsigned char>> bodies{{record.body.begin(), record.body.end()}};
     BiffRecord next;
-    std::size_t before = m_at;
+    std::uint64_t before = m_at;
     while (Next(next) && next.id == kContinue) {
-        segments.push_back(next.body);
+        bodies.emplace_back(next.body.begin(), next.body.end());
         before = m_at;
     }
     m_at = before;
-    return BiffCursor(std::move(segments));
+    return BiffCursor(std::move(bodies));
 }
 
 void BiffStream::Fail(const BiffRecord& record, const std::string& why) const

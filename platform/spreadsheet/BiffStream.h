@@ -5,6 +5,7 @@
 // naming the file and the byte where the faulty record starts.
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <span>
 #include <string>
 #include <vector>
@@ -13,7 +14,7 @@ namespace sheet {
 
 struct BiffRecord {
     unsigned id = 0;
-    std::size_t offset = 0; // of the record's header in the stream
+    std::uint64_t offset = 0; // of the record's header in the stream
     std::span<const unsigned char> body;
 };
 
@@ -38,6 +39,11 @@ public:
 
     explicit BiffCursor(std::vector<std::span<const unsigned char>> segments);
     explicit BiffCursor(std::span<const unsigned char> body) : BiffCursor(std::vector{body}) {}
+    // Over bodies it holds itself.
+    explicit BiffCursor(std::vector<std::vector<unsigned char>> bodies);
+    BiffCursor(BiffCursor&&) = default;
+    BiffCursor(const BiffCursor&) = delete;
+    BiffCursor& operator=(const BiffCursor&) = delete;
 
     std::uint8_t U8();
     std::uint16_t U16();
@@ -55,19 +61,26 @@ private:
     void ReadCharacters(unsigned count, bool wide, bool continuedWithOptions, std::u16string& units);
     void ReadCodePageBytes(unsigned count, unsigned codePage, std::u16string& units);
 
+    std::vector<std::vector<unsigned char>> m_owned; // what m_segments point into, when held here
     std::vector<std::span<const unsigned char>> m_segments;
     std::size_t m_segment = 0;
     std::size_t m_at = 0;
 };
 
+// The records of a workbook stream, read through a window of the stream, so that a large stream
+// is never held whole.
 class BiffStream {
 public:
+    // Copies `size` bytes from `offset` of the stream to `out`.
+    using Source = std::function<void(std::uint64_t offset, unsigned char* out, std::size_t size)>;
+
     // `path` only names the file in messages.
-    BiffStream(std::string path, std::vector<unsigned char> bytes);
+    BiffStream(std::string path, std::uint64_t size, Source read);
 
     // Goes to the record whose header starts at `offset`; false when it lies outside the stream.
     bool Seek(std::uint64_t offset);
     // The next record, false at the end of the stream; throws on a record cut short or too long.
+    // Its body stays readable until the next call of Next or Continued.
     bool Next(BiffRecord& record);
     // A cursor over `record` and the CONTINUE records right after it, which it steps past.
     BiffCursor Continued(const BiffRecord& record);
@@ -76,9 +89,16 @@ public:
     [[noreturn]] void Fail(const std::string& why) const;
 
 private:
+    // The bytes [offset, offset + count) of the stream, from the window (moved there if need be).
+    const unsigned char* Bytes(std::uint64_t offset, std::size_t count);
+
     std::string m_path;
-    std::vector<unsigned char> m_bytes;
-    std::size_t m_at = 0;
+    std::uint64_t m_size = 0;
+    Source m_read;
+    std::vector<unsigned char> m_window;
+    std::uint64_t m_windowStart = 0;
+    std::size_t m_windowBytes = 0;
+    std::uint64_t m_at = 0;
 };
 
 // The text of a cell error code ("#N/A", "#DIV/0!", ...); "#N/A" for unknown codes.

@@ -27,7 +27,32 @@ public:
     // The bytes of a stream (from the mini stream when it is small); throws on a broken chain.
     std::vector<unsigned char> Read(const Entry& entry);
 
+    // A stream read piece by piece, so that a large one is never held whole: where its bytes lie
+    // in the file is found once, as runs of consecutive sectors. A stream small enough for the
+    // mini stream is held whole. It reads through the CompoundFile, which must outlive it.
+    class Stream {
+    public:
+        std::uint64_t Size() const { return m_size; }
+        // Copies `size` bytes from `offset` of the stream to `out`; throws past its end.
+        void ReadAt(std::uint64_t offset, unsigned char* out, std::size_t size);
+
+    private:
+        friend class CompoundFile;
+        struct Run {
+            std::uint64_t offset = 0;       // in the stream
+            std::uint64_t filePosition = 0; // of that byte in the file
+            std::uint64_t length = 0;
+        };
+        CompoundFile* m_file = nullptr;
+        std::uint64_t m_size = 0;
+        std::vector<Run> m_runs;
+        std::vector<unsigned char> m_bytes; // a stream of the mini stream
+    };
+    // Throws on a broken chain, or one shorter than the stream's directory entry says.
+    Stream Open(const Entry& entry);
+
 private:
+    void ReadAllocationTable(const std::vector<unsigned char>& header);
     bool ReadSector(std::uint32_t index, std::vector<unsigned char>& out);
     std::vector<unsigned char> ReadChain(std::uint32_t start, std::uint64_t size, const std::vector<std::uint32_t>& table,
                                          std::uint64_t unit, bool mini);

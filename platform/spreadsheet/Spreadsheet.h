@@ -37,6 +37,9 @@ public:
     virtual Variant Value2() const = 0; // raw values; an Array for more than one cell
     virtual int Count() const = 0;      // number of cells
     virtual int Column() const = 0;     // first column, from 1
+    virtual int Row() const = 0;        // first row, from 1
+    virtual int RowCount() const = 0;    // Rows.Count: the number of rows
+    virtual int ColumnCount() const = 0; // Columns.Count: the number of columns
 };
 
 class Worksheet {
@@ -67,11 +70,21 @@ public:
     virtual std::shared_ptr<Workbook> Open(const std::string& path) = 0;
 };
 
+// The sheet functions the application offers to its callers.
+class WorksheetFunction {
+public:
+    virtual ~WorksheetFunction() = default;
+    // The number of cells of `range` that hold a value (an empty text counts, a blank cell not),
+    // found without handing out the values.
+    virtual double CountA(const std::shared_ptr<CellRange>& range) = 0;
+};
+
 class Application {
 public:
     virtual ~Application() = default;
     virtual void Visible(bool visible) = 0;
     virtual std::shared_ptr<sheet::Workbooks> Workbooks() = 0;
+    virtual std::shared_ptr<sheet::WorksheetFunction> WorksheetFunction() = 0;
     virtual std::string Version() = 0; // such as "16.0"
     virtual void Quit() = 0;
 };

@@ -27,6 +27,9 @@ struct ImportedCell {
     double number = 0.0;
     std::string text;
     unsigned style = 0; // index into the StyleTable
+    // A formula whose stored result is missing or empty (written by a tool that does not
+    // calculate): read as the empty text.
+    bool formulaWithoutResult = false;
 };
 
 // The number format of every cell style of a workbook.

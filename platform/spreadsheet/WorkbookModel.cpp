@@ -24,9 +24,35 @@ const StoredCell* SheetModel::Find(int row, int column) const
     return found == m_cells.end() ? nullptr : &found->second;
 }
 
+std::optional<long long> SheetModel::CountValues(const CellRect& block) const
+{
+    if (block.IsEmpty() || m_used.IsEmpty() || block.lastRow < m_used.firstRow || block.firstRow > m_used.lastRow ||
+        block.lastColumn < m_used.firstColumn || block.firstColumn > m_used.lastColumn)
+        return 0; // no cell of the sheet lies there
+    long long count = 0;
+    if (block.firstRow <= m_used.firstRow && block.lastRow >= m_used.lastRow) {
+        const int last = std::min<int>(block.lastColumn, static_cast<int>(m_valuesInColumn.size()) - 1);
+        for (int column = std::max(block.firstColumn, 0); column <= last; ++column)
+            count += m_valuesInColumn[static_cast<size_t>(column)];
+        return count;
+    }
+    if (!Holds(block.lastRow))
+        return std::nullopt;
+    for (int row = block.firstRow; row <= block.lastRow; ++row)
+        for (auto it = m_cells.lower_bound({row, block.firstColumn});
+             it != m_cells.end() && it->first.first == row && it->first.second <= block.lastColumn; ++it)
+            count += it->second.type != Variant::Empty ? 1 : 0;
+    return count;
+}
+
 void SheetModel::Add(const ImportedCell& cell, bool keep)
 {
     m_used.Include(cell.row, cell.column);
+    if (cell.type != Variant::Empty) {
+        if (static_cast<size_t>(cell.column) >= m_valuesInColumn.size())
+            m_valuesInColumn.resize(static_cast<size_t>(cell.column) + 1, 0);
+        ++m_valuesInColumn[static_cast<size_t>(cell.column)];
+    }
     if (!keep)
         return;
     m_cells[{cell.row, cell.column}] = StoredCell{cell.type, cell.number, cell.text, cell.style};
@@ -105,7 +131,43 @@ private:
     std::map<int, int> m_cutoff;
 };
 
+// Counts the cells with a value inside one block of one sheet, and stops after that sheet.
+class ValueCounter : public ImportSink {
+public:
+    ValueCounter(int sheet, const CellRect& block) : m_sheet(sheet), m_block(block) {}
+
+    void AddSheet(const std::string&) override {}
+    void AddCell(int sheet, const ImportedCell& cell) override
+    {
+        if (sheet == m_sheet && cell.type != Variant::Empty && cell.row >= m_block.firstRow &&
+            cell.row <= m_block.lastRow && cell.column >= m_block.firstColumn && cell.column <= m_block.lastColumn)
+            ++count;
+    }
+    void EndSheet(int sheet) override
+    {
+        if (sheet == m_sheet)
+            throw StopImport();
+    }
+
+    long long count = 0;
+
+private:
+    int m_sheet;
+    CellRect m_block;
+};
+
 } // namespace
+
+long long CountValuesInFile(const std::string& path, int sheet, const CellRect& block, const ImportLimits& limits)
+{
+    ValueCounter counter(sheet, block);
+    StyleTable styles;
+    try {
+        ImportWorkbook(path, counter, styles, limits);
+    } catch (const StopImport&) {
+    }
+    return counter.count;
+}
 
 std::unique_ptr<WorkbookModel> LoadWorkbook(const std::string& path, const LoadOptions& options)
 {

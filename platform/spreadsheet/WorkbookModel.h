@@ -5,6 +5,7 @@
 
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 #include <utility>
 #include <vector>
@@ -45,6 +46,9 @@ public:
     // Whether the cells of rows 1..row are all held.
     bool Holds(int row) const { return m_complete || row <= m_heldRows; }
     const StoredCell* Find(int row, int column) const;
+    // The cells of `block` that hold a value, when what the sheet holds can tell: the block spans
+    // every used row (values are counted per column over the whole sheet), or lies in the held rows.
+    std::optional<long long> CountValues(const CellRect& block) const;
 
     void Add(const ImportedCell& cell, bool keep);
     // Cells are held up to `rows` only (every row before it stays complete).
@@ -56,6 +60,7 @@ public:
 private:
     std::string m_name;
     CellRect m_used;
+    std::vector<long long> m_valuesInColumn; // by column, over every row
     std::map<std::pair<int, int>, StoredCell> m_cells;
     int m_heldRows = 0;
     bool m_complete = true;
@@ -74,5 +79,9 @@ public:
 
 // Reads `path` keeping what `options` allows. Throws AutomationError.
 std::unique_ptr<WorkbookModel> LoadWorkbook(const std::string& path, const LoadOptions& options);
+
+// The cells of `block` of sheet `sheet` (from 0) that hold a value, by reading the file once more
+// without keeping its cells. Throws AutomationError.
+long long CountValuesInFile(const std::string& path, int sheet, const CellRect& block, const ImportLimits& limits);
 
 } // namespace sheet

@@ -39,6 +39,7 @@ public:
         out.value.number = cell.number;
         out.value.text = cell.text;
         out.style = cell.style;
+        out.formulaWithoutResult = cell.formulaWithoutResult;
         if (out.value.type == Variant::Text || WantsText(cell.column))
             out.text = m_styles.Format(cell.style).Render(out.value);
         m_cells.push_back(std::move(out));

@@ -1,7 +1,7 @@
 #pragma once
 // Reads whole sheets of a workbook row by row, for conversions: each row's cells come with their
 // raw value and the text the sheet displays. Memory stays bounded by one row plus what the
-// reader holds for the whole workbook (.xlsx: the shared strings; .xls: the workbook stream).
+// reader holds for the whole workbook (.xlsx: the shared strings; .xls: the shared texts).
 #include "platform/spreadsheet/Spreadsheet.h"
 #include "platform/spreadsheet/WorkbookImport.h"
 
@@ -16,6 +16,7 @@ struct RowCell {
     Variant value;  // Number (dates as serial numbers), Text, Boolean or Error
     std::string text; // what the sheet displays; empty for a non-text cell outside the text columns
     unsigned style = 0;
+    bool formulaWithoutResult = false; // an empty text that stands for a formula's missing result
 };
 
 class WorkbookReader {

@@ -271,6 +271,7 @@ void XlsReader::ReadCellRecord(const BiffRecord& record, int sheet)
         if (m_formulaAwaitingText) {
             ImportedCell cell = *std::exchange(m_formulaAwaitingText, std::nullopt);
             Guarded(record, [&] { cell.text = m_stream.Continued(record).Text(m_textForm, 2); });
+            cell.formulaWithoutResult = cell.text.empty();
             Emit(sheet, cell);
         }
         return;
@@ -360,7 +361,8 @@ void XlsReader::ReadCellRecord(const BiffRecord& record, int sheet)
 }
 
 // A formula cell shows its last result: a number, or when the top two bytes are FF FF a typed
-// result; a text result comes in the STRING record that follows.
+// result; a text result comes in the STRING record that follows. An empty result (a tool that
+// does not calculate writes every formula so) or one of no known type reads as the empty text.
 void XlsReader::ReadFormula(BiffCursor& body, ImportedCell& cell, int sheet)
 {
     unsigned char result[8];
@@ -381,17 +383,15 @@ void XlsReader::ReadFormula(BiffCursor& body, ImportedCell& cell, int sheet)
     } else if (result[0] == 2) {
         cell.type = Variant::Error;
         cell.text = BiffErrorText(result[2]);
-    } else if (result[0] == 3) {
-        cell.type = Variant::Text;
     } else {
-        return;
+        cell.type = Variant::Text;
+        cell.formulaWithoutResult = true;
     }
     Emit(sheet, cell);
 }
 
-std::vector<unsigned char> WorkbookStream(const std::string& path)
+CompoundFile::Stream WorkbookStream(CompoundFile& file, const std::string& path)
 {
-    CompoundFile file(path);
     if (file.Find("EncryptedPackage"))
         throw OpenError(path, "the workbook is password-protected.");
     std::optional<CompoundFile::Entry> workbook = file.Find("Workbook");
@@ -399,7 +399,7 @@ std::vector<unsigned char> WorkbookStream(const std::string& path)
         workbook = file.Find("Book");
     if (!workbook)
         throw OpenError(path, "the compound file holds no workbook stream.");
-    return file.Read(*workbook);
+    return file.Open(*workbook);
 }
 
 } // namespace
@@ -410,7 +410,11 @@ void ImportXls(const std::string& path, ImportSink& sink, StyleTable& styles, co
     if (probe && static_cast<std::uint64_t>(probe.tellg()) > limits.maxFileBytes)
         throw OpenError(path, "the file is larger than " + std::to_string(limits.maxFileBytes >> 20) + " MiB.");
     probe.close();
-    BiffStream stream(path, WorkbookStream(path));
+    CompoundFile file(path);
+    CompoundFile::Stream workbook = WorkbookStream(file, path);
+    BiffStream stream(path, workbook.Size(), [&workbook](std::uint64_t offset, unsigned char* out, std::size_t size) {
+        workbook.ReadAt(offset, out, size);
+    });
     XlsReader reader(path, stream, sink, styles, limits);
     reader.ReadGlobals();
     reader.ReadSheets();

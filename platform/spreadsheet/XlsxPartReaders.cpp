@@ -245,6 +245,7 @@ struct RawCell {
     std::string type;
     unsigned style = 0;
     bool hasValue = false;
+    bool hasFormula = false;
     std::string value;      // <v>
     bool hasInline = false;
     std::string inlineText; // <is>
@@ -327,7 +328,7 @@ void SheetCellReader::ReadCell()
     m_raw.type.assign(m_xml.Attribute("t").value_or("n"));
     const std::optional<std::string_view> style = m_xml.Attribute("s");
     m_raw.style = style ? ParseUnsigned<unsigned>(*style).value_or(0) : 0;
-    m_raw.hasValue = m_raw.hasInline = false;
+    m_raw.hasValue = m_raw.hasInline = m_raw.hasFormula = false;
     m_raw.value.clear();
     m_raw.inlineText.clear();
 
@@ -345,7 +346,8 @@ void SheetCellReader::ReadCell()
             m_raw.hasInline = true;
             AppendRichText(m_xml, m_raw.inlineText);
         } else {
-            m_xml.SkipElement(); // formulas and extensions
+            m_raw.hasFormula = m_raw.hasFormula || m_xml.Name() == "f";
+            m_xml.SkipElement(); // the formula itself, and extensions
         }
     }
 
@@ -385,8 +387,17 @@ void SheetCellReader::Interpret(ImportedCell& cell)
     if (type == "inlineStr") {
         cell.type = Variant::Text;
         cell.text = m_raw.hasInline ? m_raw.inlineText : value;
-    } else if (!m_raw.hasValue) {
-        cell.type = type == "str" ? Variant::Text : Variant::Empty; // a formula's empty text result
+    } else if (type == "str") {
+        cell.type = Variant::Text; // a formula's text result
+        cell.text = value;
+        cell.formulaWithoutResult = m_raw.hasFormula && value.empty();
+    } else if (TrimSpaces(value).empty()) {
+        // A cell without a value is blank; a formula without one was written by a tool that does
+        // not calculate (<f>...</f><v></v>) and reads as the empty text.
+        if (m_raw.hasFormula) {
+            cell.type = Variant::Text;
+            cell.formulaWithoutResult = true;
+        }
     } else if (type == "n") {
         const std::optional<double> number = ParseNumber(value);
         if (!number)

@@ -1,5 +1,7 @@
 #include "platform/system/OleDateTime.h"
 
+#include "platform/system/Text.h"
+
 #include <cmath>
 #include <ctime>
 
@@ -178,7 +180,19 @@ std::string COleDateTime::Format(const char* format) const
     long long days = DaysFromCivil(year, month, day);
     tm.tm_wday = static_cast<int>(((days + 6) % 7 + 7) % 7); // 1899-12-30 was a Saturday
     tm.tm_yday = static_cast<int>(days - DaysFromCivil(year, 1, 1));
+    // strftime writes the years 100 to 999 with three digits; a date's year always has four.
+    std::string pattern;
+    for (const char* p = format; *p != '\0'; ++p) {
+        if (p[0] == '%' && p[1] == 'Y') {
+            pattern += text::Format("%04d", year);
+            ++p;
+        } else {
+            pattern += *p;
+            if (p[0] == '%' && p[1] != '\0')
+                pattern += *++p;
+        }
+    }
     char buffer[256];
-    size_t n = std::strftime(buffer, sizeof(buffer), format, &tm);
+    size_t n = std::strftime(buffer, sizeof(buffer), pattern.c_str(), &tm);
     return std::string(buffer, n);
 }

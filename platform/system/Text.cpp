@@ -1,5 +1,7 @@
 #include "platform/system/Text.h"
 
+#include <algorithm>
+
 #include <cstdarg>
 #include <cstdio>
 #include <limits>
@@ -127,6 +129,17 @@ size_t Utf8SequenceLength(std::string_view s, size_t i)
         (lead == 0xF4 && second > 0x8F))
         return 0;
     return length;
+}
+
+char32_t NextUtf8Character(std::string_view s, size_t& at)
+{
+    const size_t length = std::max<size_t>(Utf8SequenceLength(s, at), 1);
+    const auto lead = static_cast<unsigned char>(s[at]);
+    char32_t c = length == 1 ? lead : lead & (length == 2 ? 0x1F : length == 3 ? 0x0F : 0x07);
+    for (size_t k = 1; k < length; ++k)
+        c = (c << 6) | (static_cast<unsigned char>(s[at + k]) & 0x3F);
+    at += length;
+    return c;
 }
 
 bool IsUtf8(std::string_view s)

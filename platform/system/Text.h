@@ -42,6 +42,9 @@ char32_t Windows1252Character(unsigned char byte);
 // well-formed UTF-8, else every byte read as Windows-1252, the ANSI code page of the systems that
 // write such files. The result is always well-formed UTF-8.
 std::string ToUtf8(std::string_view bytes);
+// The code point of the well-formed UTF-8 sequence at `s[at]` (`at` moves past it). Writers walk
+// the characters of `ToUtf8`'s result with it.
+char32_t NextUtf8Character(std::string_view s, size_t& at);
 
 // Converts the whole UTF-16 code units at the start of `bytes` (in the byte order given) onto `out`
 // as UTF-8 and returns how many bytes it used. An odd last byte, or a high surrogate at the end

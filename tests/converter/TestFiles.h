@@ -1,5 +1,6 @@
 #pragma once
 // Scratch folders, small files and templates for the converter tests.
+#include "converter/SeriesWriter.h"
 #include "templates/AsciiSpecification.h"
 
 #include <filesystem>
@@ -51,6 +52,19 @@ inline CAsciiSpecification GlobalSpec()
     spec.m_DataDesc.m_nItemDescriptionRow = 1;
     spec.m_DataDesc.m_nStartRow = 2;
     return spec;
+}
+
+// Writes `rows` through `writer` into `path`: Begin, a Write for each row, Finish.
+inline converter::Status WriteSeries(converter::SeriesWriter& writer, const std::string& path,
+                                     const converter::SeriesHeader& header, const std::vector<converter::Row>& rows,
+                                     const std::string& title = "")
+{
+    if (converter::Status begun = writer.Begin(path, header, title); !begun)
+        return begun;
+    for (const converter::Row& row : rows)
+        if (converter::Status written = writer.Write(row); !written)
+            return written;
+    return writer.Finish();
 }
 
 } // namespace convtest

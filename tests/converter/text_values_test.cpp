@@ -104,17 +104,45 @@ TEST(DateFormat, ExtraSeparatorsSplitJoinedFields)
     EXPECT_EQ(FormatStamp(*StampFromFields(fields)), "2020/05/06 07:08:09");
 }
 
-TEST(StampText, FormatsAndConvertsSerialDays)
+TEST(StampText, FormatsStampsAndKnowsTheCalendar)
 {
-    StampFields f{1999, 12, 31, 23, 59, 58};
-    const Stamp stamp = *StampFromFields(f);
+    const Stamp stamp = *StampFromFields({1999, 12, 31, 23, 59, 58});
     EXPECT_EQ(FormatStamp(stamp), "1999/12/31 23:59:58");
-    EXPECT_EQ(*StampFromSerialDays(StampToSerialDays(stamp)), stamp);
-    EXPECT_DOUBLE_EQ(StampToSerialDays(*StampFromFields({1899, 12, 30, 12, 0, 0})), 0.5);
     EXPECT_EQ(FormatStamp(*StampFromFields({1800, 1, 1, 0, 0, 0})), "1800/01/01 00:00:00");
+    EXPECT_EQ(FormatStamp(*StampFromFields({100, 1, 1, 0, 0, 0})), "0100/01/01 00:00:00");
     EXPECT_FALSE(StampFromFields({2021, 2, 29, 0, 0, 0}).has_value());
     EXPECT_TRUE(StampFromFields({2020, 2, 29, 0, 0, 0}).has_value());
-    EXPECT_FALSE(StampFromSerialDays(std::nan("")).has_value());
+}
+
+// The sheet's day numbers count a 29 February 1900: serial 1 is 1 January 1900, 59 is 28 February,
+// 61 is 1 March; below 1 they count from 30 December 1899 as automation dates do.
+TEST(StampText, SheetSerialsFollowTheSheetsOwnCalendar)
+{
+    struct Case {
+        double serial;
+        const char* stamp; // "" when the serial is no stamp
+    } cases[] = {
+        {1.5, "1900/01/01 12:00:00"},   {1, "1900/01/01 00:00:00"},     {32, "1900/02/01 00:00:00"},
+        {59.75, "1900/02/28 18:00:00"}, {60, ""},                       {60.5, ""},
+        {61, "1900/03/01 00:00:00"},    {44333.25, "2021/05/17 06:00:00"}, {0.5, "1899/12/30 12:00:00"},
+        {-1.25, "1899/12/28 18:00:00"}, {-657434, "0100/01/01 00:00:00"}, {2958465, "9999/12/31 00:00:00"},
+        {-657435, ""},                  {2958466, ""},                  {std::nan(""), ""},
+    };
+    for (const Case& c : cases) {
+        const std::optional<Stamp> stamp = StampFromSheetSerial(c.serial);
+        if (*c.stamp == '\0') {
+            EXPECT_FALSE(stamp.has_value()) << c.serial;
+            continue;
+        }
+        ASSERT_TRUE(stamp.has_value()) << c.serial;
+        EXPECT_EQ(FormatStamp(*stamp), c.stamp) << c.serial;
+        // Back to the same serial wherever the sheet shows the day as a date.
+        if (c.serial >= 1) {
+            EXPECT_DOUBLE_EQ(SheetSerialFromStamp(*stamp).value_or(-1), c.serial) << c.serial;
+        }
+    }
+    EXPECT_FALSE(SheetSerialFromStamp(*StampFromFields({1899, 12, 31, 23, 59, 59})).has_value());
+    EXPECT_FALSE(SheetSerialFromStamp(*StampFromFields({100, 1, 1, 0, 0, 0})).has_value());
 }
 
 TEST(NumberReader, ReadsWithTheTemplateSeparator)

@@ -40,12 +40,7 @@ Status WriteWorkbook(const std::string& path, const SeriesHeader& header, const 
                      const std::string& title = "")
 {
     XlsxSeriesWriter writer;
-    if (Status begun = writer.Begin(path, header, title); !begun)
-        return begun;
-    for (const Row& row : rows)
-        if (Status written = writer.Write(row); !written)
-            return written;
-    return writer.Finish();
+    return convtest::WriteSeries(writer, path, header, rows, title);
 }
 
 ReadBack ReadWorkbook(const std::string& path)
@@ -130,7 +125,7 @@ TEST(XlsxWriter, CellsHoldTheShortestTextOfEachValueExactly)
     for (size_t r = 0; r < rows.size(); ++r) {
         const std::string row = std::to_string(r + 3);
         ASSERT_TRUE(cells.count("A" + row)) << row;
-        EXPECT_TRUE(SameBits(std::strtod(cells["A" + row].c_str(), nullptr), StampToSerialDays(rows[r].stamp))) << row;
+        EXPECT_TRUE(SameBits(std::strtod(cells["A" + row].c_str(), nullptr), *SheetSerialFromStamp(rows[r].stamp))) << row;
         for (size_t v = 0; v < 4; ++v) {
             const std::string name = std::string(1, static_cast<char>('B' + v)) + row;
             const double value = rows[r].values[v];

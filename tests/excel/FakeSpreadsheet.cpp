@@ -52,6 +52,18 @@ public:
 
     int Count() const override { return (m_bottom - m_top + 1) * (m_right - m_left + 1); }
     int Column() const override { return m_left; }
+    int Row() const override { return m_top; }
+    int RowCount() const override { return m_bottom - m_top + 1; }
+    int ColumnCount() const override { return m_right - m_left + 1; }
+
+    int CountValues() const
+    {
+        int count = 0;
+        for (const auto& [place, cell] : m_sheet.cells)
+            if (place.first >= m_top && place.first <= m_bottom && place.second >= m_left && place.second <= m_right)
+                count += cell.value.IsEmpty() ? 0 : 1;
+        return count;
+    }
 
 private:
     sheet::Variant ValueAt(int row, int column) const
@@ -82,14 +94,25 @@ void Sheet::Put(const std::string& address, double number, const std::string& di
 
 void Sheet::PutEmptyText(const std::string& address) { Put(address, std::string()); }
 
-std::shared_ptr<sheet::CellRange> Sheet::Range(const std::string& cell, const std::string&)
+std::shared_ptr<sheet::CellRange> Sheet::Range(const std::string& cell, const std::string& otherCell)
 {
     if (log)
-        log->push_back("Range " + cell);
+        log->push_back("Range " + cell + (otherCell.empty() ? "" : ":" + otherCell));
     int row = 0, column = 0;
     if (failingAddresses.count(cell) || !ParseAddress(cell, row, column))
         throw sheet::AutomationError("bad address " + cell);
-    return std::make_shared<Block>(*this, row, column, row, column);
+    int lastRow = row, lastColumn = column;
+    if (!otherCell.empty() && !ParseAddress(otherCell, lastRow, lastColumn))
+        throw sheet::AutomationError("bad address " + otherCell);
+    return std::make_shared<Block>(*this, row, column, lastRow, lastColumn);
+}
+
+double Functions::CountA(const std::shared_ptr<sheet::CellRange>& range)
+{
+    const auto* block = dynamic_cast<const Block*>(range.get());
+    if (block == nullptr)
+        throw sheet::AutomationError("CountA of a foreign range");
+    return block->CountValues();
 }
 
 std::shared_ptr<sheet::CellRange> Sheet::UsedRange()

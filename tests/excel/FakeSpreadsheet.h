@@ -64,6 +64,11 @@ public:
     std::vector<std::string>* log = nullptr;
 };
 
+class Functions : public sheet::WorksheetFunction {
+public:
+    double CountA(const std::shared_ptr<sheet::CellRange>& range) override;
+};
+
 class Application : public sheet::Application, public sheet::Workbooks, public std::enable_shared_from_this<Application> {
 public:
     // A workbook the application opens for `path` (the file must exist too, the parser checks).
@@ -71,6 +76,7 @@ public:
 
     void Visible(bool visible) override;
     std::shared_ptr<sheet::Workbooks> Workbooks() override { return shared_from_this(); }
+    std::shared_ptr<sheet::WorksheetFunction> WorksheetFunction() override { return std::make_shared<Functions>(); }
     std::string Version() override;
     void Quit() override;
     std::shared_ptr<sheet::Workbook> Open(const std::string& path) override;

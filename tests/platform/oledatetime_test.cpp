@@ -44,3 +44,23 @@ TEST(OleDateTime, UnixSecondsRoundTrip)
     EXPECT_EQ(COleDateTime::FromUnixSeconds(1614834367).Format("%Y-%m-%d %H:%M:%S"), "2021-03-04 05:06:07");
     EXPECT_EQ(COleDateTime::FromUnixSeconds(-86400 * 365).Format("%Y-%m-%d"), "1969-01-01");
 }
+
+// A year has four digits in every date text, the years 100 to 999 too ("%Y" alone would give
+// three); "%%Y" stays a literal.
+TEST(OleDateTime, YearsAlwaysHaveFourDigits)
+{
+    struct Case {
+        int year;
+        const char* format;
+        const char* text;
+    } cases[] = {
+        {100, "%Y/%m/%d %H:%M:%S", "0100/01/02 03:04:05"},
+        {999, "%Y-%m-%d", "0999-01-02"},
+        {1000, "%Y", "1000"},
+        {9999, "%d.%m.%Y", "02.01.9999"},
+        {100, "%%Y %Y%%", "%Y 0100%"},
+    };
+    for (const Case& c : cases)
+        EXPECT_EQ(COleDateTime(c.year, 1, 2, 3, 4, 5).Format(c.format), c.text) << c.year << " " << c.format;
+    EXPECT_EQ(COleDateTime(-657434.0).Format("%Y/%m/%d"), "0100/01/01");
+}

@@ -273,3 +273,53 @@ TEST(SpreadsheetApplication, CellBudgetBoundsWhatIsHeldEvenAfterRereading)
     EXPECT_EQ(ws->UsedRange()->Count(), 300); // the used range still counts every row
     EXPECT_THROW(ws->Range("A250")->Text(), AutomationError);
 }
+
+// CountA counts the cells holding a value (an empty text too, a blank cell not) in any block: from
+// the per-column counts when the block spans every used row, from the held rows when it lies in
+// them, and by reading the file once more otherwise. Every way gives the same answer.
+TEST(SpreadsheetApplication, CountAOfABlockWhereverItLies)
+{
+    XlsxBuilder book(sheettest::TempFile("counted.xlsx"));
+    lxw_worksheet* sheet = book.AddSheet("Counted");
+    for (int row = 2; row <= 300; ++row) {
+        book.Number(sheet, row, 1, row);
+        if (row % 6 == 0)
+            book.FormulaText(sheet, row, 2, "=\"\"", ""); // an empty text
+        else if (row % 3 == 0)
+            book.Text(sheet, row, 2, "x");
+        if (row % 10 == 0)
+            book.Blank(sheet, row, 3, "0.00");
+    }
+    const std::string path = book.Close();
+
+    struct Case {
+        const char* from;
+        const char* to;
+        double values;
+    } cases[] = {
+        {"A2", "A300", 299},  {"A1", "A1048576", 299}, {"B2", "B300", 100}, // every used row
+        {"C2", "C300", 0},    {"A2", "C300", 399},     {"D1", "D300", 0},
+        {"A1", "B10", 12},    {"B3", "B3", 1},         {"B6", "B6", 1},     // held rows (an empty text counts)
+        {"A250", "B299", 66}, {"B290", "C300", 4},     {"A301", "C400", 0}, // beyond the held rows
+    };
+    for (int window : {20, 1000}) {
+        auto app = StartWithWindow(window);
+        auto ws = FirstSheet(app, path);
+        auto functions = app->WorksheetFunction();
+        for (const Case& c : cases)
+            EXPECT_EQ(functions->CountA(ws->Range(c.from, c.to)), c.values) << c.from << ":" << c.to << " window " << window;
+    }
+}
+
+TEST(SpreadsheetApplication, RangesTellWhereTheyLieAndHowLarge)
+{
+    auto app = StartWithWindow();
+    auto used = FirstSheet(app, MakeSeriesWorkbook())->UsedRange();
+    EXPECT_EQ(used->Row(), 1);
+    EXPECT_EQ(used->Column(), 3);
+    EXPECT_EQ(used->RowCount(), 8);
+    EXPECT_EQ(used->ColumnCount(), 3);
+    app->Quit();
+    EXPECT_THROW(used->RowCount(), AutomationError);
+    EXPECT_THROW(app->WorksheetFunction(), AutomationError);
+}

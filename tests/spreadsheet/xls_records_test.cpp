@@ -65,6 +65,20 @@ TEST_F(RecordsWorkbook, FormulaCellsGiveTheirLastResult)
     EXPECT_EQ(Text("E4"), "");
 }
 
+TEST(XlsRecords, AnEmptyFormulaResultIsMarkedAsMissing)
+{
+    WorkbookReader reader;
+    ASSERT_TRUE(reader.Open(DataFile("records.xls"))) << reader.Error();
+    std::vector<int> marked;
+    ASSERT_TRUE(reader.ReadRows(1, [&](int row, const std::vector<RowCell>& cells) {
+        for (const RowCell& cell : cells)
+            if (cell.formulaWithoutResult)
+                marked.push_back(row * 100 + cell.column);
+        return true;
+    })) << reader.Error();
+    EXPECT_EQ(marked, std::vector<int>{405}); // E4; A4 to D4 hold results
+}
+
 TEST_F(RecordsWorkbook, FormattedBlanksWidenTheUsedRangeButAnEmbeddedChartDoesNot)
 {
     auto used = sheet->UsedRange();

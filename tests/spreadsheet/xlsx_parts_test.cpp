@@ -112,6 +112,40 @@ TEST(XlsxCells, EveryTypeGivesItsValue)
     }
 }
 
+// Tools that do not calculate write formulas without their result (openpyxl: <f>..</f><v></v>):
+// such a cell reads as the empty text, marked; a cell without a value and formula is blank.
+TEST(XlsxCells, CellsWithoutAStoredValue)
+{
+    struct Case {
+        const char* xml;
+        Variant::Type type;
+        const char* text;
+        bool withoutResult;
+    } cases[] = {
+        {"<c r=\"A1\"><f>B1+C1</f><v></v></c>", Variant::Text, "", true},
+        {"<c r=\"A1\"><f>B1+C1</f></c>", Variant::Text, "", true},
+        {"<c r=\"A1\" t=\"n\"><f>B1</f><v> </v></c>", Variant::Text, "", true},
+        {"<c r=\"A1\" t=\"b\"><f>TRUE()</f><v/></c>", Variant::Text, "", true},
+        {"<c r=\"A1\" t=\"e\"><f>1/0</f><v></v></c>", Variant::Text, "", true},
+        {"<c r=\"A1\" t=\"d\"><f>TODAY()</f><v></v></c>", Variant::Text, "", true},
+        {"<c r=\"A1\"><f t=\"shared\" si=\"0\"/><v></v></c>", Variant::Text, "", true},
+        {"<c r=\"A1\" t=\"str\"><f>\"\"</f><v></v></c>", Variant::Text, "", true},
+        {"<c r=\"A1\" t=\"str\"><f>A2</f><v>x</v></c>", Variant::Text, "x", false},
+        {"<c r=\"A1\"><f>A2</f><v>3</v></c>", Variant::Number, "", false},
+        {"<c r=\"A1\" s=\"1\"><v></v></c>", Variant::Empty, "", false},
+        {"<c r=\"A1\" s=\"1\" t=\"b\"><v/></c>", Variant::Empty, "", false},
+        {"<c r=\"A1\" s=\"1\" t=\"s\"><v></v></c>", Variant::Empty, "", false},
+        {"<c r=\"A1\" s=\"1\" t=\"d\"><v> </v></c>", Variant::Empty, "", false},
+    };
+    for (const Case& c : cases) {
+        SheetFixture sheet;
+        const ImportedCell cell = sheet.One(c.xml);
+        EXPECT_EQ(cell.type, c.type) << c.xml;
+        EXPECT_EQ(cell.text, c.text) << c.xml;
+        EXPECT_EQ(cell.formulaWithoutResult, c.withoutResult) << c.xml;
+    }
+}
+
 TEST(XlsxCells, NumbersAreReadCorrectlyRounded)
 {
     struct Case {
