@@ -18,11 +18,6 @@ constexpr unsigned kLongestBody = 8224;
 // The part of the stream held at a time; a record with its header always fits.
 constexpr std::size_t kWindowBytes = 256 * 1024;
 
-// Windows-1252 differs from Latin-1 only in 0x80-0x9F; its five holes stay as they are.
-constexpr char16_t kWindows1252High[32] = {
-    0x20AC, 0x0081, 0x201A, 0x0192, 0x201E, 0x2026, 0x2020, 0x2021, 0x02C6, 0x2030, 0x0160, 0x2039, 0x0152, 0x008D, 0x017D, 0x008F,
-    0x0090, 0x2018, 0x2019, 0x201C, 0x201D, 0x2022, 0x2013, 0x2014, 0x02DC, 0x2122, 0x0161, 0x203A, 0x0153, 0x009D, 0x017E, 0x0178};
-
 // Code pages whose bytes read as Windows-1252: itself, US-ASCII, Latin-1, and the UTF-16 that
 // BIFF8 workbooks declare (their byte texts are Latin-1).
 bool ReadsAsWindows1252(unsigned codePage)
@@ -169,8 +164,7 @@ void BiffCursor::ReadCodePageBytes(unsigned count, unsigned codePage, std::u16st
             continue;
         if (!ReadsAsWindows1252(codePage))
             throw ForeignCodePage{codePage};
-        if (c < 0xA0)
-            c = kWindows1252High[c - 0x80];
+        c = static_cast<char16_t>(text::Windows1252Character(static_cast<unsigned char>(c)));
     }
 }
 

@@ -3,6 +3,7 @@
 #include "TestWorkbooks.h"
 
 #include "platform/spreadsheet/SpreadsheetApplication.h"
+#include "tests/support/ScopedEnv.h"
 
 #include <gtest/gtest.h>
 
@@ -10,33 +11,10 @@
 
 using namespace sheet;
 using sheettest::XlsxBuilder;
+using testsupport::ScopedEnv;
 
 namespace {
 
-class ScopedEnv {
-public:
-    ScopedEnv(const char* name, const char* value) : m_name(name)
-    {
-        if (const char* old = std::getenv(name))
-            m_old = old, m_had = true;
-        if (value != nullptr)
-            setenv(name, value, 1);
-        else
-            unsetenv(name);
-    }
-    ~ScopedEnv()
-    {
-        if (m_had)
-            setenv(m_name, m_old.c_str(), 1);
-        else
-            unsetenv(m_name);
-    }
-
-private:
-    const char* m_name;
-    std::string m_old;
-    bool m_had = false;
-};
 
 // Sheet 1: a title row, names in row 2, dates and values from row 3, starting in column C.
 std::string MakeSeriesWorkbook()
@@ -85,8 +63,8 @@ std::string TextAt(Worksheet& sheet, const std::string& address)
 
 TEST(SpreadsheetApplication, StartsInvisibleWithDefaultVersion)
 {
-    ScopedEnv presence("VELMORA_SPREADSHEET", nullptr);
-    ScopedEnv version("VELMORA_SPREADSHEET_VERSION", nullptr);
+    ScopedEnv presence("VELMORA_SPREADSHEET", std::nullopt);
+    ScopedEnv version("VELMORA_SPREADSHEET_VERSION", std::nullopt);
     auto app = CreateApplication();
     ASSERT_NE(app, nullptr);
     app->Visible(false);
