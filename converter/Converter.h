@@ -36,6 +36,10 @@ std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& p
 std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* spec);
 std::unique_ptr<SeriesWriter> MakeWriter(Format format);
 
+// Why the item selection `items` (positions from 0, in output order) cannot be taken from a file
+// of `count` items: an item named twice or one beyond the file's. Empty when it can.
+std::string SelectionProblem(const CUIntArray& items, size_t count);
+
 // True when the engine would convert `file` with this template: its extension suits the format and
 // the reader accepts its header and its first data row. `reason` (may be null) says why not.
 bool CanConvert(Format format, const std::string& file, const std::string& templatePath, std::string* reason);
@@ -59,7 +63,6 @@ struct FileReport {
     size_t itemsInFile = 0;
     size_t itemsWritten = 0;
     std::string firstStamp, lastStamp;
-    std::vector<std::string> notes; // things the log should mention on a converted file
     Problem problem;                // why not, when not converted
 };
 
