@@ -33,7 +33,7 @@ RunPlan::RunPlan(const JobSetup& setup, const std::string& logPath)
     const Format out = static_cast<Format>(setup.outputFormat);
     if (setup.inputType == 1)
         m_files.push_back({setup.inputFile, setup.outputFile, {}, false});
-    else
+    else if (setup.inputType == 2 && !setup.inputFolder.empty())
         ListFolder(setup, in, out);
 
     for (const PlannedFile& file : m_files)

@@ -79,12 +79,17 @@ int ReadArguments(int argc, char** argv, Arguments& arguments)
     return -1;
 }
 
+// The stop signals the program was not started to ignore (nohup, a background job), and the signal
+// that ends the wait.
 sigset_t WaitedSignals()
 {
     sigset_t set;
     sigemptyset(&set);
-    for (int signal : kStopSignals)
-        sigaddset(&set, signal);
+    for (int signal : kStopSignals) {
+        struct sigaction current {};
+        if (::sigaction(signal, nullptr, &current) == 0 && current.sa_handler != SIG_IGN)
+            sigaddset(&set, signal);
+    }
     sigaddset(&set, kRunOverSignal);
     return set;
 }
@@ -111,7 +116,8 @@ std::unique_ptr<converter::ConversionLog> OpenLog(const converter::JobSetup& set
 // Runs the job on a thread of its own while this thread waits for the end of the run or a stop
 // signal. The signals are taken here, in ordinary code rather than a handler, so that the list of
 // part files to remove can grow without limit: a stopped run removes every unfinished output.
-int RunUntilStopped(const converter::JobSetup& setup, converter::ConversionLog& log, const converter::JobOptions& options)
+int RunUntilStopped(const converter::JobSetup& setup, converter::ConversionLog& log, const converter::JobOptions& options,
+                    const sigset_t& waited)
 {
     std::atomic<bool> over{false};
     int status = converter::kExitSetup;
@@ -125,7 +131,6 @@ int RunUntilStopped(const converter::JobSetup& setup, converter::ConversionLog& 
         over = true;
         ::pthread_kill(waiter, kRunOverSignal);
     });
-    const sigset_t waited = WaitedSignals();
     while (true) {
         int signal = 0;
         if (::sigwait(&waited, &signal) != 0 || (signal == kRunOverSignal && !over))
@@ -167,7 +172,7 @@ int main(int argc, char** argv)
             return converter::kExitSetup;
         }
         std::unique_ptr<converter::ConversionLog> log = OpenLog(setup);
-        return RunUntilStopped(setup, *log, {arguments.threads, arguments.quiet ? nullptr : stderr});
+        return RunUntilStopped(setup, *log, {arguments.threads, arguments.quiet ? nullptr : stderr}, waited);
     } catch (const std::exception& e) {
         std::fprintf(stderr, "Velmora: stopped: %s\n", text::EscapeControls(e.what()).c_str());
         return converter::kExitSetup;

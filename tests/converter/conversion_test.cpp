@@ -274,12 +274,7 @@ TEST(ConversionJob, FolderConvertsTheRestAndReportsTheMisfit)
         convtest::WriteFile(folder.Path(std::string("in/") + name), kSample);
     convtest::WriteFile(folder.Path("in/misfit.txt"), "Undefined[Undefined]:Instantaneous\nT\tA\n2020/01/01\n");
     convtest::WriteFile(folder.Path("in/ignored.dat"), "whatever");
-    JobSetup setup;
-    setup.inputType = 2;
-    setup.inputFormat = 2;
-    setup.inputFolder = folder.Path("in");
-    setup.outputFormat = 1;
-    setup.outputFolder = folder.Path("out");
+    const JobSetup setup = convtest::AsciiFolderToRbx0(folder);
     ConversionLog log(folder.Path("run.log"), nullptr);
     EXPECT_EQ(RunJob(setup, log, {2, nullptr}), kExitSomeFailed);
     for (const char* name : {"a.rbx0", "b.rbx0", "c.rbx0"})

@@ -153,12 +153,7 @@ TEST(RunPlan, TwoInputsGivingOneOutputAndOutputsThatCannotBeWrittenAreRefused)
         convtest::WriteFile(folder.Path(name), "x\n");
     ::mkfifo(folder.Path("out/c.rbx0").c_str(), 0600);
     fs::create_directories(folder.Path("out/d.rbx0"));
-    JobSetup setup;
-    setup.inputType = 2;
-    setup.inputFormat = 2;
-    setup.inputFolder = folder.Path("in");
-    setup.outputFormat = 1;
-    setup.outputFolder = folder.Path("out");
+    const JobSetup setup = convtest::AsciiFolderToRbx0(folder);
     const RunPlan plan(setup, folder.Path("out/b.rbx0"));
     const std::vector<PlannedFile>& files = plan.Files();
     ASSERT_EQ(files.size(), 5u);

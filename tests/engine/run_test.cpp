@@ -90,6 +90,8 @@ TEST(TemporarySetupFile, IsRemovedWhenTheProcessIsStoppedBySignal)
         if (child == 0) {
             if (hostHandler)
                 std::signal(SIGINT, [](int) { s_hostSaw = 1; });
+            else
+                std::signal(SIGINT, SIG_DFL); // the test may run where interrupts are ignored
             TemporarySetupFile file(folder.Path() + "/", "Setup.wpx", "x");
             ::raise(SIGINT);
             ::_exit(file.Created() && s_hostSaw == 1 && ::access(path.c_str(), F_OK) != 0 ? 7 : 8);
