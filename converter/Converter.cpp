@@ -230,7 +230,7 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     if (Status created = output.Create(); !created)
         return Refuse(report, created, true);
     std::unique_ptr<SeriesWriter> writer = MakeWriter(job.outputFormat);
-    if (Status begun = writer->Begin(output.TemporaryPath(), header, job.title); !begun)
+    if (Status begun = writer->Begin(output.WriterPath(), header, job.title); !begun)
         return Refuse(report, Status::Fail(job.output, 0, begun.problem().message), true);
 
     Row row;

@@ -99,6 +99,8 @@ OutputFile::~OutputFile()
     registry.paths.erase(m_temporary);
     if (!m_committed)
         ::unlink(m_temporary.c_str());
+    if (m_fd >= 0)
+        ::close(m_fd);
 }
 
 Status OutputFile::Create()
@@ -114,8 +116,10 @@ Status OutputFile::Create()
         const std::string path = folder.empty() ? name : sys::JoinPath(folder, name);
         const int fd = ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0666);
         if (fd >= 0) {
-            ::close(fd);
+            m_fd = fd;
             m_temporary = path;
+            const std::string byDescriptor = "/proc/self/fd/" + std::to_string(fd);
+            m_writerPath = ::access(byDescriptor.c_str(), W_OK) == 0 ? byDescriptor : path;
             registry.paths.insert(path);
             return Status::Ok();
         }
@@ -132,12 +136,16 @@ Status OutputFile::Commit()
     std::lock_guard<std::mutex> lock(registry.mutex);
     if (registry.stopping)
         return Status::Fail(m_final, 0, "the run is stopping");
+    struct stat written {}, named {};
+    if (::fstat(m_fd, &written) != 0 || ::lstat(m_temporary.c_str(), &named) != 0 || written.st_dev != named.st_dev ||
+        written.st_ino != named.st_ino)
+        return Status::Fail(m_final, 0, "the part file " + m_temporary + " was replaced while the output was written");
     struct stat old {};
     if (::lstat(m_final.c_str(), &old) == 0) {
         if (!S_ISREG(old.st_mode))
             return Status::Fail(m_final, 0, std::string("it is ") + sys::Describe(sys::KindOf(m_final)) +
                                                 " now; only a regular file is replaced");
-        ::chmod(m_temporary.c_str(), old.st_mode & 0777);
+        ::fchmod(m_fd, old.st_mode & 0777);
     }
     if (std::rename(m_temporary.c_str(), m_final.c_str()) != 0)
         return Status::Fail(m_final, 0, std::string("cannot move the finished output into place: ") + std::strerror(errno));

@@ -20,11 +20,16 @@ public:
 
     // Creates the part file in the final file's folder, exclusively and never through a link.
     Status Create();
-    // Where the writer writes; empty until Create succeeds.
+    // The part file's name beside the final file; empty until Create succeeds.
     const std::string& TemporaryPath() const { return m_temporary; }
+    // Where the writer opens the part file: the file this object created, through its open
+    // descriptor (/proc/self/fd/N), so that whatever may take its name in the folder meanwhile (a
+    // link planted there) is never written through. The part file's name when /proc is missing.
+    const std::string& WriterPath() const { return m_writerPath; }
     const std::string& FinalPath() const { return m_final; }
     // Renames the part file over the final path. Only a regular file is replaced (it keeps its
-    // permission bits); anything else standing there by now is left alone and the commit fails.
+    // permission bits); anything else standing there by now is left alone and the commit fails, as
+    // it does when the part file's name no longer names the file this object created.
     Status Commit();
 
     // Removes every part file being written and refuses new ones and commits from then on: the
@@ -38,6 +43,8 @@ public:
 private:
     std::string m_final;
     std::string m_temporary;
+    std::string m_writerPath;
+    int m_fd = -1; // the part file, open from its creation to the end
     bool m_committed = false;
 };
 

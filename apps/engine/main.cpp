@@ -14,6 +14,7 @@
 #include <exception>
 #include <memory>
 #include <pthread.h>
+#include <sys/resource.h>
 #include <string>
 #include <thread>
 #include <unistd.h>
@@ -160,6 +161,11 @@ int main(int argc, char** argv)
     ::pthread_sigmask(SIG_BLOCK, &waited, nullptr);
     // A closed standard error must not end a run in the middle of a file.
     std::signal(SIGPIPE, SIG_IGN);
+    // Each file converting holds three descriptors (input, output, part file); many threads need many.
+    if (rlimit files {}; ::getrlimit(RLIMIT_NOFILE, &files) == 0 && files.rlim_cur < files.rlim_max) {
+        files.rlim_cur = files.rlim_max;
+        ::setrlimit(RLIMIT_NOFILE, &files);
+    }
 
     // The engine runs unattended: nothing it calls may wait for a person.
     ui::SilentUserInterface silent;

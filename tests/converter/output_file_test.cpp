@@ -69,6 +69,24 @@ TEST(OutputFile, ACommitDoesNotReplaceWhatIsNoLongerARegularFile)
     EXPECT_TRUE(Hidden(folder.Root()).empty()) << "the part file goes with the object";
 }
 
+TEST(OutputFile, ALinkPlantedAtThePartFilesNameIsNeverWrittenThroughNorMovedIntoPlace)
+{
+    convtest::ScratchFolder folder;
+    const std::string victim = folder.Path("victim.txt");
+    convtest::WriteFile(victim, "someone's file");
+    const std::string final = folder.Path("out.txt");
+    OutputFile output(final);
+    ASSERT_TRUE(output.Create());
+    fs::remove(output.TemporaryPath());
+    fs::create_symlink(victim, output.TemporaryPath());
+    convtest::WriteFile(output.WriterPath(), "converted"); // as a writer does
+    EXPECT_EQ(convtest::ReadFile(victim), "someone's file");
+    const Status committed = output.Commit();
+    EXPECT_FALSE(committed);
+    EXPECT_NE(committed.problem().message.find("was replaced"), std::string::npos) << committed.problem().message;
+    EXPECT_FALSE(fs::exists(final));
+}
+
 TEST(OutputFile, ANameTooLongForThePartFileIsShortenedAndAMissingFolderSaysWhy)
 {
     convtest::ScratchFolder folder;
