@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <cstring>
 #include <set>
+#include <sys/stat.h>
 
 namespace converter {
 
@@ -27,7 +28,14 @@ std::string FolderOfOutput(const std::string& output)
 
 } // namespace
 
-RunPlan::RunPlan(const JobSetup& setup, const std::string& logPath)
+RunPlan::RunPlan(const JobSetup& setup, const std::string& logPath) : RunPlan(setup, logPath, true) {}
+
+std::string RunPlan::FileTheRunReads(const JobSetup& setup, const std::string& path)
+{
+    return RunPlan(setup, std::string(), false).ReadFileAt(path);
+}
+
+RunPlan::RunPlan(const JobSetup& setup, const std::string& logPath, bool judgeOutputs)
 {
     const Format in = static_cast<Format>(setup.inputFormat);
     const Format out = static_cast<Format>(setup.outputFormat);
@@ -41,7 +49,8 @@ RunPlan::RunPlan(const JobSetup& setup, const std::string& logPath)
     Protect(setup.templateName, "the template");
     Protect(setup.setupFile, "the setup file");
     Protect(logPath, "the log file", true);
-    JudgeOutputs();
+    if (judgeOutputs)
+        JudgeOutputs();
 }
 
 void RunPlan::ListFolder(const JobSetup& setup, Format in, Format out)
@@ -76,7 +85,11 @@ void RunPlan::JudgeOutputs()
 {
     std::map<std::string, std::string> claimedBy; // the input first giving each output, by identity key
     for (PlannedFile& file : m_files) {
-        const std::string key = sys::IdentityKey(file.output);
+        // One look at what stands there: its kind, and who it is when it exists.
+        struct stat st {};
+        const bool exists = ::stat(file.output.c_str(), &st) == 0;
+        const std::string key = exists ? "file " + std::to_string(st.st_dev) + ":" + std::to_string(st.st_ino)
+                                       : sys::IdentityKeyIn(FolderOf(file.output).resolved, sys::FileTitle(file.output));
         const auto [claim, first] = claimedBy.emplace(key, file.input);
         if (!file.refusal.empty())
             continue;
@@ -86,29 +99,36 @@ void RunPlan::JudgeOutputs()
         else if (!first)
             refusal = "its output " + file.output + " is also the output of " + claim->second;
         else
-            refusal = PlaceRefusal(file.output);
+            refusal = PlaceRefusal(file.output, sys::KindOf(file.output));
         file.refusal = refusal;
         file.outputRefused = !refusal.empty();
     }
 }
 
-std::string RunPlan::PlaceRefusal(const std::string& output)
+const RunPlan::OutputFolder& RunPlan::FolderOf(const std::string& output)
 {
-    const sys::EntryKind kind = sys::KindOf(output);
+    const std::string folder = FolderOfOutput(output);
+    auto [found, fresh] = m_folders.emplace(folder, OutputFolder());
+    if (fresh) {
+        found->second.resolved = sys::ResolvedFolder(folder);
+        if (const std::string why = sys::WhyNotWritable(folder); !why.empty())
+            found->second.refusal = "in the folder " + folder + ": " + why;
+        found->second.maxName = sys::MaxNameLength(folder);
+    }
+    return found->second;
+}
+
+std::string RunPlan::PlaceRefusal(const std::string& output, sys::EntryKind kind)
+{
     if (kind != sys::EntryKind::Missing && kind != sys::EntryKind::Regular)
         return "its output " + output + " is " + sys::Describe(kind) + "; only a regular file is replaced";
-    const std::string folder = FolderOfOutput(output);
-    auto [cached, fresh] = m_folderRefusal.emplace(folder, std::string());
-    if (fresh) {
-        if (const std::string why = sys::WhyNotWritable(folder); !why.empty())
-            cached->second = "cannot write its output " + output + " in the folder " + folder + ": " + why;
-    }
-    if (!cached->second.empty())
-        return cached->second;
+    const OutputFolder& folder = FolderOf(output);
+    if (!folder.refusal.empty())
+        return "cannot write its output " + output + " " + folder.refusal;
     const size_t length = sys::FileTitle(output).size();
-    if (const size_t longest = sys::MaxNameLength(folder); length > longest)
-        return "cannot write its output " + output + ": " + std::strerror(ENAMETOOLONG) + " (" +
-               std::to_string(length) + " bytes; the file system takes " + std::to_string(longest) + ")";
+    if (length > folder.maxName)
+        return "cannot write its output " + output + ": " + std::strerror(ENAMETOOLONG) + " (" + std::to_string(length) +
+               " bytes; the file system takes " + std::to_string(folder.maxName) + ")";
     if (kind == sys::EntryKind::Regular) {
         if (const std::string why = sys::WhyNotWritable(output); !why.empty())
             return "cannot replace its output " + output + ": " + why;

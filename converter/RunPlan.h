@@ -4,6 +4,7 @@
 // an output (an input of the run, the template, the setup file, the log), because two inputs would
 // write the same file, or because the file cannot be written there.
 #include "converter/Converter.h"
+#include "platform/system/FileSystem.h"
 
 #include <map>
 #include <string>
@@ -26,6 +27,9 @@ public:
     // and judges the outputs. `logPath` is where the log goes, empty for standard error. The setup's
     // formats must be valid.
     RunPlan(const JobSetup& setup, const std::string& logPath);
+    // What `path` is to the run of `setup` when it names a file the run reads, as ReadFileAt says;
+    // the outputs are not judged.
+    static std::string FileTheRunReads(const JobSetup& setup, const std::string& path);
 
     const std::vector<PlannedFile>& Files() const { return m_files; }
     // The folders outputs will be written to, each once.
@@ -39,16 +43,24 @@ private:
         std::string text; // "the input file /data/a.txt"
         bool isLog = false;
     };
+    // What every output in one folder shares, found out once.
+    struct OutputFolder {
+        std::string resolved; // absolute, links resolved
+        std::string refusal;  // why this user cannot write there, or empty
+        size_t maxName = 0;
+    };
 
+    RunPlan(const JobSetup& setup, const std::string& logPath, bool judgeOutputs);
     void ListFolder(const JobSetup& setup, Format in, Format out);
     void Protect(const std::string& path, const std::string& what, bool isLog = false);
     void JudgeOutputs();
-    // Why `output` cannot be written where it is, or empty.
-    std::string PlaceRefusal(const std::string& output);
+    const OutputFolder& FolderOf(const std::string& output);
+    // Why `output`, of this kind, cannot be written where it is, or empty.
+    std::string PlaceRefusal(const std::string& output, sys::EntryKind kind);
 
     std::vector<PlannedFile> m_files;
-    std::map<std::string, Role> m_protected;            // by identity key
-    std::map<std::string, std::string> m_folderRefusal; // why a folder cannot be written to, by folder
+    std::map<std::string, Role> m_protected;          // by identity key
+    std::map<std::string, OutputFolder> m_folders;    // by the folder as spelled
 };
 
 } // namespace converter

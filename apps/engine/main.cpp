@@ -102,7 +102,7 @@ std::unique_ptr<converter::ConversionLog> OpenLog(const converter::JobSetup& set
     const std::string path = converter::LogPathFor(setup.logFile);
     if (path.empty())
         return std::make_unique<converter::ConversionLog>(std::string(), stderr);
-    if (const std::string what = converter::RunPlan(setup, path).ReadFileAt(path); !what.empty()) {
+    if (const std::string what = converter::RunPlan::FileTheRunReads(setup, path); !what.empty()) {
         std::fprintf(stderr, "Velmora: the log file is %s: not appended to; logging to standard error\n",
                      text::EscapeControls(what).c_str());
         return std::make_unique<converter::ConversionLog>(std::string(), stderr);

@@ -101,10 +101,21 @@ std::string IdentityKey(const std::string& path)
     struct stat st {};
     if (!path.empty() && ::stat(path.c_str(), &st) == 0)
         return "file " + std::to_string(st.st_dev) + ":" + std::to_string(st.st_ino);
+    const std::string folder = FolderOf(path);
+    return IdentityKeyIn(ResolvedFolder(folder.empty() ? "." : folder), FileTitle(path));
+}
+
+std::string IdentityKeyIn(const std::string& resolvedFolder, const std::string& name)
+{
+    return "path " + JoinPath(resolvedFolder, name);
+}
+
+std::string ResolvedFolder(const std::string& folder)
+{
     std::error_code error;
-    const std::filesystem::path absolute = std::filesystem::absolute(path, error);
+    const std::filesystem::path absolute = std::filesystem::absolute(folder, error);
     const std::filesystem::path resolved = std::filesystem::weakly_canonical(absolute, error);
-    return "path " + (error ? absolute.lexically_normal() : resolved).string();
+    return (error ? absolute.lexically_normal() : resolved).string();
 }
 
 std::string WhyNotWritable(const std::string& path)

@@ -39,6 +39,10 @@ const char* Describe(EntryKind kind);
 // and inode (links followed), one that does not exist yet by its absolute path with the links of
 // its folders resolved. Equal keys name the same file.
 std::string IdentityKey(const std::string& path);
+// The same for a path known not to exist, given its folder already resolved (ResolvedFolder).
+std::string IdentityKeyIn(const std::string& resolvedFolder, const std::string& name);
+// `folder` made absolute with its links resolved, as far as it exists.
+std::string ResolvedFolder(const std::string& folder);
 
 // Empty when the user running this (effective ids) may write to `path`; else the system's reason.
 // For a folder this means creating and removing entries in it.
