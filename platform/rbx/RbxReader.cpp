@@ -6,6 +6,7 @@
 #include "platform/system/Text.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <cmath>
 #include <cstring>
 #include <sys/stat.h>
@@ -86,9 +87,11 @@ bool CRbxReader::Open(const CString& path, VerifyChecksum verify)
     m_strError.clear();
     State& s = *m_state;
     s.file.reset(std::fopen(path.c_str(), "rb"));
+    if (!s.file)
+        return Fail(std::string("cannot open the file for reading: ") + std::strerror(errno));
     struct stat info {};
-    if (!s.file || fstat(fileno(s.file.get()), &info) != 0 || !S_ISREG(info.st_mode))
-        return Fail("cannot open the file for reading");
+    if (fstat(fileno(s.file.get()), &info) != 0 || !S_ISREG(info.st_mode))
+        return Fail("cannot open the file for reading: it is not a regular file");
     s.fileSize = static_cast<std::uint64_t>(info.st_size);
     return ReadHeader(verify);
 }
