@@ -1,7 +1,10 @@
 #include "converter/ConversionJob.h"
 
+#include "converter/OutputFile.h"
+#include "converter/RunPlan.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/OleDateTime.h"
+#include "platform/system/Text.h"
 #include "platform/wpx/Wpx.h"
 #include "resources/StringTable.h"
 #include "templates/Specification.h"
@@ -11,6 +14,8 @@
 #include <cerrno>
 #include <chrono>
 #include <cstring>
+#include <limits>
+#include <system_error>
 #include <thread>
 
 namespace converter {
@@ -18,21 +23,20 @@ namespace converter {
 namespace {
 
 constexpr const char* kLogFileName = "Velmora.log";
+constexpr size_t kItemsShownInHeader = 20;
 
+// The selection as the run's first log line gives it: a long one by its start and its length.
 std::string Join(const CUIntArray& items)
 {
     std::string text;
-    for (unsigned item : items)
-        text += (text.empty() ? "" : ",") + std::to_string(item);
+    for (size_t n = 0; n < items.size() && n < kItemsShownInHeader; ++n)
+        text += (text.empty() ? "" : ",") + std::to_string(items[n]);
+    if (items.size() > kItemsShownInHeader)
+        text += ",... (" + std::to_string(items.size()) + " in all)";
     return text.empty() ? "all" : text;
 }
 
-std::string BaseName(const std::string& path)
-{
-    const std::string title = sys::FileTitle(path);
-    const size_t dot = title.rfind('.');
-    return dot == std::string::npos || dot == 0 ? title : title.substr(0, dot);
-}
+std::string Escaped(const std::string& text) { return text::EscapeControls(text); }
 
 // Paces progress lines: at most one a second over all files.
 class Progress {
@@ -47,7 +51,7 @@ public:
         if (now - m_last < std::chrono::seconds(1))
             return;
         m_last = now;
-        std::fprintf(m_out, "Velmora: %s: %llu rows, %.1f MB read\n", sys::FileTitle(file).c_str(),
+        std::fprintf(m_out, "Velmora: %s: %llu rows, %.1f MB read\n", Escaped(sys::FileTitle(file)).c_str(),
                      static_cast<unsigned long long>(rows), static_cast<double>(bytes) / 1e6);
         std::fflush(m_out);
     }
@@ -57,42 +61,6 @@ private:
     std::mutex m_mutex;
     std::chrono::steady_clock::time_point m_last;
 };
-
-struct PlannedFile {
-    std::string input;
-    std::string output;
-    std::string refusal; // why it is not even tried
-};
-
-std::vector<PlannedFile> PlanFolder(const JobSetup& setup, Format in, Format out)
-{
-    std::vector<PlannedFile> plan;
-    std::optional<std::vector<std::string>> names = sys::ListFolder(setup.inputFolder);
-    if (!names)
-        return plan;
-    std::sort(names->begin(), names->end());
-    std::vector<std::string> outputs;
-    for (const std::string& name : *names) {
-        const std::string path = sys::JoinPath(setup.inputFolder, name);
-        std::optional<sys::FileAttributes> attributes = sys::GetAttributes(path);
-        if (!attributes || attributes->directory || attributes->hidden || attributes->temporary)
-            continue;
-        PlannedFile file;
-        file.input = path;
-        file.output = sys::JoinPath(setup.outputFolder, BaseName(path) + OutputExtension(out));
-        if (!attributes->readable)
-            file.refusal = "the file cannot be read (permission)";
-        else if (!AcceptsExtension(in, path))
-            continue; // not a file of the input format: not part of the conversion
-        else if (std::find(outputs.begin(), outputs.end(), file.output) != outputs.end())
-            file.refusal = "its output " + file.output + " is the output of an earlier file of the folder";
-        else if (file.output == file.input)
-            file.refusal = "its output would replace the input file itself";
-        outputs.push_back(file.output);
-        plan.push_back(file);
-    }
-    return plan;
-}
 
 } // namespace
 
@@ -110,6 +78,7 @@ bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
         wpxClose(&doc);
         return false;
     }
+    setup.setupFile = path;
     WPXHANDLE input = wpxSectionByNameNum(target, "INPUT", 1);
     wpxGetParam(input, "Type", &setup.inputType, 1, 1);
     wpxGetParam(input, "File_format", &setup.inputFormat, 1, 1);
@@ -123,8 +92,13 @@ bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
     WPXHANDLE items = wpxKeywordByNameNum(templ, "Items", 1);
     for (int n = 1; n <= wpxGetNoParams(items); ++n) {
         const int item = wpxGetInt(wpxParamByNum(items, n));
-        if (item >= 0)
-            setup.items.push_back(static_cast<unsigned>(item));
+        if (item < 0) {
+            error = path + ": Items entry " + std::to_string(n) + " is " + std::to_string(item) +
+                    ", not an item position (numbered from 0)";
+            wpxClose(&doc);
+            return false;
+        }
+        setup.items.push_back(static_cast<unsigned>(item));
     }
 
     WPXHANDLE output = wpxSectionByNameNum(target, "OUTPUT", 1);
@@ -143,6 +117,8 @@ std::string CheckJobSetup(const JobSetup& setup)
         return "the input format " + std::to_string(setup.inputFormat) + " is not 1 (rbx0), 2 (ASCII) or 3 (Excel)";
     if (!IsFormat(setup.outputFormat))
         return "the output format " + std::to_string(setup.outputFormat) + " is not 1 (rbx0), 2 (ASCII) or 3 (Excel)";
+    if (std::string problem = SelectionProblem(setup.items, std::numeric_limits<size_t>::max()); !problem.empty())
+        return problem;
     if (setup.inputType == 1) {
         if (setup.inputFile.empty())
             return "no input file is named (INPUT File_name)";
@@ -190,7 +166,7 @@ void ConversionLog::Write(const std::string& entry)
     for (std::FILE* out : {m_file, m_echo}) {
         if (!out)
             continue;
-        std::fputs(entry.c_str(), out);
+        std::fwrite(entry.data(), 1, entry.size(), out);
         if (entry.empty() || entry.back() != '\n')
             std::fputc('\n', out);
         std::fflush(out);
@@ -199,23 +175,21 @@ void ConversionLog::Write(const std::string& entry)
 
 std::string DescribeReport(const FileReport& report)
 {
-    std::string entry;
+    const std::string input = Escaped(report.input);
+    const std::string output = Escaped(report.output);
     if (report.converted) {
-        entry = "converted " + report.input + " -> " + report.output + ": " + std::to_string(report.rows) +
-                " time steps, " + std::to_string(report.itemsWritten) + " of " + std::to_string(report.itemsInFile) +
-                " items";
+        std::string entry = "converted " + input + " -> " + output + ": " + std::to_string(report.rows) + " time steps, " +
+                            std::to_string(report.itemsWritten) + " of " + std::to_string(report.itemsInFile) + " items";
         if (report.rows > 0)
             entry += ", " + report.firstStamp + " to " + report.lastStamp;
         entry += "\n";
-    } else {
-        entry = std::string(report.templateFits ? "FAILED " : "SKIPPED ") + report.input + ": " +
-                (report.templateFits ? "" : "the template does not fit: ") + report.problem.Describe() + "\n";
-        entry += "  no output written; " + (report.output.empty() ? std::string("-") : report.output) +
-                 " left as it was\n";
+        for (const std::string& note : report.notes)
+            entry += "  note: " + Escaped(note) + "\n";
+        return entry;
     }
-    for (const std::string& note : report.notes)
-        entry += "  note: " + note + "\n";
-    return entry;
+    return std::string(report.templateFits ? "FAILED " : "SKIPPED ") + input + ": " +
+           (report.templateFits ? "" : "the template does not fit: ") + Escaped(report.problem.Describe()) + "\n" +
+           "  no output written; " + (output.empty() ? std::string("-") : output) + " left as it was\n";
 }
 
 int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
@@ -224,27 +198,28 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
     const Format in = static_cast<Format>(setup.inputFormat);
     const Format out = static_cast<Format>(setup.outputFormat);
     log.Write("run " + COleDateTime::GetCurrentTime().Format("%Y-%m-%d %H:%M:%S") + ": " + FormatName(in) + " " +
-              (setup.inputType == 2 ? "folder " + setup.inputFolder : "file " + setup.inputFile) + " -> " +
-              FormatName(out) + " " + (setup.inputType == 2 ? "folder " + setup.outputFolder : "file " + setup.outputFile) +
-              "; template " + (setup.templateName.empty() ? "(defaults)" : setup.templateName) + "; items " +
-              Join(setup.items));
+              Escaped(setup.inputType == 2 ? "folder " + setup.inputFolder : "file " + setup.inputFile) + " -> " +
+              FormatName(out) + " " +
+              Escaped(setup.inputType == 2 ? "folder " + setup.outputFolder : "file " + setup.outputFile) + "; template " +
+              (setup.templateName.empty() ? "(defaults)" : Escaped(setup.templateName)) + "; items " + Join(setup.items));
     if (!problem.empty()) {
-        log.Write("setup error: " + problem + "\nresult: nothing converted; exit status 3");
+        log.Write("setup error: " + Escaped(problem) + "\nresult: nothing converted; exit status 3");
         return kExitSetup;
     }
 
     Status loaded;
     std::unique_ptr<CSpecification> spec = LoadTemplate(in, setup.templateName, loaded);
     if (!loaded) {
-        log.Write("setup error: " + loaded.problem().Describe() + "\nresult: nothing converted; exit status 3");
+        log.Write("setup error: " + Escaped(loaded.problem().Describe()) + "\nresult: nothing converted; exit status 3");
         return kExitSetup;
     }
 
-    std::vector<PlannedFile> plan;
-    if (setup.inputType == 1)
-        plan.push_back({setup.inputFile, setup.outputFile, {}});
-    else
-        plan = PlanFolder(setup, in, out);
+    // Every output is known and judged before the first is written.
+    const RunPlan runPlan(setup, LogPathFor(setup.logFile));
+    const std::vector<PlannedFile>& plan = runPlan.Files();
+    for (const std::string& folder : runPlan.OutputFolders())
+        for (const std::string& leftover : OutputFile::RemoveStaleTemporaries(folder))
+            log.Write("note: removed " + Escaped(leftover) + ", left by a run that was stopped");
 
     std::vector<FileReport> reports(plan.size());
     Progress progress(options.progress);
@@ -258,7 +233,8 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
             FileReport& report = reports[index];
             if (!file.refusal.empty()) {
                 report.input = file.input;
-                report.problem = Problem{file.input, 0, 0, file.refusal};
+                report.output = file.output;
+                report.problem = Problem{{}, 0, 0, file.refusal}; // the entry names the input already
             } else {
                 FileJob job{in, file.input, spec.get(), setup.items, out, file.output, setup.title};
                 report = ConvertFile(job, [&](std::uint64_t rows, std::uint64_t bytes) {
@@ -270,9 +246,22 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
     };
     unsigned threads = options.threads ? options.threads : std::max(1u, std::thread::hardware_concurrency());
     threads = static_cast<unsigned>(std::min<size_t>(threads, std::max<size_t>(1, plan.size())));
+    // The workers begin together once all exist: with many threads, the thread making them would
+    // otherwise get its turn on the processors only after every worker already converting.
+    std::atomic<bool> begin{false};
     std::vector<std::thread> workers;
-    for (unsigned t = 1; t < threads; ++t)
-        workers.emplace_back(work);
+    for (unsigned t = 1; t < threads; ++t) {
+        try {
+            workers.emplace_back([&] {
+                begin.wait(false);
+                work();
+            });
+        } catch (const std::system_error&) {
+            break; // the system gives no more threads: the ones there are convert every file
+        }
+    }
+    begin = true;
+    begin.notify_all();
     work();
     for (std::thread& worker : workers)
         worker.join();

@@ -31,11 +31,13 @@ struct JobSetup {
     std::string outputFolder;
     std::string title;
     std::string logFile;
+    std::string setupFile; // the file the setup was read from
 };
 
 // Reads the setup file; false with `error` ("file:line: ...") when it cannot be read.
 bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error);
-// Why the setup cannot run, or empty when it can.
+// Why the setup cannot run, or empty when it can. An output problem is not one: it refuses only the
+// files it concerns (see RunPlan).
 std::string CheckJobSetup(const JobSetup& setup);
 
 // Where the log goes: "Log_file" as a file; inside it as "Velmora.log" when it names a folder (an
@@ -69,7 +71,8 @@ struct JobOptions {
 // Runs the whole setup and returns the exit status.
 int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options = {});
 
-// The log entry of one file.
+// The log entry of one file. Control characters in names and messages are escaped, so each line of
+// the entry is one line of the log.
 std::string DescribeReport(const FileReport& report);
 
 } // namespace converter

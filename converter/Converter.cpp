@@ -16,6 +16,7 @@
 
 #include <cstdio>
 #include <exception>
+#include <unordered_map>
 
 namespace converter {
 
@@ -140,6 +141,21 @@ std::unique_ptr<SeriesWriter> MakeWriter(Format format, const std::string& outpu
     return nullptr;
 }
 
+std::string SelectionProblem(const CUIntArray& items, size_t count)
+{
+    std::unordered_map<unsigned, size_t> firstEntry;
+    for (size_t entry = 1; entry <= items.size(); ++entry) {
+        const unsigned item = items[entry - 1];
+        if (item >= count)
+            return "Items entry " + std::to_string(entry) + " names item " + std::to_string(item) + ", but the file has " +
+                   std::to_string(count) + " items (numbered from 0)";
+        if (auto [seen, fresh] = firstEntry.emplace(item, entry); !fresh)
+            return "Items names item " + std::to_string(item) + " twice (entries " + std::to_string(seen->second) +
+                   " and " + std::to_string(entry) + ")";
+    }
+    return {};
+}
+
 bool CanConvert(Format format, const std::string& file, const std::string& templatePath, std::string* reason)
 {
     auto refuse = [&](const std::string& why) {
@@ -172,8 +188,9 @@ bool CanConvert(Format format, const std::string& file, const std::string& templ
 
 namespace {
 
-// The header of the selected items, and notes on selected positions the file does not have.
-std::vector<size_t> ResolveSelection(const CUIntArray& items, size_t count, std::vector<std::string>& notes)
+// The selected item positions, all of the file's when none is selected; empty with `problem` set
+// when the selection names an item twice or one the file does not have.
+std::vector<size_t> ResolveSelection(const CUIntArray& items, size_t count, std::string& problem)
 {
     std::vector<size_t> selection;
     if (items.empty()) {
@@ -181,13 +198,9 @@ std::vector<size_t> ResolveSelection(const CUIntArray& items, size_t count, std:
             selection.push_back(i);
         return selection;
     }
-    for (unsigned item : items) {
-        if (item < count)
-            selection.push_back(item);
-        else
-            notes.push_back("selected item " + std::to_string(item) + " passed over: the file has " +
-                            std::to_string(count) + " items (numbered from 0)");
-    }
+    problem = SelectionProblem(items, count);
+    if (problem.empty())
+        selection.assign(items.begin(), items.end());
     return selection;
 }
 
@@ -204,9 +217,12 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     if (Status opened = reader->Open(job.input); !opened)
         return Refuse(report, opened, !throughTemplate);
     report.itemsInFile = reader->Header().items.size();
-    const std::vector<size_t> selection = ResolveSelection(job.items, report.itemsInFile, report.notes);
+    std::string selectionProblem;
+    const std::vector<size_t> selection = ResolveSelection(job.items, report.itemsInFile, selectionProblem);
+    if (!selectionProblem.empty())
+        return Refuse(report, Status::Fail(job.input, 0, selectionProblem), true);
     if (selection.empty())
-        return Refuse(report, Status::Fail(job.input, 0, "none of the selected items is in the file"), false);
+        return Refuse(report, Status::Fail(job.input, 0, "the file has no items"), false);
     reader->Select(selection);
     SeriesHeader header;
     header.timeTitle = reader->Header().timeTitle;
@@ -215,8 +231,10 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     report.itemsWritten = header.items.size();
 
     OutputFile output(job.output);
+    if (Status created = output.Create(); !created)
+        return Refuse(report, created, true);
     std::unique_ptr<SeriesWriter> writer = MakeWriter(job.outputFormat, job.output);
-    if (Status begun = writer->Begin(output.TemporaryPath(), header, job.title); !begun)
+    if (Status begun = writer->Begin(output.WriterPath(), header, job.title); !begun)
         return Refuse(report, Status::Fail(job.output, 0, begun.problem().message), true);
 
     Row row;

@@ -38,6 +38,10 @@ std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* sp
 // other an .xlsx package.
 std::unique_ptr<SeriesWriter> MakeWriter(Format format, const std::string& output);
 
+// Why the item selection `items` (positions from 0, in output order) cannot be taken from a file
+// of `count` items: an item named twice or one beyond the file's. Empty when it can.
+std::string SelectionProblem(const CUIntArray& items, size_t count);
+
 // True when the engine would convert `file` with this template: its extension suits the format and
 // the reader accepts its header and its first data row. `reason` (may be null) says why not.
 bool CanConvert(Format format, const std::string& file, const std::string& templatePath, std::string* reason);

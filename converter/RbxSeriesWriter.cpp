@@ -5,7 +5,9 @@
 #include "platform/system/Text.h"
 #include "platform/units/Units.h"
 
+#include <cerrno>
 #include <cstdio>
+#include <cstring>
 
 namespace converter {
 
@@ -47,7 +49,7 @@ Status RbxSeriesWriter::Begin(const std::string& path, const SeriesHeader& heade
     // every step time is a whole number of seconds.
     std::FILE* probe = std::fopen(path.c_str(), "wb");
     if (!probe)
-        return Status::Fail(path, 0, "cannot create the file");
+        return Status::Fail(path, 0, std::string("cannot create the file: ") + std::strerror(errno));
     std::fclose(probe);
     return Status::Ok();
 }

@@ -1,6 +1,13 @@
 #include "engine/Engine.h"
 
-#include <algorithm>
+#include "platform/system/Text.h"
+
+namespace {
+
+// Room for the extension and a number within the 255 bytes a file name may have.
+constexpr size_t kMaxEngineNameBytes = 200;
+
+} // namespace
 
 CEngine::~CEngine()
 {
@@ -31,6 +38,15 @@ CString CEngine::EngineFileName() const
 {
     CString name;
     GetSetupName(name);
-    std::replace(name.begin(), name.end(), ' ', '_');
-    return name + ".wpx";
+    for (char& c : name) {
+        const unsigned char byte = static_cast<unsigned char>(c);
+        // Blanks as the toolbox always wrote them; separators and control characters so that the
+        // name stays one file name inside the temporary folder.
+        if (c == ' ' || c == '/' || c == '\\' || byte < 0x20 || byte == 0x7F)
+            c = '_';
+    }
+    // A name of dots would mean the folder or its parent, and a leading dot hides the file.
+    for (size_t i = 0; i < name.size() && name[i] == '.'; ++i)
+        name[i] = '_';
+    return text::CutUtf8(name, kMaxEngineNameBytes) + ".wpx";
 }

@@ -29,7 +29,9 @@ public:
     // it, deletes the file; returns the program's result.
     int LaunchEngine();
     // The name of the temporary setup file: the setup name with blanks turned into underscores,
-    // followed by ".wpx".
+    // followed by ".wpx". What could make it more than one name inside the temporary folder is
+    // made safe too: separators, control characters and leading dots become underscores, and a
+    // name longer than 200 bytes is cut.
     CString EngineFileName() const;
     // "Template_name" as it is stored: the template object's save file once the template is
     // being modified or made by hand, else the chosen template name.

@@ -1,13 +1,19 @@
 // Running the tool: verify, hand the setup to the engine program in a temporary file, report.
 #include "engine/Engine.h"
+#include "engine/TemporarySetupFile.h"
 #include "platform/system/FileSystem.h"
+#include "platform/system/Text.h"
 #include "platform/ui/UserInterface.h"
 #include "resources/StringTable.h"
+
+#include <cstdio>
 
 namespace {
 
 constexpr unsigned kTempPathBuffer = 260;
 constexpr const char* kEngineProgram = "Velmora.exe";
+// The run's result when the engine could not be started: there was no setup file to give it.
+constexpr int kNoSetupFile = 126;
 
 int OutcomeMessageId(int result, int inputType)
 {
@@ -16,15 +22,15 @@ int OutcomeMessageId(int result, int inputType)
     return inputType == 1 ? res::IDS_ERROR_RUNNING_ENGINE : res::IDS_FOLDER_FILES_SKIPPED;
 }
 
-// The temporary folder followed by `name`; the bare name (current folder) when the folder is
-// unknown or longer than the buffer the toolbox allows.
-CString TemporaryPath(const CString& name)
+// The temporary folder, ending in "/"; empty (the current folder) when it is unknown or longer than
+// the buffer the toolbox allows.
+std::string TemporaryFolder()
 {
     std::string folder;
     unsigned length = sys::GetTempPath(kTempPathBuffer, folder);
     if (length == 0 || length >= kTempPathBuffer)
-        return name;
-    return folder + name;
+        return {};
+    return folder;
 }
 
 } // namespace
@@ -47,12 +53,14 @@ int CEngine::LaunchEngine()
     wpxAddTarget(document, "VELMORA");
     WriteSetupSections(document);
     wpxEndSection(document);
-
-    CString path = TemporaryPath(EngineFileName());
-    wpxWrite(document, path);
+    const std::string content = wpxFormat(document);
     wpxClose(&document);
 
-    int result = RunEngine(kEngineProgram, path, 1);
-    sys::DeleteFile(path);
-    return result;
+    const TemporarySetupFile file(TemporaryFolder(), EngineFileName(), content);
+    if (!file.Created()) {
+        // Never start the engine on a file this run did not write.
+        std::fprintf(stderr, "Velmora: %s\n", text::EscapeControls(file.Error()).c_str());
+        return kNoSetupFile;
+    }
+    return RunEngine(kEngineProgram, file.Path(), 1);
 }

@@ -1,6 +1,8 @@
 // velmora check DOC: holds the setup stored in a parameter document against the real files, the way
 // the wizard does before it lets the user go on, and prints one verdict per check.
 #include "apps/velmora/Commands.h"
+#include "converter/ConversionJob.h"
+#include "converter/RunPlan.h"
 #include "engine/Engine.h"
 #include "platform/bridge/BridgeVerdict.h"
 #include "platform/system/FileSystem.h"
@@ -33,7 +35,10 @@ void PrintHelp()
         "            file of the input folder\n"
         "  preview   the preview parser reads the input file (or the folder's first fitting file)\n"
         "  output    the output file name is valid and has an extension the output format accepts, or\n"
-        "            the output folder exists\n"
+        "            the output folder exists; and the engine program would write every output: none\n"
+        "            is an input, the template, the setup document or the log, or the output of two\n"
+        "            inputs, or anything but a regular file, and this user may write it (the log too\n"
+        "            must not be a file the run reads)\n"
         "Checks that depend on a failed one are reported as failed too.\n\n"
         "Exit status: 0 when every check passes, 1 when one fails or DOC holds no setup, 2 for bad usage.\n");
 }
@@ -109,7 +114,9 @@ CheckResult CheckTemplate(CEngine& engine)
     CString message;
     if (engine.VerifyTemplate(option, templatePath, message))
         return {"template", true, "the template " + Quoted(templatePath) + " loads and fits the input"};
-    if (message.empty() && engine.m_nInputType == 1)
+    if (!message.empty())
+        return {"template", false, message + " (" + Quoted(templatePath) + ")"};
+    if (engine.m_nInputType == 1)
         message = BridgeReason(engine, templatePath);
     return {"template", false, message};
 }
@@ -130,20 +137,64 @@ CheckResult CheckPreview(CEngine& engine)
     return {"preview", false, engine.m_pParser->m_strFailure};
 }
 
-CheckResult CheckOutput(CEngine& engine)
+// The setup as the engine program would take it, with the document as its setup file.
+converter::JobSetup JobSetupOf(const CEngine& engine, const std::string& document)
 {
-    CString message;
-    if (engine.VerifyOutput(engine.m_nOutputFormat, engine.m_strOutputFile, engine.m_strOutputFolder,
-                            engine.m_strOutputTitle, message))
-        return {"output", true,
-                engine.m_nInputType == 1 ? "the output file " + Quoted(engine.m_strOutputFile) + " is acceptable"
-                                         : "the output folder " + Quoted(engine.m_strOutputFolder) + " exists"};
-    if (message.empty())
-        message = text::Format("the output format %d is not 1 (rbx0), 2 (ASCII) or 3 (Excel)", engine.m_nOutputFormat);
-    return {"output", false, message};
+    converter::JobSetup job;
+    job.inputType = engine.m_nInputType;
+    job.inputFormat = engine.m_nInputFormat;
+    job.inputFile = engine.m_strInputFile;
+    job.inputFolder = engine.m_strInputFolder;
+    job.templateOption = engine.m_nTemplateOption;
+    job.templateName = engine.m_strTemplateName;
+    job.items = engine.m_arrItems;
+    job.outputFormat = engine.m_nOutputFormat;
+    job.outputFile = engine.m_strOutputFile;
+    job.outputFolder = engine.m_strOutputFolder;
+    job.title = engine.m_strOutputTitle;
+    engine.GetLogFileDir(job.logFile);
+    job.setupFile = document;
+    return job;
 }
 
-std::vector<CheckResult> RunChecks(CEngine& engine)
+// What the engine program would refuse to write, judged by the plan it makes before writing.
+CString PlanRefusal(const CEngine& engine, const std::string& document)
+{
+    const converter::JobSetup job = JobSetupOf(engine, document);
+    const std::string logPath = converter::LogPathFor(job.logFile);
+    const converter::RunPlan plan(job, logPath);
+    size_t refused = 0;
+    CString first;
+    for (const converter::PlannedFile& file : plan.Files())
+        if (file.outputRefused && refused++ == 0)
+            first = file.input + ": " + file.refusal;
+    if (refused > 1)
+        first += text::Format(" (and %zu more output%s refused)", refused - 1, refused > 2 ? "s" : "");
+    if (refused == 0)
+        if (const std::string what = plan.ReadFileAt(logPath); !what.empty())
+            first = "the log file " + Quoted(logPath) + " is " + what + "; the engine would log to standard error";
+    return first;
+}
+
+CheckResult CheckOutput(CEngine& engine, const std::string& document)
+{
+    const bool single = engine.m_nInputType == 1;
+    const CString& named = single ? engine.m_strOutputFile : engine.m_strOutputFolder;
+    CString message;
+    if (!engine.VerifyOutput(engine.m_nOutputFormat, engine.m_strOutputFile, engine.m_strOutputFolder,
+                             engine.m_strOutputTitle, message)) {
+        if (message.empty())
+            return {"output", false,
+                    text::Format("the output format %d is not 1 (rbx0), 2 (ASCII) or 3 (Excel)", engine.m_nOutputFormat)};
+        return {"output", false, message + " (" + Quoted(named) + ")"};
+    }
+    if (const CString refusal = PlanRefusal(engine, document); !refusal.empty())
+        return {"output", false, refusal};
+    return {"output", true,
+            single ? "the output file " + Quoted(named) + " is acceptable" : "the output folder " + Quoted(named) + " exists"};
+}
+
+std::vector<CheckResult> RunChecks(CEngine& engine, const std::string& document)
 {
     std::vector<CheckResult> results;
     const CheckResult input = CheckInput(engine);
@@ -166,7 +217,7 @@ std::vector<CheckResult> RunChecks(CEngine& engine)
             results.push_back({"template", false, "not tried: the input check failed"});
         results.push_back({"preview", false, "not tried: the input check failed"});
     }
-    results.push_back(CheckOutput(engine));
+    results.push_back(CheckOutput(engine, document));
     return results;
 }
 
@@ -184,7 +235,7 @@ int Check(int argc, char** argv)
     WPXHANDLE document = nullptr;
     CString error;
     if (!wpxRead(argv[1], &document, &error)) {
-        std::fprintf(stderr, "velmora check: %s\n", error.c_str());
+        std::fprintf(stderr, "velmora check: %s\n", text::EscapeControls(error).c_str());
         return host::kFailed;
     }
     CEngine engine;
@@ -194,12 +245,14 @@ int Check(int argc, char** argv)
         std::fprintf(stderr,
                      "velmora check: %s: no setup; expected a target holding a section \"Setup\" or the sections "
                      "INPUT, TEMPLATE and OUTPUT\n",
-                     argv[1]);
+                     text::EscapeControls(argv[1]).c_str());
         return host::kFailed;
     }
     bool allPassed = true;
-    for (const CheckResult& result : RunChecks(engine)) {
-        std::printf("%s %s: %s\n", result.passed ? "PASS" : "FAIL", result.name, result.message.c_str());
+    for (const CheckResult& result : RunChecks(engine, argv[1])) {
+        // Names from the setup and the files are shown escaped: one line a check, whatever they hold.
+        std::printf("%s %s: %s\n", result.passed ? "PASS" : "FAIL", result.name,
+                    text::EscapeControls(result.message).c_str());
         allPassed = allPassed && result.passed;
     }
     return allPassed ? host::kSuccess : host::kFailed;

@@ -1,6 +1,7 @@
 // velmora run DOC [--silent]: runs the tool on the setup stored in a parameter document.
 #include "apps/velmora/Commands.h"
 #include "apps/velmora/Plugin.h"
+#include "platform/system/Text.h"
 
 #include <cstdio>
 #include <cstring>
@@ -41,12 +42,12 @@ int Run(int argc, char** argv)
     std::string error;
     std::unique_ptr<host::Plugin> plugin = host::Plugin::Load(error);
     if (!plugin) {
-        std::fprintf(stderr, "velmora run: %s\n", error.c_str());
+        std::fprintf(stderr, "velmora run: %s\n", text::EscapeControls(error).c_str());
         return host::kFailed;
     }
     int handle = plugin->LoadDocument(document, error);
     if (!handle) {
-        std::fprintf(stderr, "velmora run: %s\n", error.c_str());
+        std::fprintf(stderr, "velmora run: %s\n", text::EscapeControls(error).c_str());
         return host::kFailed;
     }
     plugin->SetWpxHandle(handle);

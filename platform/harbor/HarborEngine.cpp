@@ -5,7 +5,8 @@
 #include <cerrno>
 #include <cstdlib>
 #include <signal.h>
-#include <spawn.h>
+#include <pthread.h>
+#include <sys/prctl.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -67,6 +68,26 @@ int WaitFor(pid_t child)
     return kCannotStart;
 }
 
+// In the child between fork and exec: only calls that are safe there. Handlers the host set are
+// reset first, so that no signal in this short time runs host code in the child; the engine is
+// tied to the life of the thread that started it, so it stops when the host dies, however it dies.
+[[noreturn]] void ExecEngine(const char* path, char* const argv[], pid_t host, const sigset_t& hostMask)
+{
+    struct sigaction defaultAction {};
+    defaultAction.sa_handler = SIG_DFL;
+    for (int signal = 1; signal < NSIG; ++signal) {
+        struct sigaction current {};
+        if (::sigaction(signal, nullptr, &current) == 0 && current.sa_handler != SIG_IGN && current.sa_handler != SIG_DFL)
+            ::sigaction(signal, &defaultAction, nullptr);
+    }
+    ::prctl(PR_SET_PDEATHSIG, SIGTERM);
+    if (::getppid() != host)
+        ::_exit(kCannotStart); // the host is already gone
+    ::pthread_sigmask(SIG_SETMASK, &hostMask, nullptr);
+    ::execve(path, argv, environ);
+    ::_exit(errno == ENOENT ? kProgramNotFound : kCannotStart);
+}
+
 } // namespace
 
 void CHarborEngine::SetDataDepDefaultValues() {}
@@ -113,8 +134,15 @@ int CHarborEngine::RunEngine(CString program, CString setupFile, int flag)
         return kProgramNotFound;
     CString flagText = std::to_string(flag);
     char* argv[] = {path.data(), setupFile.data(), flagText.data(), nullptr};
-    pid_t child = 0;
-    if (::posix_spawn(&child, path.c_str(), nullptr, nullptr, argv, environ) != 0)
+    const pid_t host = ::getpid();
+    sigset_t all, hostMask;
+    sigfillset(&all);
+    ::pthread_sigmask(SIG_SETMASK, &all, &hostMask);
+    const pid_t child = ::fork();
+    if (child == 0)
+        ExecEngine(path.c_str(), argv, host, hostMask);
+    ::pthread_sigmask(SIG_SETMASK, &hostMask, nullptr);
+    if (child < 0)
         return kCannotStart;
     return WaitFor(child);
 }

@@ -7,6 +7,7 @@
 #include "platform/system/FileSystem.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <cmath>
 #include <cstring>
 #include <sys/stat.h>

@@ -7,6 +7,7 @@
 #include "platform/units/Units.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <cmath>
 #include <cstring>
 
@@ -156,9 +157,9 @@ bool CRbxWriter::Open(const CString& path, const FileDefinition& definition)
 
     s.file.reset(std::fopen(path.c_str(), "wb"));
     if (!s.file)
-        return Fail("cannot create the file");
+        return Fail(std::string("cannot create the file: ") + std::strerror(errno));
     if (std::fwrite(s.headerBytes.data(), 1, s.headerBytes.size(), s.file.get()) != s.headerBytes.size())
-        return Fail("cannot write the header");
+        return Fail(std::string("cannot write the header: ") + std::strerror(errno));
     return true;
 }
 
@@ -234,7 +235,7 @@ bool CRbxWriter::FlushBuffer()
     s.crc = Crc32(s.crc, s.buffer.get(), s.used);
     const bool ok = std::fwrite(s.buffer.get(), 1, s.used, s.file.get()) == s.used;
     s.used = 0;
-    return ok || Fail("cannot write the data (disk full?)");
+    return ok || Fail(std::string("cannot write the data: ") + std::strerror(errno));
 }
 
 bool CRbxWriter::WriteStep(double time, const double* values)
@@ -299,7 +300,7 @@ bool CRbxWriter::PatchHeader()
     rbx::PatchHeader(s.headerBytes, s.header);
     if (std::fseek(s.file.get(), 0, SEEK_SET) != 0
         || std::fwrite(s.headerBytes.data(), 1, s.headerBytes.size(), s.file.get()) != s.headerBytes.size())
-        return Fail("cannot complete the header");
+        return Fail(std::string("cannot complete the header: ") + std::strerror(errno));
     return true;
 }
 
@@ -310,7 +311,7 @@ bool CRbxWriter::Close()
     State& s = *m_state;
     bool ok = !s.failed && FlushBuffer() && PatchHeader();
     if (std::fclose(s.file.release()) != 0 && ok)
-        ok = Fail("cannot close the file");
+        ok = Fail(std::string("cannot close the file: ") + std::strerror(errno));
     if (!ok)
         std::remove(s.path.c_str()); // a half-written file would only mislead its readers
     return ok;

@@ -1,10 +1,12 @@
 #include "platform/system/FileSystem.h"
 
 #include <cerrno>
+#include <climits>
 #include <cstdio>
-#include <cstring>
 #include <cstdlib>
+#include <cstring>
 #include <dirent.h>
+#include <filesystem>
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <langinfo.h>
@@ -107,6 +109,74 @@ std::optional<std::int64_t> FileSize(const std::string& path)
 }
 
 bool DeleteFile(const std::string& path) { return !path.empty() && std::remove(path.c_str()) == 0; }
+
+EntryKind KindOf(const std::string& path)
+{
+    struct stat st {};
+    if (path.empty() || ::lstat(path.c_str(), &st) != 0)
+        return EntryKind::Missing;
+    if (S_ISREG(st.st_mode))
+        return EntryKind::Regular;
+    if (S_ISDIR(st.st_mode))
+        return EntryKind::Folder;
+    if (S_ISLNK(st.st_mode))
+        return EntryKind::Link;
+    if (S_ISFIFO(st.st_mode))
+        return EntryKind::Pipe;
+    if (S_ISSOCK(st.st_mode))
+        return EntryKind::Socket;
+    return EntryKind::Device;
+}
+
+const char* Describe(EntryKind kind)
+{
+    switch (kind) {
+    case EntryKind::Missing: return "nothing";
+    case EntryKind::Regular: return "a regular file";
+    case EntryKind::Folder: return "a folder";
+    case EntryKind::Link: return "a symbolic link";
+    case EntryKind::Pipe: return "a named pipe (FIFO)";
+    case EntryKind::Device: return "a device";
+    case EntryKind::Socket: return "a socket";
+    }
+    return "?";
+}
+
+std::string IdentityKey(const std::string& path)
+{
+    struct stat st {};
+    if (!path.empty() && ::stat(path.c_str(), &st) == 0)
+        return "file " + std::to_string(st.st_dev) + ":" + std::to_string(st.st_ino);
+    const std::string folder = FolderOf(path);
+    return IdentityKeyIn(ResolvedFolder(folder.empty() ? "." : folder), FileTitle(path));
+}
+
+std::string IdentityKeyIn(const std::string& resolvedFolder, const std::string& name)
+{
+    return "path " + JoinPath(resolvedFolder, name);
+}
+
+std::string ResolvedFolder(const std::string& folder)
+{
+    std::error_code error;
+    const std::filesystem::path absolute = std::filesystem::absolute(folder, error);
+    const std::filesystem::path resolved = std::filesystem::weakly_canonical(absolute, error);
+    return (error ? absolute.lexically_normal() : resolved).string();
+}
+
+std::string WhyNotWritable(const std::string& path)
+{
+    const int mode = IsDirectory(path) ? W_OK | X_OK : W_OK;
+    if (::faccessat(AT_FDCWD, path.empty() ? "." : path.c_str(), mode, AT_EACCESS) == 0)
+        return {};
+    return std::strerror(errno);
+}
+
+size_t MaxNameLength(const std::string& folder)
+{
+    const long length = ::pathconf(folder.empty() ? "." : folder.c_str(), _PC_NAME_MAX);
+    return length > 0 ? static_cast<size_t>(length) : NAME_MAX;
+}
 
 std::optional<std::vector<std::string>> ListFolder(const std::string& folder)
 {

@@ -33,6 +33,28 @@ bool IsDirectory(const std::string& path);
 std::optional<std::int64_t> FileSize(const std::string& path);
 bool DeleteFile(const std::string& path);
 
+// What stands at a path, links not followed.
+enum class EntryKind { Missing, Regular, Folder, Link, Pipe, Device, Socket };
+EntryKind KindOf(const std::string& path);
+// "a regular file", "a folder", "a symbolic link", "a named pipe (FIFO)", "a device", "a socket",
+// "nothing".
+const char* Describe(EntryKind kind);
+
+// Who a path names, to tell whether two spellings name one file: an existing file by its device
+// and inode (links followed), one that does not exist yet by its absolute path with the links of
+// its folders resolved. Equal keys name the same file.
+std::string IdentityKey(const std::string& path);
+// The same for a path known not to exist, given its folder already resolved (ResolvedFolder).
+std::string IdentityKeyIn(const std::string& resolvedFolder, const std::string& name);
+// `folder` made absolute with its links resolved, as far as it exists.
+std::string ResolvedFolder(const std::string& folder);
+
+// Empty when the user running this (effective ids) may write to `path`; else the system's reason.
+// For a folder this means creating and removing entries in it.
+std::string WhyNotWritable(const std::string& path);
+// The longest file name the folder's file system takes.
+size_t MaxNameLength(const std::string& folder);
+
 // The entries of a folder (names only, without "." and ".."), in the order the system gives them;
 // nothing when the folder cannot be read.
 std::optional<std::vector<std::string>> ListFolder(const std::string& folder);

@@ -250,4 +250,37 @@ void AppendJsonString(std::string& out, std::string_view s)
     out += '"';
 }
 
+std::string CutUtf8(std::string_view s, size_t bytes)
+{
+    std::string cut(s.substr(0, std::min(s.size(), bytes + 3)));
+    CutToLength(cut, bytes);
+    return cut;
+}
+
+std::string EscapeControls(std::string_view s)
+{
+    std::string out;
+    out.reserve(s.size());
+    for (size_t i = 0; i < s.size(); ++i) {
+        const unsigned char c = static_cast<unsigned char>(s[i]);
+        const bool c1 = c == 0xC2 && i + 1 < s.size() && static_cast<unsigned char>(s[i + 1]) >= 0x80 &&
+                        static_cast<unsigned char>(s[i + 1]) <= 0x9F;
+        if (c >= 0x20 && c != 0x7F && !c1) {
+            out += static_cast<char>(c);
+            continue;
+        }
+        switch (c) {
+        case '\n': out += "\\n"; break;
+        case '\r': out += "\\r"; break;
+        case '\t': out += "\\t"; break;
+        case '\0': out += "\\0"; break;
+        default:
+            out += Format("\\x%02X", c);
+            if (c1)
+                out += Format("\\x%02X", static_cast<unsigned char>(s[++i]));
+        }
+    }
+    return out;
+}
+
 } // namespace text

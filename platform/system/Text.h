@@ -55,4 +55,12 @@ size_t AppendUtf16AsUtf8(std::string_view bytes, bool bigEndian, std::string& ou
 // Appends `s` as a JSON string literal, made UTF-8 by ToUtf8 first.
 void AppendJsonString(std::string& out, std::string_view s);
 
+// The longest start of `s` of at most `bytes` bytes that does not cut a UTF-8 sequence.
+std::string CutUtf8(std::string_view s, size_t bytes);
+
+// `s` with every control character written as an escape: \n, \r, \t, \0, else \xHH (DEL and the
+// C1 controls in their UTF-8 form too). A file name or a cell's text then stays on one line of a
+// log or a terminal and cannot pass for a line of its own.
+std::string EscapeControls(std::string_view s);
+
 } // namespace text

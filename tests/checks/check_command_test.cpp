@@ -140,11 +140,43 @@ TEST_F(CheckCommand, AFolderPassesWhenOneOfItsFilesFits)
     setup.templateName = misfit;
     const Outcome outcome = Check(setup);
     EXPECT_EQ(outcome.status, 1);
-    EXPECT_TRUE(HasLine(outcome.output, "FAIL template: " + res::LoadString(res::IDS_TEMPLATE_NO_MATCH)))
+    EXPECT_TRUE(HasLine(outcome.output, "FAIL template: " + res::LoadString(res::IDS_TEMPLATE_NO_MATCH) + " (\"" +
+                                            misfit + "\")"))
         << outcome.output;
 
     setup.outputFolder = scratch / "missing";
-    EXPECT_TRUE(HasLine(Check(setup).output, "FAIL output: " + res::LoadString(res::IDS_FOLDER_INVALID)));
+    EXPECT_TRUE(HasLine(Check(setup).output,
+                        "FAIL output: " + res::LoadString(res::IDS_FOLDER_INVALID) + " (\"" + setup.outputFolder + "\")"));
+}
+
+// Every failing output or template check names what it is about after the wizard's own text.
+TEST_F(CheckCommand, FailingOutputAndTemplateChecksNameTheirFile)
+{
+    const std::string notFolder = scratch.Write("plain.txt", "x");
+    const struct {
+        const char* what;
+        std::string outputFile;
+        std::string templateName;
+        std::string line;
+    } cases[] = {
+        {"an output of another format", scratch / "out/gauge.txt", fitting,
+         "FAIL output: " + res::LoadString(res::IDS_FILE_INVALID) + " (\"" + scratch / "out/gauge.txt" + "\")"},
+        {"an output in a missing folder", scratch / "none/gauge.rbx0", fitting,
+         "FAIL output: " + res::LoadString(res::IDS_FILE_INVALID) + " (\"" + scratch / "none/gauge.rbx0" + "\")"},
+        {"an output in a folder that is a file", notFolder + "/gauge.rbx0", fitting,
+         "FAIL output: " + res::LoadString(res::IDS_FILE_INVALID) + " (\"" + notFolder + "/gauge.rbx0\")"},
+        {"a template in a missing folder", scratch / "out/gauge.rbx0", scratch / "none/t.xml",
+         "FAIL template: the template \"" + scratch / "none/t.xml" + "\" does not load"},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.what);
+        StoredSetup s = setup;
+        s.outputFile = c.outputFile;
+        s.templateName = c.templateName;
+        const Outcome outcome = Check(s);
+        EXPECT_EQ(outcome.status, 1);
+        EXPECT_TRUE(HasLine(outcome.output, c.line)) << outcome.output;
+    }
 }
 
 TEST_F(CheckCommand, InputProblemsUseTheWizardsTexts)

@@ -1,5 +1,6 @@
 #pragma once
 // Scratch folders, small files and templates for the converter tests.
+#include "converter/ConversionJob.h"
 #include "converter/SeriesWriter.h"
 #include "templates/AsciiSpecification.h"
 
@@ -28,6 +29,18 @@ public:
 private:
     std::filesystem::path m_path;
 };
+
+// A run over the ASCII files of <folder>/in into rbx0 files in <folder>/out.
+inline converter::JobSetup AsciiFolderToRbx0(const ScratchFolder& folder)
+{
+    converter::JobSetup setup;
+    setup.inputType = 2;
+    setup.inputFormat = 2;
+    setup.inputFolder = folder.Path("in");
+    setup.outputFormat = 1;
+    setup.outputFolder = folder.Path("out");
+    return setup;
+}
 
 inline void WriteFile(const std::string& path, const std::string& content)
 {

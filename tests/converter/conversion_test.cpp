@@ -55,21 +55,42 @@ TEST(Conversion, TextThroughRbx0AndBackKeepsEverything)
     EXPECT_TRUE(LeftoverTemporaries(folder.Root()).empty());
 }
 
-TEST(Conversion, TextToTextWithSelectionReordersAndNotesMissingItems)
+TEST(Conversion, TextToTextWithSelectionReorders)
 {
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), kSample);
-    FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt"), {2, 0, 9});
+    FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt"), {2, 0});
     ASSERT_TRUE(report.converted) << report.problem.Describe();
     EXPECT_EQ(report.itemsWritten, 2u);
-    ASSERT_EQ(report.notes.size(), 1u);
-    EXPECT_NE(report.notes[0].find("selected item 9"), std::string::npos);
     EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")),
               "Undefined[Undefined]:Instantaneous\tRainfall[mm]:Accumulated\n"
               "Date/time\tOther\tRain\n"
               "2020/01/01 00:00:00\t7\t0.1\n"
               "2020/01/01 00:15:00\t8\t\n"
               "2020/01/01 00:30:00\t9\t0.3\n");
+}
+
+TEST(Conversion, ASelectionNamingAnItemTwiceOrOneTheFileLacksIsRefused)
+{
+    const struct {
+        CUIntArray items;
+        const char* problem;
+    } cases[] = {
+        {{2, 0, 9}, "Items entry 3 names item 9, but the file has 3 items (numbered from 0)"},
+        {{1, 0, 1}, "Items names item 1 twice (entries 1 and 3)"},
+        {{0, 0}, "Items names item 0 twice (entries 1 and 2)"},
+        {{3}, "Items entry 1 names item 3, but the file has 3 items (numbered from 0)"},
+    };
+    convtest::ScratchFolder folder;
+    convtest::WriteFile(folder.Path("in.txt"), kSample);
+    for (const auto& c : cases) {
+        FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt"), c.items);
+        EXPECT_FALSE(report.converted);
+        EXPECT_EQ(report.problem.message, c.problem);
+        EXPECT_FALSE(std::filesystem::exists(folder.Path("out.txt")));
+        EXPECT_EQ(SelectionProblem(c.items, 3), c.problem);
+    }
+    EXPECT_EQ(SelectionProblem({4, 0, 2}, 5), "");
 }
 
 // Through every output kind (Excel output as .xlsx and as .xls) and back to the text.
@@ -254,12 +275,7 @@ TEST(ConversionJob, FolderConvertsTheRestAndReportsTheMisfit)
         convtest::WriteFile(folder.Path(std::string("in/") + name), kSample);
     convtest::WriteFile(folder.Path("in/misfit.txt"), "Undefined[Undefined]:Instantaneous\nT\tA\n2020/01/01\n");
     convtest::WriteFile(folder.Path("in/ignored.dat"), "whatever");
-    JobSetup setup;
-    setup.inputType = 2;
-    setup.inputFormat = 2;
-    setup.inputFolder = folder.Path("in");
-    setup.outputFormat = 1;
-    setup.outputFolder = folder.Path("out");
+    const JobSetup setup = convtest::AsciiFolderToRbx0(folder);
     ConversionLog log(folder.Path("run.log"), nullptr);
     EXPECT_EQ(RunJob(setup, log, {2, nullptr}), kExitSomeFailed);
     for (const char* name : {"a.rbx0", "b.rbx0", "c.rbx0"})

@@ -2,6 +2,7 @@
 // engine's setup file and starts the engine program; the files it leaves are then read back with
 // the converter library.
 #include "converter/Converter.h"
+#include "tests/e2e_convert/RunSupport.h"
 #include "templates/Specification.h"
 #include "tests/support/ScratchLocale.h"
 
@@ -22,21 +23,9 @@ using converter::Format;
 
 namespace {
 
-const std::string kSample = "Rainfall[mm]:Accumulated\tWater Level[m]:Instantaneous\tUndefined[Undefined]:Instantaneous\n"
-                            "Time\tRain\tLevel\tOther\n"
-                            "2020/01/01 00:00:00\t0.1\t1.25\t7\n"
-                            "2020/01/01 00:15:00\t\t1.5\t8\n"
-                            "2020/01/01 00:30:00\t0.3\t\t9\n";
-
-std::string ReadFile(const fs::path& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream s;
-    s << in.rdbuf();
-    return s.str();
-}
-
-void WriteFile(const fs::path& path, const std::string& content) { std::ofstream(path, std::ios::binary) << content; }
+using e2e::kSample;
+using e2e::ReadFile;
+using e2e::WriteFile;
 
 class EndToEnd : public ::testing::Test {
 protected:
@@ -224,14 +213,7 @@ TEST_F(EndToEnd, DamagedInputsFailWithAClearEntry)
 
 TEST_F(EndToEnd, InterruptedEngineLeavesNoPartFile)
 {
-    std::string content = kSample.substr(0, kSample.find("2020"));
-    char line[96];
-    for (long long s = 0; s < 1000000; ++s) {
-        std::snprintf(line, sizeof line, "2020/%02lld/%02lld %02lld:%02lld:%02lld\t%lld\t1\t2\n", 1 + s / 2678400,
-                      1 + s / 86400 % 31, s / 3600 % 24, s / 60 % 60, s % 60, s);
-        content += line;
-    }
-    WriteFile(Path("big.txt"), content);
+    WriteFile(Path("big.txt"), e2e::LargeSample(1000000));
     WriteFile(Path("engine.wpx"), "wpx 1\ntarget \"VELMORA\"\n section \"INPUT\"\n  File_format = 2\n  File_name = file \"big.txt\"\n"
                                   " end\n section \"OUTPUT\"\n  File_format = 2\n  File_name = file \"big.out.txt\"\n  Log_file = file \"engine.log\"\n end\nend\nwpx end\n");
     const std::string engine = std::string(VELMORA_BIN_DIR) + "/Velmora";
