@@ -76,7 +76,7 @@ void Run(benchmark::State& state, converter::Format in, const std::string& input
 {
     const std::string output = (Folder() / (std::string("out") + converter::OutputExtension(out))).string();
     std::unique_ptr<CSpecification> spec;
-    converter::Status status;
+    sys::Status status;
     spec = converter::LoadTemplate(in, "", status);
     const double inputBytes = static_cast<double>(fs::file_size(input));
     for (auto _ : state) {
@@ -99,7 +99,7 @@ void Rbx0ToText(benchmark::State& state)
 {
     const std::string text = MakeText(Rows());
     const std::string rbx0 = (Folder() / "in.rbx0").string();
-    converter::Status status;
+    sys::Status status;
     auto spec = converter::LoadTemplate(converter::Format::Ascii, "", status);
     converter::ConvertFile({converter::Format::Ascii, text, spec.get(), {}, converter::Format::Rbx0, rbx0, ""});
     Run(state, converter::Format::Rbx0, rbx0, converter::Format::Ascii, Rows());

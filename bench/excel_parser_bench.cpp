@@ -126,7 +126,7 @@ void BM_ExcelPreviewTall(benchmark::State& state)
 void BM_ExcelSeriesHeaderWide(benchmark::State& state)
 {
     const std::string path = WriteEngineLayout("wide", 1, static_cast<int>(state.range(0)));
-    converter::Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> spec = converter::LoadTemplate(converter::Format::Excel, "", status);
     for (auto _ : state) {
         std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(converter::Format::Excel, spec.get());

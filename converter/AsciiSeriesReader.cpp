@@ -50,7 +50,7 @@ AsciiSeriesReader::AsciiSeriesReader(const CSpecification& spec)
 {
 }
 
-Status AsciiSeriesReader::Open(const std::string& path)
+sys::Status AsciiSeriesReader::Open(const std::string& path)
 {
     m_path = path;
     m_header = SeriesHeader();
@@ -58,13 +58,13 @@ Status AsciiSeriesReader::Open(const std::string& path)
     m_stampColumn = m_spec.GetDateTimeColumn();
     const CDataDescription& data = m_spec.m_DataDesc;
     if (data.m_nStartRow < 1)
-        return m_status = Status::Fail(path, 0, "the data start row of the template must be 1 or more");
+        return m_status = sys::Status::Fail(path, 0, "the data start row of the template must be 1 or more");
     if (m_stampColumn < 1)
-        return m_status = Status::Fail(path, 0, "the template's date/time option must be 0, 1 or 2");
+        return m_status = sys::Status::Fail(path, 0, "the template's date/time option must be 0, 1 or 2");
 
     m_deleteInUse = data.m_nDeleteValueCheck != 0;
     HeaderLines lines;
-    Status status = ReadHeaderLines(lines);
+    sys::Status status = ReadHeaderLines(lines);
     if (status)
         status = CountItems(lines);
     if (status)
@@ -82,7 +82,7 @@ Status AsciiSeriesReader::Open(const std::string& path)
     Select(all);
 
     // The data pass: a second reading from the start, passing over the header lines.
-    if (Status opened = m_lines.Open(path); !opened)
+    if (sys::Status opened = m_lines.Open(path); !opened)
         return m_status = opened;
     std::string_view skipped;
     for (long row = 1; row < data.m_nStartRow; ++row)
@@ -91,7 +91,7 @@ Status AsciiSeriesReader::Open(const std::string& path)
     return m_status = m_lines.status();
 }
 
-Status AsciiSeriesReader::ReadHeaderLines(HeaderLines& lines)
+sys::Status AsciiSeriesReader::ReadHeaderLines(HeaderLines& lines)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     std::vector<long> rows{data.m_nStartRow};
@@ -108,7 +108,7 @@ Status AsciiSeriesReader::ReadHeaderLines(HeaderLines& lines)
     const long last = *std::max_element(rows.begin(), rows.end());
 
     LineSource source;
-    if (Status opened = source.Open(m_path); !opened)
+    if (sys::Status opened = source.Open(m_path); !opened)
         return opened;
     std::string_view line;
     while (source.LineNumber() < last && source.Next(line))
@@ -121,41 +121,41 @@ Status AsciiSeriesReader::ReadHeaderLines(HeaderLines& lines)
     if (m_deleteInUse)
         m_deleteValue = data.m_nDeleteValueRadio == 1 ? lines.Line(data.m_nDeleteValueRow) : data.m_strDeleteValue;
     if (lines.fileLines < data.m_nStartRow)
-        return Status::Fail(m_path, data.m_nStartRow,
+        return sys::Status::Fail(m_path, data.m_nStartRow,
                             "the file has " + std::to_string(lines.fileLines) +
                                 " lines; the template's data start row is past its end");
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 // The item count from the data start line, and the item name line's agreement with it.
-Status AsciiSeriesReader::CountItems(const HeaderLines& lines)
+sys::Status AsciiSeriesReader::CountItems(const HeaderLines& lines)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     const std::string startLine = lines.Line(data.m_nStartRow);
     m_splitter.Split(startLine);
     const auto& calls = m_splitter.Calls();
     if (calls.front().end == -1 || calls.front().text.size() == startLine.size())
-        return Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_START_ROW_NO_DELIMITER));
+        return sys::Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_START_ROW_NO_DELIMITER));
     const long count = static_cast<long>(calls.size()) - 1 - m_formatColumns;
     if (count < 1)
-        return Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_ITEM_COUNT_WRONG));
+        return sys::Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_ITEM_COUNT_WRONG));
     m_itemCount = static_cast<size_t>(count);
     m_columns = static_cast<int>(calls.size()) - m_formatColumns;
 
     if (data.m_nItemTitleOption != 0)
-        return Status::Ok();
+        return sys::Status::Ok();
     const std::string nameLine = data.m_nItemDescriptionRow < 1 ? std::string() : lines.Line(data.m_nItemDescriptionRow);
     if (nameLine.empty())
-        return Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_ITEM_NAME_LINE_EMPTY));
+        return sys::Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_ITEM_NAME_LINE_EMPTY));
     m_splitter.Split(nameLine);
     if (m_splitter.Calls().front().text.size() == nameLine.size())
-        return Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_ITEM_NAME_LINE_NO_DELIMITER));
+        return sys::Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_ITEM_NAME_LINE_NO_DELIMITER));
     if (count > static_cast<long>(m_splitter.Calls().size()) - 1 - m_formatColumns)
-        return Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
-    return Status::Ok();
+        return sys::Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
+    return sys::Status::Ok();
 }
 
-Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
+sys::Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     if (data.m_nItemTitleOption == 1) {
@@ -165,10 +165,10 @@ Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
                                                                  : data.m_vecItemDefs[i].m_strTitle;
             m_header.items.push_back(item);
         }
-        return Status::Ok();
+        return sys::Status::Ok();
     }
     if (data.m_nItemTitleOption != 0)
-        return Status::Fail(m_path, 0, "the template's item title option must be 0 or 1");
+        return sys::Status::Fail(m_path, 0, "the template's item title option must be 0 or 1");
 
     // Walks the name line column by column, the date/time titles taking W fields at column K.
     const long row = data.m_nItemDescriptionRow;
@@ -184,11 +184,11 @@ Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
     for (int j = 1; j <= m_columns; ++j) {
         if (j != m_stampColumn) {
             if (pos == -1 || pos >= length || next >= calls.size())
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
             const auto& call = calls[next++];
             pos = call.end;
             if (pos == -1)
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
             names.push_back(named(call.text));
             continue;
         }
@@ -201,13 +201,13 @@ Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
         size_t c = restart;
         for (int k = 1; k < m_stampColumn; ++k) {
             if (p == -1)
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_DATETIME_UNPARSABLE));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_DATETIME_UNPARSABLE));
             p = calls[c++].end;
         }
         const size_t titleCall = c;
         for (int w = 0; w < m_formatColumns; ++w) {
             if (p >= length)
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_ITEM_COUNT_WRONG));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_ITEM_COUNT_WRONG));
             if (p != -1)
                 p = calls[c++].end;
         }
@@ -223,19 +223,19 @@ Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
         item.name = i < names.size() ? names[i] : std::string();
         m_header.items.push_back(item);
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
+sys::Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     auto& items = m_header.items;
 
     // Item types and units: `count` fields from the start of their row, no date/time passed over.
-    auto fromRow = [&](long row, int stringId, const char* what, auto cut, auto assign) -> Status {
+    auto fromRow = [&](long row, int stringId, const char* what, auto cut, auto assign) -> sys::Status {
         const std::string line = lines.Line(row);
         if (line.empty())
-            return Status::Fail(m_path, row, res::LoadString(stringId));
+            return sys::Status::Fail(m_path, row, res::LoadString(stringId));
         m_splitter.Split(line);
         size_t taken = 0;
         std::string dropped;
@@ -250,12 +250,12 @@ Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
             assign(items[taken++], std::move(value));
         }
         if (taken < m_itemCount)
-            return Status::Fail(m_path, row,
+            return sys::Status::Fail(m_path, row,
                                 std::string("the ") + what + " row gives " + std::to_string(taken) + " of the " +
                                     std::to_string(m_itemCount) + " items" +
                                     (dropped.empty() ? std::string()
                                                      : "; the item type " + Quote(dropped) + " is not in the unit catalogue"));
-        return Status::Ok();
+        return sys::Status::Ok();
     };
     auto defs = [&](auto assign, auto member) {
         for (size_t i = 0; i < items.size(); ++i)
@@ -268,25 +268,25 @@ Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
     switch (data.m_nUnitTypeOption) {
     case 0: for (auto& item : items) item.type = data.m_strGlobalUnitType; break;
     case 1:
-        if (Status s = fromRow(data.m_nUnitTypeRow, res::IDS_ITEM_TYPE_LINE_EMPTY, "item type", TextBeforeBracket, setType); !s)
+        if (sys::Status s = fromRow(data.m_nUnitTypeRow, res::IDS_ITEM_TYPE_LINE_EMPTY, "item type", TextBeforeBracket, setType); !s)
             return s;
         break;
     case 2: defs(setType, &CItemDefinition::m_strType); break;
-    default: return Status::Fail(m_path, 0, "the template's item type option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's item type option must be 0, 1 or 2");
     }
     switch (data.m_nUnitOption) {
     case 0: for (auto& item : items) item.unit = data.m_strGlobalUnit; break;
     case 1:
-        if (Status s = fromRow(data.m_nUnitRow, res::IDS_UNIT_LINE_EMPTY, "unit", TextInBrackets, setUnit); !s)
+        if (sys::Status s = fromRow(data.m_nUnitRow, res::IDS_UNIT_LINE_EMPTY, "unit", TextInBrackets, setUnit); !s)
             return s;
         break;
     case 2: defs(setUnit, &CItemDefinition::m_strUnit); break;
-    default: return Status::Fail(m_path, 0, "the template's unit option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's unit option must be 0, 1 or 2");
     }
     switch (data.m_nValueTypeOption) {
     case 0:
         if (!IsValueTypeName(data.m_strGlobalValueType))
-            return Status::Fail(m_path, 0, res::LoadString(res::IDS_VALUE_TYPE_INVALID));
+            return sys::Status::Fail(m_path, 0, res::LoadString(res::IDS_VALUE_TYPE_INVALID));
         for (auto& item : items)
             item.valueType = data.m_strGlobalValueType;
         break;
@@ -294,28 +294,28 @@ Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
         const long row = data.m_nValueTypeRow;
         const std::string line = lines.Line(row);
         if (line.empty())
-            return Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_LINE_EMPTY));
+            return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_LINE_EMPTY));
         m_splitter.Split(line);
         const auto& calls = m_splitter.Calls();
         int pos = 0;
         for (size_t i = 0; i < m_itemCount; ++i) {
             if (pos == -1)
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_LINE_SHORT));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_LINE_SHORT));
             pos = calls[i].end;
             std::string name = TextAfterColon(std::string(calls[i].text));
             if (pos != -1 && !IsValueTypeName(name))
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_INVALID) + " " + Quote(name));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_INVALID) + " " + Quote(name));
             items[i].valueType = name;
         }
         break;
     }
     case 2: defs(setValueType, &CItemDefinition::m_strValueType); break;
-    default: return Status::Fail(m_path, 0, "the template's value type option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's value type option must be 0, 1 or 2");
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status AsciiSeriesReader::PrepareStamps()
+sys::Status AsciiSeriesReader::PrepareStamps()
 {
     const CTimeDescription& time = m_spec.m_TimeDesc;
     // Fields joined for reading are separated by blanks; the delimiter also separates the format.
@@ -329,7 +329,7 @@ Status AsciiSeriesReader::PrepareStamps()
         StampFields date;
         date.year = 100;
         if (!DateFormat("YYYY-MM-DD", DateFormat::Reads::Date).Read(time.m_strGlobalDate, date))
-            return Status::Fail(m_path, 0, "the template's global date " + Quote(time.m_strGlobalDate) +
+            return sys::Status::Fail(m_path, 0, "the template's global date " + Quote(time.m_strGlobalDate) +
                                                " is not a date of the form YYYY-MM-DD");
         m_start.year = date.year, m_start.month = date.month, m_start.day = date.day;
         m_format = std::make_unique<DateFormat>(time.m_strTimeFormat, DateFormat::Reads::Time, extra);
@@ -338,17 +338,17 @@ Status AsciiSeriesReader::PrepareStamps()
     case 2: {
         StampFields clock;
         if (!DateFormat("HH:mm:ss", DateFormat::Reads::Time).Read(time.m_strGlobalTime, clock))
-            return Status::Fail(m_path, 0, "the template's global time " + Quote(time.m_strGlobalTime) +
+            return sys::Status::Fail(m_path, 0, "the template's global time " + Quote(time.m_strGlobalTime) +
                                                " is not a time of the form HH:mm:ss");
         m_start.year = 100;
         m_start.hour = clock.hour, m_start.minute = clock.minute, m_start.second = clock.second;
         m_format = std::make_unique<DateFormat>(time.m_strDateFormat, DateFormat::Reads::Date, extra);
         break;
     }
-    default: return Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
     }
     m_stamps = std::make_unique<StampReader>(*m_format, m_start);
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 void AsciiSeriesReader::Select(const std::vector<size_t>& items)

@@ -21,7 +21,7 @@ public:
     // The template must outlive the reader.
     explicit AsciiSeriesReader(const CSpecification& spec);
 
-    Status Open(const std::string& path) override;
+    sys::Status Open(const std::string& path) override;
     bool Next(Row& row) override;
     void Select(const std::vector<size_t>& items) override;
     std::uint64_t BytesConsumed() const override { return m_lines.BytesConsumed(); }
@@ -36,11 +36,11 @@ public:
 
 private:
     struct HeaderLines; // the lines the header rows name, read before the data
-    Status ReadHeaderLines(HeaderLines& lines);
-    Status CountItems(const HeaderLines& lines);
-    Status ReadNames(const HeaderLines& lines);
-    Status ReadTypesUnitsValueTypes(const HeaderLines& lines);
-    Status PrepareStamps();
+    sys::Status ReadHeaderLines(HeaderLines& lines);
+    sys::Status CountItems(const HeaderLines& lines);
+    sys::Status ReadNames(const HeaderLines& lines);
+    sys::Status ReadTypesUnitsValueTypes(const HeaderLines& lines);
+    sys::Status PrepareStamps();
     bool IsDeleted(std::string_view field) const;
     // One data line into `row`; false with m_status set when the line does not fit the template.
     bool ReadDataLine(std::string_view line, Row& row);

@@ -207,7 +207,7 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
         return kExitSetup;
     }
 
-    Status loaded;
+    sys::Status loaded;
     std::unique_ptr<CSpecification> spec = LoadTemplate(in, setup.templateName, loaded);
     if (!loaded) {
         log.Write("setup error: " + Escaped(loaded.problem().Describe()) + "\nresult: nothing converted; exit status 3");
@@ -234,7 +234,7 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
             if (!file.refusal.empty()) {
                 report.input = file.input;
                 report.output = file.output;
-                report.problem = Problem{{}, 0, 0, file.refusal}; // the entry names the input already
+                report.problem = sys::Problem{{}, 0, 0, file.refusal}; // the entry names the input already
             } else {
                 FileJob job{in, file.input, spec.get(), setup.items, out, file.output, setup.title};
                 report = ConvertFile(job, [&](std::uint64_t rows, std::uint64_t bytes) {

@@ -54,7 +54,7 @@ bool LooksLikeText(const std::string& path)
     return text && total > 0;
 }
 
-FileReport Refuse(FileReport report, Status status, bool templateFits)
+FileReport Refuse(FileReport report, sys::Status status, bool templateFits)
 {
     report.converted = false;
     report.templateFits = templateFits;
@@ -100,7 +100,7 @@ bool AcceptsExtension(Format format, const std::string& path)
     return false;
 }
 
-std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& path, Status& status)
+std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& path, sys::Status& status)
 {
     std::unique_ptr<CSpecification> spec;
     if (format == Format::Ascii)
@@ -111,10 +111,10 @@ std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& p
         return nullptr;
     if (!path.empty() && !spec->Load(path)) {
         const std::string why = spec->LastError().empty() ? "it is not a template file" : spec->LastError();
-        status = Status::Fail(path, 0, "cannot load the template: " + why);
+        status = sys::Status::Fail(path, 0, "cannot load the template: " + why);
         return nullptr;
     }
-    status = Status::Ok();
+    status = sys::Status::Ok();
     return spec;
 }
 
@@ -168,14 +168,14 @@ bool CanConvert(Format format, const std::string& file, const std::string& templ
             return refuse(file + ": no such file");
         if (!AcceptsExtension(format, file))
             return refuse(file + ": the extension does not suit " + FormatName(format) + " input");
-        Status status;
+        sys::Status status;
         std::unique_ptr<CSpecification> spec = LoadTemplate(format, templatePath, status);
         if (!status)
             return refuse(status.problem().Describe());
         std::unique_ptr<SeriesReader> reader = MakeReader(format, spec.get());
         if (!reader)
             return refuse(std::string(FormatName(format)) + " input cannot be read by this build");
-        if (Status opened = reader->Open(file); !opened)
+        if (sys::Status opened = reader->Open(file); !opened)
             return refuse(opened.problem().Describe());
         Row row;
         if (!reader->Next(row) && !reader->status())
@@ -211,18 +211,18 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     report.output = job.output;
     std::unique_ptr<SeriesReader> reader = MakeReader(job.inputFormat, job.spec);
     if (!reader)
-        return Refuse(report, Status::Fail(job.input, 0, std::string(FormatName(job.inputFormat)) + " input needs a template"), false);
+        return Refuse(report, sys::Status::Fail(job.input, 0, std::string(FormatName(job.inputFormat)) + " input needs a template"), false);
     // Only a template can fail to fit; an rbx0 file that cannot be opened is damaged.
     const bool throughTemplate = job.inputFormat != Format::Rbx0;
-    if (Status opened = reader->Open(job.input); !opened)
+    if (sys::Status opened = reader->Open(job.input); !opened)
         return Refuse(report, opened, !throughTemplate);
     report.itemsInFile = reader->Header().items.size();
     std::string selectionProblem;
     const std::vector<size_t> selection = ResolveSelection(job.items, report.itemsInFile, selectionProblem);
     if (!selectionProblem.empty())
-        return Refuse(report, Status::Fail(job.input, 0, selectionProblem), true);
+        return Refuse(report, sys::Status::Fail(job.input, 0, selectionProblem), true);
     if (selection.empty())
-        return Refuse(report, Status::Fail(job.input, 0, "the file has no items"), false);
+        return Refuse(report, sys::Status::Fail(job.input, 0, "the file has no items"), false);
     reader->Select(selection);
     SeriesHeader header;
     header.timeTitle = reader->Header().timeTitle;
@@ -231,19 +231,19 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     report.itemsWritten = header.items.size();
 
     OutputFile output(job.output);
-    if (Status created = output.Create(); !created)
+    if (sys::Status created = output.Create(); !created)
         return Refuse(report, created, true);
     std::unique_ptr<SeriesWriter> writer = MakeWriter(job.outputFormat, job.output);
-    if (Status begun = writer->Begin(output.WriterPath(), header, job.title); !begun)
-        return Refuse(report, Status::Fail(job.output, 0, begun.problem().message), true);
+    if (sys::Status begun = writer->Begin(output.WriterPath(), header, job.title); !begun)
+        return Refuse(report, sys::Status::Fail(job.output, 0, begun.problem().message), true);
 
     Row row;
     while (reader->Next(row)) {
         if (report.rows == 0)
             report.firstStamp = FormatStamp(row.stamp);
-        if (Status written = writer->Write(row); !written)
+        if (sys::Status written = writer->Write(row); !written)
             return Refuse(report,
-                          Status::Fail(job.input, reader->Location(), "cannot write " + job.output + ": " + written.problem().message),
+                          sys::Status::Fail(job.input, reader->Location(), "cannot write " + job.output + ": " + written.problem().message),
                           true);
         ++report.rows;
         if (progress && report.rows % kProgressEvery == 0)
@@ -254,10 +254,10 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
         return Refuse(report, reader->status(), report.rows > 0 || !throughTemplate);
     if (report.rows > 0)
         report.lastStamp = FormatStamp(row.stamp);
-    if (Status finished = writer->Finish(); !finished)
-        return Refuse(report, Status::Fail(job.output, 0, finished.problem().message), true);
+    if (sys::Status finished = writer->Finish(); !finished)
+        return Refuse(report, sys::Status::Fail(job.output, 0, finished.problem().message), true);
     writer.reset();
-    if (Status committed = output.Commit(); !committed)
+    if (sys::Status committed = output.Commit(); !committed)
         return Refuse(report, committed, true);
     report.converted = true;
     return report;
@@ -273,7 +273,7 @@ FileReport ConvertFile(const FileJob& job, const ProgressFn& progress)
         FileReport report;
         report.input = job.input;
         report.output = job.output;
-        report.problem = Problem{job.input, 0, 0, std::string("conversion stopped: ") + e.what()};
+        report.problem = sys::Problem{job.input, 0, 0, std::string("conversion stopped: ") + e.what()};
         return report;
     }
 }

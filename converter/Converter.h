@@ -2,7 +2,7 @@
 // The conversion of one file, shared by the engine program and the bridge: choose the reader of the
 // input format (through its template for ASCII and Excel), the writer of the output format, and
 // stream the selected items from one to the other into a temporary file renamed when complete.
-#include "converter/Problem.h"
+#include "platform/system/Status.h"
 #include "converter/SeriesReader.h"
 #include "converter/SeriesWriter.h"
 #include "platform/system/Types.h"
@@ -30,7 +30,7 @@ bool AcceptsExtension(Format format, const std::string& path);
 
 // The template of an ASCII or Excel input: loaded from `path`, or a new template's defaults when
 // `path` is empty; null with `status` set when the file cannot be loaded. Null for rbx0.
-std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& path, Status& status);
+std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& path, sys::Status& status);
 
 // A reader of `format`; its template (ASCII and Excel) must outlive it.
 std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* spec);
@@ -66,7 +66,7 @@ struct FileReport {
     size_t itemsWritten = 0;
     std::string firstStamp, lastStamp;
     std::vector<std::string> notes; // things the log should mention on a converted file
-    Problem problem;                // why not, when not converted
+    sys::Problem problem;                // why not, when not converted
 };
 
 // Called now and then while a file converts: rows so far and input bytes consumed.

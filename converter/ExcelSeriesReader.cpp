@@ -56,7 +56,7 @@ ExcelSeriesReader::~ExcelSeriesReader()
         m_producer.join();
 }
 
-Status ExcelSeriesReader::Open(const std::string& path)
+sys::Status ExcelSeriesReader::Open(const std::string& path)
 {
     m_path = path;
     m_header = SeriesHeader();
@@ -66,10 +66,10 @@ Status ExcelSeriesReader::Open(const std::string& path)
     m_stampColumn = m_spec.GetDateTimeColumn();
     m_deleteInUse = m_spec.m_DataDesc.m_nDeleteValueCheck != 0;
     if (m_spec.m_DataDesc.m_nStartRow < 1)
-        return m_status = Status::Fail(path, 0, "the data start row of the template must be 1 or more");
+        return m_status = sys::Status::Fail(path, 0, "the data start row of the template must be 1 or more");
     if (m_stampColumn < 1)
-        return m_status = Status::Fail(path, 0, "the template's date/time option must be 0, 1 or 2");
-    if (Status header = ReadHeader(); !header)
+        return m_status = sys::Status::Fail(path, 0, "the template's date/time option must be 0, 1 or 2");
+    if (sys::Status header = ReadHeader(); !header)
         return m_status = header;
     std::vector<size_t> all(m_itemCount);
     for (size_t i = 0; i < all.size(); ++i)
@@ -80,14 +80,14 @@ Status ExcelSeriesReader::Open(const std::string& path)
 }
 
 // One pass over the sheet for its used columns and the header rows.
-Status ExcelSeriesReader::ReadHeader()
+sys::Status ExcelSeriesReader::ReadHeader()
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     sheet::WorkbookReader workbook;
     if (!workbook.Open(m_path))
-        return Status::Fail(m_path, 0, workbook.Error());
+        return sys::Status::Fail(m_path, 0, workbook.Error());
     if (m_sheet < 1 || m_sheet > workbook.SheetCount())
-        return Status::Fail(m_path, 0, res::LoadString(res::IDS_SHEET_INDEX_TOO_LARGE));
+        return sys::Status::Fail(m_path, 0, res::LoadString(res::IDS_SHEET_INDEX_TOO_LARGE));
 
     std::vector<int> wanted{data.m_nStartRow, 1};
     if (data.m_nItemTitleOption == 0)
@@ -116,12 +116,12 @@ Status ExcelSeriesReader::ReadHeader()
         return true;
     }, &noNumberTexts);
     if (!read)
-        return Status::Fail(m_path, 0, workbook.Error());
+        return sys::Status::Fail(m_path, 0, workbook.Error());
     for (const auto& [row, header] : headerRows)
         if (row < data.m_nStartRow)
             NoteFormulasWithoutResult(header);
     if (last < 2 || last - first < 1)
-        return Status::Fail(m_path, 0, "the sheet has fewer than two used columns");
+        return sys::Status::Fail(m_path, 0, "the sheet has fewer than two used columns");
     m_firstColumn = first;
     m_lastColumn = last;
     m_firstValueColumn = m_stampColumn != first ? first : first + m_formatColumns;
@@ -132,7 +132,7 @@ Status ExcelSeriesReader::ReadHeader()
     return ReadItems(headerRows);
 }
 
-Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
+sys::Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     std::vector<int> valueColumns;
@@ -141,7 +141,7 @@ Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
             valueColumns.push_back(x);
     m_itemCount = valueColumns.size();
     if (m_itemCount == 0)
-        return Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_NO_ITEM_COLUMN));
+        return sys::Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_NO_ITEM_COLUMN));
     static const std::vector<sheet::RowCell> kNoCells;
     auto rowCells = [&](int row) -> const std::vector<sheet::RowCell>& {
         auto it = headerRows.find(row);
@@ -188,14 +188,14 @@ Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
             case 1:
                 part.target = part.cut(TextAt(rowCells(part.row), column));
                 if (part.target.empty())
-                    return Status::Fail(m_path, part.row, res::LoadString(part.emptyMessage));
+                    return sys::Status::Fail(m_path, part.row, res::LoadString(part.emptyMessage));
                 break;
             case 2: part.target = def ? def->*part.member : std::string(); break;
-            default: return Status::Fail(m_path, 0, "the template's item options must be 0, 1 or 2");
+            default: return sys::Status::Fail(m_path, 0, "the template's item options must be 0, 1 or 2");
             }
         }
         if (!IsValueTypeName(item.valueType))
-            return Status::Fail(m_path, data.m_nValueTypeRow,
+            return sys::Status::Fail(m_path, data.m_nValueTypeRow,
                                 res::LoadString(res::IDS_VALUE_TYPE_INVALID) + " '" + item.valueType + "'");
     }
 
@@ -211,18 +211,18 @@ Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
         m_format = std::make_unique<DateFormat>(time.m_strTimeFormat, DateFormat::Reads::Time);
         m_start.year = 100;
         if (!DateFormat("YYYY-MM-DD", DateFormat::Reads::Date).Read(time.m_strGlobalDate, m_start))
-            return Status::Fail(m_path, 0, "the template's global date '" + time.m_strGlobalDate + "' is not YYYY-MM-DD");
+            return sys::Status::Fail(m_path, 0, "the template's global date '" + time.m_strGlobalDate + "' is not YYYY-MM-DD");
         break;
     case 2:
         m_useFormat = time.m_bUseDFormat != 0;
         m_format = std::make_unique<DateFormat>(time.m_strDateFormat, DateFormat::Reads::Date);
         if (!DateFormat("HH:mm:ss", DateFormat::Reads::Time).Read(time.m_strGlobalTime, m_start))
-            return Status::Fail(m_path, 0, "the template's global time '" + time.m_strGlobalTime + "' is not HH:mm:ss");
+            return sys::Status::Fail(m_path, 0, "the template's global time '" + time.m_strGlobalTime + "' is not HH:mm:ss");
         m_start.year = 100;
         break;
-    default: return Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 void ExcelSeriesReader::Select(const std::vector<size_t>& items)

@@ -28,7 +28,7 @@ public:
     explicit ExcelSeriesReader(const CSpecification& spec);
     ~ExcelSeriesReader() override;
 
-    Status Open(const std::string& path) override;
+    sys::Status Open(const std::string& path) override;
     bool Next(Row& row) override;
     void Select(const std::vector<size_t>& items) override;
     long Location() const override { return m_rowNumber; }
@@ -38,8 +38,8 @@ private:
         int number = 0;
         std::vector<sheet::RowCell> cells;
     };
-    Status ReadHeader();
-    Status ReadItems(const std::map<int, SheetRow>& headerRows);
+    sys::Status ReadHeader();
+    sys::Status ReadItems(const std::map<int, SheetRow>& headerRows);
     void StartRows();
     std::vector<bool> TextColumns() const;
     bool NextSheetRow(SheetRow& sheetRow);

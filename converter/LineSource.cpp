@@ -5,12 +5,12 @@
 
 namespace converter {
 
-Status LineSource::Open(const std::string& path)
+sys::Status LineSource::Open(const std::string& path)
 {
     m_path = path;
     m_open = m_input.Open(path);
     if (!m_open)
-        return m_status = Status::Fail(path, 0, m_input.Error());
+        return m_status = sys::Status::Fail(path, 0, m_input.Error());
     m_buffer.resize(kDefaultBuffer + kReadableAfterLine);
     return m_status;
 }
@@ -26,7 +26,7 @@ bool LineSource::Refill()
     }
     if (m_end == Capacity()) {
         if (Capacity() >= kMaxLineLength) {
-            m_status = Status::Fail(m_path, m_lineNumber + 1,
+            m_status = sys::Status::Fail(m_path, m_lineNumber + 1,
                                     "the line is longer than " + std::to_string(kMaxLineLength) +
                                         " bytes; this is not a delimited text file");
             return false;
@@ -36,7 +36,7 @@ bool LineSource::Refill()
     const size_t got = m_input.Read(m_buffer.data() + m_end, Capacity() - m_end);
     if (got == 0) {
         if (!m_input.Error().empty())
-            m_status = Status::Fail(m_path, m_lineNumber + 1, m_input.Error());
+            m_status = sys::Status::Fail(m_path, m_lineNumber + 1, m_input.Error());
         m_eof = true;
         return false;
     }

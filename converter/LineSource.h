@@ -2,7 +2,7 @@
 // Reading a text file line by line through one fixed buffer, counting lines from 1, as UTF-8 (a
 // byte-order mark passed over, UTF-16 converted; see sys::TextFileInput). A line longer than the
 // limit fails the read instead of growing memory without bound.
-#include "converter/Problem.h"
+#include "platform/system/Status.h"
 #include "platform/system/TextFileInput.h"
 
 #include <cstdint>
@@ -24,13 +24,13 @@ public:
     LineSource(const LineSource&) = delete;
     LineSource& operator=(const LineSource&) = delete;
 
-    Status Open(const std::string& path);
+    sys::Status Open(const std::string& path);
     // The next line without its end ("\n" or "\r\n"); valid until the next call. False at the end
     // of the file or on an error (then status() says which).
     bool Next(std::string_view& line);
 
     long LineNumber() const { return m_lineNumber; }
-    const Status& status() const { return m_status; }
+    const sys::Status& status() const { return m_status; }
     std::uint64_t BytesConsumed() const { return m_consumed; }
 
 private:
@@ -46,7 +46,7 @@ private:
     bool m_eof = false;
     long m_lineNumber = 0;
     std::uint64_t m_consumed = 0;
-    Status m_status;
+    sys::Status m_status;
 };
 
 } // namespace converter

@@ -91,7 +91,7 @@ Verdict Ask(const CString& bridgeName, const CString& templatePath, const CStrin
 // What the engine does with the same files: convert to rbx0 and report success.
 bool EngineConverts(int format, const std::string& file, const std::string& templatePath, const TempFolder& scratch)
 {
-    converter::Status status;
+    sys::Status status;
     const auto inputFormat = static_cast<converter::Format>(format);
     std::unique_ptr<CSpecification> spec = converter::LoadTemplate(inputFormat, templatePath, status);
     if (!status)

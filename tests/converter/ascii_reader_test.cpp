@@ -12,7 +12,7 @@ using namespace converter;
 namespace {
 
 struct Read {
-    Status status;
+    sys::Status status;
     SeriesHeader header;
     std::vector<Row> rows;
 };

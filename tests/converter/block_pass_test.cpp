@@ -193,7 +193,7 @@ Outcome ReadWith(const CSpecification& spec, const std::string& path, Pass pass,
     reader.UseFusedPass(pass != Pass::Splitter);
     reader.UseBlockPass(pass == Pass::Blocks);
     Outcome out;
-    Status status = reader.Open(path);
+    sys::Status status = reader.Open(path);
     if (status && selection)
         reader.Select(*selection);
     Row row;

@@ -25,7 +25,7 @@ const std::string kSample = "Rainfall[mm]:Accumulated\tWater Level[m]:Instantane
 
 FileReport Convert(Format in, const std::string& input, Format out, const std::string& output, CUIntArray items = {})
 {
-    Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> spec = LoadTemplate(in, "", status);
     FileJob job{in, input, spec.get(), std::move(items), out, output, "Title"};
     return ConvertFile(job);
@@ -144,7 +144,7 @@ TEST(Conversion, ExcelRowsCrossTheReadingBatchesAndDeleteValuesMatchTheDisplayed
     ASSERT_TRUE(plain.converted) << plain.problem.Describe();
     EXPECT_EQ(convtest::ReadFile(folder.Path("plain.txt")), original);
 
-    Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Excel, "", status);
     spec->m_DataDesc.m_nDeleteValueCheck = 1;
     spec->m_DataDesc.m_nDeleteValueRadio = 0;

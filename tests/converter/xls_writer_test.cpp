@@ -35,7 +35,7 @@ ItemInfo Item(std::string name, std::string type = "Rainfall", std::string unit 
     return ItemInfo{std::move(name), std::move(type), std::move(unit), "Accumulated"};
 }
 
-Status WriteXls(const std::string& path, const SeriesHeader& header, const std::vector<Row>& rows,
+sys::Status WriteXls(const std::string& path, const SeriesHeader& header, const std::vector<Row>& rows,
                 const std::string& title = "")
 {
     XlsSeriesWriter writer;
@@ -219,7 +219,7 @@ TEST(XlsWriter, LibreOfficeReadsTheWorkbook)
     ASSERT_EQ(std::system(command.c_str()), 0) << convtest::ReadFile(folder.Path("convert.log"));
     ASSERT_TRUE(std::filesystem::exists(folder.Path("office.xlsx"))) << convtest::ReadFile(folder.Path("convert.log"));
 
-    Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Excel, "", status);
     std::unique_ptr<SeriesReader> reader = MakeReader(Format::Excel, spec.get());
     ASSERT_TRUE(reader->Open(folder.Path("office.xlsx"))) << reader->status().problem().Describe();
@@ -249,7 +249,7 @@ TEST(XlsWriter, TheFormatsLimitsGiveClearErrors)
     SeriesHeader wide;
     wide.items.assign(256, Item("x"));
     XlsSeriesWriter tooWide;
-    const Status refused = tooWide.Begin(folder.Path("wide.xls"), wide, "");
+    const sys::Status refused = tooWide.Begin(folder.Path("wide.xls"), wide, "");
     EXPECT_FALSE(refused);
     EXPECT_EQ(refused.problem().message, "256 items do not fit the 255 value columns of an .xls sheet (.xlsx holds 16,383)");
     EXPECT_FALSE(std::filesystem::exists(folder.Path("wide.xls")));
@@ -261,7 +261,7 @@ TEST(XlsWriter, TheFormatsLimitsGiveClearErrors)
     for (int r = 0; r < 65535; ++r)
         text += FormatStamp(At(2020, 1, 1) + r * 60LL) + "\t" + std::to_string(r) + "\n";
     convtest::WriteFile(folder.Path("long.txt"), text);
-    Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Ascii, "", status);
     FileJob job{Format::Ascii, folder.Path("long.txt"), spec.get(), {}, Format::Excel, folder.Path("long.xls"), ""};
     const FileReport report = ConvertFile(job);
@@ -297,7 +297,7 @@ TEST(ExcelOutput, StampsGetTheSheetsOwnDayNumbers)
     for (const char* stamp : stamps)
         text += std::string(stamp) + "\t1\n";
     convtest::WriteFile(folder.Path("in.txt"), text);
-    Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> ascii = LoadTemplate(Format::Ascii, "", status);
     std::unique_ptr<CSpecification> excel = LoadTemplate(Format::Excel, "", status);
     for (const char* extension : {".xls", ".xlsx"}) {

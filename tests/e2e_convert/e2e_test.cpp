@@ -85,7 +85,7 @@ protected:
             return;
         }
         WriteFile(Path("seed.txt"), kSample);
-        converter::Status status;
+        sys::Status status;
         auto spec = converter::LoadTemplate(Format::Ascii, "", status);
         auto report = converter::ConvertFile({Format::Ascii, Path("seed.txt").string(), spec.get(), {}, format, path.string(), ""});
         ASSERT_TRUE(report.converted) << report.problem.Describe();
@@ -97,7 +97,7 @@ protected:
     {
         if (format == Format::Ascii)
             return ReadFile(path);
-        converter::Status status;
+        sys::Status status;
         auto spec = converter::LoadTemplate(format, "", status);
         const fs::path text = Path("readback.txt");
         auto report = converter::ConvertFile({format, path.string(), spec.get(), {}, Format::Ascii, text.string(), ""});
@@ -280,7 +280,7 @@ TEST_F(EndToEnd, CheckAndEngineAgreeOnTheUserLocale)
     if (!german.Available())
         GTEST_SKIP() << "localedef cannot build de_DE.UTF-8 here (no localedef or no locale sources)";
     WriteFile(Path("comma.txt"), "Undefined[Undefined]:Instantaneous\nTime\tLevel\n2020/01/01 00:00:00\t3,5\n");
-    converter::Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> spec = converter::LoadTemplate(Format::Ascii, "", status);
     spec->m_strDecimalSeparator = "User Locale";
     ASSERT_EQ(spec->Save(Path("locale.xml").string()), 1);

@@ -60,7 +60,7 @@ struct EngineRead {
 
 EngineRead Convert(const std::string& input, const std::string& output)
 {
-    converter::Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> spec = converter::LoadTemplate(converter::Format::Excel, "", status);
     converter::FileJob job{converter::Format::Excel, input, spec.get(), {}, converter::Format::Ascii, output, ""};
     const converter::FileReport report = converter::ConvertFile(job);
@@ -295,7 +295,7 @@ TEST_F(OtherWritersTest, SixteenThousandColumnsAreReadWhole)
     book.Number(3, 1, 44333);
     book.Close();
 
-    converter::Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> spec = converter::LoadTemplate(converter::Format::Excel, "", status);
     std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(converter::Format::Excel, spec.get());
     ASSERT_TRUE(reader->Open(book.path)) << reader->status().problem().Describe();
