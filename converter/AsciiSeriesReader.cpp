@@ -107,7 +107,7 @@ sys::Status AsciiSeriesReader::ReadHeaderLines(HeaderLines& lines)
         rows.push_back(data.m_nDeleteValueRow);
     const long last = *std::max_element(rows.begin(), rows.end());
 
-    LineSource source;
+    sys::TextLineReader source;
     if (sys::Status opened = source.Open(m_path); !opened)
         return opened;
     std::string_view line;

@@ -4,7 +4,7 @@
 // checked exactly as the preview parser does it; in addition the date/time texts are read with the
 // template's formats and the values as numbers with its decimal separator.
 #include "converter/FieldSplitter.h"
-#include "converter/LineSource.h"
+#include "platform/system/TextLineReader.h"
 #include "converter/NumberText.h"
 #include "converter/SeriesReader.h"
 #include "converter/StampText.h"
@@ -57,7 +57,7 @@ private:
     std::string m_path;
     FieldSplitter m_splitter;
     NumberReader m_numbers;
-    LineSource m_lines;
+    sys::TextLineReader m_lines;
 
     std::string m_delimiter;
     bool m_fusable = false; // the template allows the one-pass reading of data lines

@@ -2,9 +2,10 @@
 
 #include "parsers/FieldCursor.h"
 #include "parsers/HeaderCells.h"
-#include "parsers/TextLineReader.h"
+#include "parsers/FileException.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
+#include "platform/system/TextLineReader.h"
 #include "platform/units/Units.h"
 #include "resources/StringTable.h"
 #include "templates/Specification.h"
@@ -12,6 +13,32 @@
 #include <algorithm>
 
 namespace {
+
+// The lines of the bound file for the parser's operations, which let a file that cannot be read
+// through as CFileException. A preview reads at most what it shows: the start of a long line is
+// kept, the rest read past.
+class PreviewLines {
+public:
+    explicit PreviewLines(const CString& path)
+    {
+        if (const sys::Status opened = m_reader.Open(path); !opened)
+            throw CFileException(opened.problem());
+    }
+    // The next line, at most `keep` bytes of it; false at the end of the file.
+    bool Read(CString& line, size_t keep = sys::kLongestTextLine) { return Went(m_reader.Read(line, keep)); }
+    bool Skip() { return Went(m_reader.Skip()); }
+    long LineNumber() const { return m_reader.LineNumber(); }
+
+private:
+    bool Went(bool read) const
+    {
+        if (!read && !m_reader.status())
+            throw CFileException(m_reader.status().problem());
+        return read;
+    }
+
+    sys::TextLineReader m_reader{sys::TextLineReader::OverlongLine::NoLineBreak, 64 * 1024};
+};
 
 // Raw lines are shown with tabs opened up, as a list control cannot show them, and at most their
 // first kShownLineBytes bytes.
@@ -74,12 +101,12 @@ int CAsciiFilePreviewParser::ReadLine(int n, CString& text)
         return 0;
     if (!sys::FileExists(m_strFile))
         return Fail(m_strFile, 0, "the file does not exist");
-    CTextLineReader reader(m_strFile);
+    PreviewLines reader(m_strFile);
     text.clear();
     int passed = 0;
-    while (passed + 1 < n && reader.SkipLine())
+    while (passed + 1 < n && reader.Skip())
         ++passed;
-    if (passed + 1 == n && !reader.ReadLine(text))
+    if (passed + 1 == n && !reader.Read(text))
         text.clear();
     return 1;
 }
@@ -389,12 +416,12 @@ bool CAsciiFilePreviewParser::ReadColumnCountAndNames(const DeleteValue& deleteV
         return true;
 
     // Lines beyond the end of the file read as empty, so the reading stops there.
-    CTextLineReader reader(m_strFile);
+    PreviewLines reader(m_strFile);
     CString nameLine, startLine;
     for (long long n = 1; n <= data.m_nStartRow; ++n) {
         const bool wanted = n == data.m_nItemDescriptionRow || n == data.m_nStartRow;
         CString line;
-        if (!(wanted ? reader.ReadLine(line) : reader.SkipLine()))
+        if (!(wanted ? reader.Read(line) : reader.Skip()))
             break;
         if (n == data.m_nItemDescriptionRow)
             nameLine = line;
@@ -455,12 +482,12 @@ bool CAsciiFilePreviewParser::ReadHeaderAndDataLines(int columns, const DeleteVa
 {
     const int startRow = m_pSpecification->m_DataDesc.m_nStartRow;
     const CString delimiter = m_pSpecification->GetDelimiterString();
-    CTextLineReader reader(m_strFile);
+    PreviewLines reader(m_strFile);
     CString line;
-    for (long long n = 1; n < startRow && reader.ReadLine(line, kShownLineBytes); ++n)
+    for (long long n = 1; n < startRow && reader.Read(line, kShownLineBytes); ++n)
         m_vecRawLines.push_back(RawRow(line));
     size_t cells = 0;
-    for (int i = 0; i < kPreviewLines && cells < kPreviewCells && reader.ReadLine(line); ++i) {
+    for (int i = 0; i < kPreviewLines && cells < kPreviewCells && reader.Read(line); ++i) {
         m_vecRawLines.push_back(RawRow(line));
         if (line.empty())
             continue;
@@ -548,12 +575,12 @@ int CAsciiFilePreviewParser::ReadRawLines(const CString& path)
     const CString file = path.empty() ? m_strFile : path;
     if (!sys::FileExists(file))
         return Fail(file, 0, "the file does not exist");
-    CTextLineReader reader(file);
+    PreviewLines reader(file);
     m_vecItemNames.clear();
     m_vecRows.clear();
     m_vecRawLines.clear();
     CString line;
-    for (int i = 0; i < kPreviewLines && reader.ReadLine(line, kShownLineBytes); ++i)
+    for (int i = 0; i < kPreviewLines && reader.Read(line, kShownLineBytes); ++i)
         m_vecRawLines.push_back(RawRow(line));
     return 1;
 }
