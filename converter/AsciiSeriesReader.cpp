@@ -320,29 +320,29 @@ sys::Status AsciiSeriesReader::PrepareStamps()
     const CTimeDescription& time = m_spec.m_TimeDesc;
     // Fields joined for reading are separated by blanks; the delimiter also separates the format.
     const std::string extra = m_formatColumns > 1 ? m_delimiter : std::string();
-    m_start = StampFields();
+    m_start = sys::DateTimeFields();
     switch (time.m_nDateTimeOption) {
     case 0:
-        m_format = std::make_unique<DateFormat>(time.m_strDateTimeFormat, DateFormat::Reads::DateTime, extra);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strDateTimeFormat, sys::DateFormat::Reads::DateTime, extra);
         break;
     case 1: {
-        StampFields date;
+        sys::DateTimeFields date;
         date.year = 100;
-        if (!DateFormat("YYYY-MM-DD", DateFormat::Reads::Date).Read(time.m_strGlobalDate, date))
+        if (!sys::DateFormat("YYYY-MM-DD", sys::DateFormat::Reads::Date).Read(time.m_strGlobalDate, date))
             return sys::Status::Fail(m_path, 0, "the template's global date " + Quote(time.m_strGlobalDate) +
                                                " is not a date of the form YYYY-MM-DD");
         m_start.year = date.year, m_start.month = date.month, m_start.day = date.day;
-        m_format = std::make_unique<DateFormat>(time.m_strTimeFormat, DateFormat::Reads::Time, extra);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strTimeFormat, sys::DateFormat::Reads::Time, extra);
         break;
     }
     case 2: {
-        StampFields clock;
-        if (!DateFormat("HH:mm:ss", DateFormat::Reads::Time).Read(time.m_strGlobalTime, clock))
+        sys::DateTimeFields clock;
+        if (!sys::DateFormat("HH:mm:ss", sys::DateFormat::Reads::Time).Read(time.m_strGlobalTime, clock))
             return sys::Status::Fail(m_path, 0, "the template's global time " + Quote(time.m_strGlobalTime) +
                                                " is not a time of the form HH:mm:ss");
         m_start.year = 100;
         m_start.hour = clock.hour, m_start.minute = clock.minute, m_start.second = clock.second;
-        m_format = std::make_unique<DateFormat>(time.m_strDateFormat, DateFormat::Reads::Date, extra);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strDateFormat, sys::DateFormat::Reads::Date, extra);
         break;
     }
     default: return sys::Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
@@ -407,7 +407,7 @@ bool AsciiSeriesReader::ReadStamp(size_t firstCall, Stamp& stamp)
         text = m_stampBuffer;
     }
     const long line = m_lines.LineNumber();
-    StampFields fields = m_start;
+    sys::DateTimeFields fields = m_start;
     if (!m_format->Read(text, fields))
         return Fail(m_path, line, res::LoadString(res::IDS_DATETIME_UNPARSABLE) + " " + Quote(text));
     std::optional<Stamp> value = StampFromFields(fields);

@@ -77,9 +77,9 @@ private:
     bool m_deleteInUse = false;
     std::string m_deleteValue;
 
-    std::unique_ptr<DateFormat> m_format;
+    std::unique_ptr<sys::DateFormat> m_format;
     std::unique_ptr<StampReader> m_stamps; // reads with m_format from m_start
-    StampFields m_start;           // starting fields: the global date or time where one applies
+    sys::DateTimeFields m_start;           // starting fields: the global date or time where one applies
     std::string m_stampBuffer;     // the date/time fields joined by blanks
     std::vector<int> m_slotOfItem; // item position -> place in the row, -1 when not selected
 };

@@ -200,23 +200,23 @@ sys::Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRo
     }
 
     const CTimeDescription& time = m_spec.m_TimeDesc;
-    m_start = StampFields();
+    m_start = sys::DateTimeFields();
     switch (time.m_nDateTimeOption) {
     case 0:
         m_useFormat = time.m_bUseDTFormat != 0;
-        m_format = std::make_unique<DateFormat>(time.m_strDateTimeFormat);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strDateTimeFormat);
         break;
     case 1:
         m_useFormat = time.m_bUseTFormat != 0;
-        m_format = std::make_unique<DateFormat>(time.m_strTimeFormat, DateFormat::Reads::Time);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strTimeFormat, sys::DateFormat::Reads::Time);
         m_start.year = 100;
-        if (!DateFormat("YYYY-MM-DD", DateFormat::Reads::Date).Read(time.m_strGlobalDate, m_start))
+        if (!sys::DateFormat("YYYY-MM-DD", sys::DateFormat::Reads::Date).Read(time.m_strGlobalDate, m_start))
             return sys::Status::Fail(m_path, 0, "the template's global date '" + time.m_strGlobalDate + "' is not YYYY-MM-DD");
         break;
     case 2:
         m_useFormat = time.m_bUseDFormat != 0;
-        m_format = std::make_unique<DateFormat>(time.m_strDateFormat, DateFormat::Reads::Date);
-        if (!DateFormat("HH:mm:ss", DateFormat::Reads::Time).Read(time.m_strGlobalTime, m_start))
+        m_format = std::make_unique<sys::DateFormat>(time.m_strDateFormat, sys::DateFormat::Reads::Date);
+        if (!sys::DateFormat("HH:mm:ss", sys::DateFormat::Reads::Time).Read(time.m_strGlobalTime, m_start))
             return sys::Status::Fail(m_path, 0, "the template's global time '" + time.m_strGlobalTime + "' is not HH:mm:ss");
         m_start.year = 100;
         break;
@@ -399,7 +399,7 @@ ExcelSeriesReader::StampRead ExcelSeriesReader::ReadStamp(const SheetRow& sheetR
 {
     const CTimeDescription& time = m_spec.m_TimeDesc;
     const int option = time.m_nDateTimeOption;
-    StampFields fields = m_start;
+    sys::DateTimeFields fields = m_start;
     if (m_useFormat) {
         std::string joined;
         for (int w = 0; w < m_formatColumns; ++w)
@@ -429,7 +429,7 @@ ExcelSeriesReader::StampRead ExcelSeriesReader::ReadStamp(const SheetRow& sheetR
                 return StampRead::Unreadable;
             }
         } else {
-            StampFields parsed = option == 0 ? StampFields() : m_start;
+            sys::DateTimeFields parsed = option == 0 ? sys::DateTimeFields() : m_start;
             if (m_format->Read(cell->text, parsed))
                 value = StampFromFields(parsed);
         }
@@ -437,7 +437,7 @@ ExcelSeriesReader::StampRead ExcelSeriesReader::ReadStamp(const SheetRow& sheetR
             unreadable = cell->text;
             return StampRead::Unreadable;
         }
-        const StampFields cellFields = FieldsFromStamp(*value);
+        const sys::DateTimeFields cellFields = FieldsFromStamp(*value);
         if (option == 0)
             fields = cellFields;
         else if (option == 1)

@@ -68,9 +68,9 @@ private:
     std::string m_deleteValue;
     std::vector<int> m_slotOfColumn; // sheet column -> place in the row, -1 when not a selected value
     NumberReader m_numbers{"."};
-    std::unique_ptr<DateFormat> m_format;
+    std::unique_ptr<sys::DateFormat> m_format;
     bool m_useFormat = false;
-    StampFields m_start;
+    sys::DateTimeFields m_start;
     long m_rowNumber = 0; // the sheet row last read
     std::uint64_t m_rowsRead = 0;
     bool m_dataEnded = false;

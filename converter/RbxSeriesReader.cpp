@@ -59,11 +59,11 @@ sys::Status RbxSeriesReader::Open(const std::string& path)
     if (!rbx::IsCalendarAxis(axis.type))
         return m_status = sys::Status::Fail(path, 0, "the file has a relative time axis (type " + std::to_string(axis.type) +
                                                     "); only calendar time axes give time stamps");
-    StampFields start;
+    sys::DateTimeFields start;
     start.year = 100;
-    DateFormat("YYYY-MM-DD", DateFormat::Reads::Date).Read(axis.startDate, start);
+    sys::DateFormat("YYYY-MM-DD", sys::DateFormat::Reads::Date).Read(axis.startDate, start);
     std::optional<Stamp> base;
-    if (DateFormat("HH:mm:ss", DateFormat::Reads::Time).Read(axis.startTime, start))
+    if (sys::DateFormat("HH:mm:ss", sys::DateFormat::Reads::Time).Read(axis.startTime, start))
         base = StampFromFields(start);
     if (!base)
         return m_status = sys::Status::Fail(path, 0, "the time axis starts at '" + axis.startDate + " " + axis.startTime +

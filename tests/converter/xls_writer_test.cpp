@@ -27,7 +27,7 @@ namespace {
 
 Stamp At(int year, int month, int day, int hour = 0, int minute = 0, int second = 0)
 {
-    return *StampFromFields(StampFields{year, month, day, hour, minute, second});
+    return *StampFromFields(sys::DateTimeFields{year, month, day, hour, minute, second});
 }
 
 ItemInfo Item(std::string name, std::string type = "Rainfall", std::string unit = "mm")

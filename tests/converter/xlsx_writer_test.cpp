@@ -33,7 +33,7 @@ struct ReadBack {
 
 Stamp At(int year, int month, int day, int hour = 0, int minute = 0, int second = 0)
 {
-    return *StampFromFields(StampFields{year, month, day, hour, minute, second});
+    return *StampFromFields(sys::DateTimeFields{year, month, day, hour, minute, second});
 }
 
 sys::Status WriteWorkbook(const std::string& path, const SeriesHeader& header, const std::vector<Row>& rows,
