@@ -43,9 +43,8 @@ struct AsciiSeriesReader::HeaderLines {
 };
 
 AsciiSeriesReader::AsciiSeriesReader(const CSpecification& spec)
-    : m_spec(spec), m_splitter(spec), m_numbers(spec.GetDecimalSeparatorString()), m_delimiter(spec.GetDelimiterString()),
-      m_fusable(m_delimiter.size() == 1 && spec.m_bIgnoreConsecutiveDelimiters == 0 &&
-                spec.m_bIgnoreBegginingOfLineDelimiters == 0),
+    : m_spec(spec), m_splitter(spec.GetDialect()), m_dialect(m_splitter.dialect()), m_numbers(m_dialect.decimalSeparator),
+      m_fusable(m_dialect.IsPlain()),
       m_pointDecimals(m_numbers.ReadsPlainDecimals())
 {
 }
@@ -319,7 +318,7 @@ sys::Status AsciiSeriesReader::PrepareStamps()
 {
     const CTimeDescription& time = m_spec.m_TimeDesc;
     // Fields joined for reading are separated by blanks; the delimiter also separates the format.
-    const std::string extra = m_formatColumns > 1 ? m_delimiter : std::string();
+    const std::string extra = m_formatColumns > 1 ? m_dialect.delimiter : std::string();
     m_start = sys::DateTimeFields();
     switch (time.m_nDateTimeOption) {
     case 0:
@@ -417,130 +416,6 @@ bool AsciiSeriesReader::ReadStamp(size_t firstCall, Stamp& stamp)
     return true;
 }
 
-namespace {
-
-// The fields of a line the splitter would give with a one-character delimiter and both delimiter
-// flags off, one at a time: the text up to the next delimiter and the position after it; a
-// delimiter at the line's end adds an empty field, and the last field ends at -1.
-class FieldCursor {
-public:
-    FieldCursor(std::string_view line, char delimiter) : m_line(line), m_delimiter(delimiter) {}
-
-    // False when the field starts with a quote or the line holds no delimiter: the splitter's case.
-    bool Next(std::string_view& text, int& end)
-    {
-        const size_t length = m_line.size();
-        if (m_trailing) {
-            m_trailing = false;
-            text = {};
-            end = -1;
-            return true;
-        }
-        if (m_at == length) {
-            text = {};
-            m_trailing = length > 0 && m_line[length - 1] == m_delimiter;
-            end = m_trailing ? static_cast<int>(length) + 1 : -1;
-            return true;
-        }
-        if (m_line[m_at] == '"')
-            return false;
-        const size_t found = FindDelimiter(m_line, m_at, m_delimiter);
-        if (m_at == 0 && found == length)
-            return false;
-        text = m_line.substr(m_at, found - m_at);
-        m_at = found < length ? found + 1 : length;
-        end = static_cast<int>(m_at);
-        return true;
-    }
-
-    // Next, with a field that is a plain decimal read on the way (`read` then true and `value` set).
-    bool NextReading(std::string_view& text, int& end, double& value, bool& read)
-    {
-        read = false;
-        const size_t length = m_line.size();
-        if (!m_trailing && m_at < length) {
-            const char* const start = m_line.data() + m_at;
-            const char* const lineEnd = m_line.data() + length;
-            const char* const stop = ScanPlainDecimal(start, lineEnd, value);
-            if (stop != nullptr && (stop == lineEnd ? m_at != 0 : *stop == m_delimiter)) {
-                const size_t found = static_cast<size_t>(stop - m_line.data());
-                text = m_line.substr(m_at, found - m_at);
-                m_at = found < length ? found + 1 : length;
-                end = static_cast<int>(m_at);
-                read = true;
-                return true;
-            }
-        }
-        return Next(text, end);
-    }
-
-private:
-    std::string_view m_line;
-    char m_delimiter;
-    size_t m_at = 0;
-    bool m_trailing = false;
-};
-
-} // namespace
-
-namespace {
-
-// The positions of a line's delimiters in order, found sixty-four bytes at a time. Reads up to 64
-// bytes past the line's end.
-class DelimiterWalk {
-public:
-    DelimiterWalk(std::string_view line, char delimiter) : m_text(line.data()), m_length(line.size()), m_delimiter(delimiter)
-    {
-        Load(0);
-    }
-
-    // The next delimiter's position, or the line's length when none is left.
-    size_t Next()
-    {
-        while (m_bits == 0) {
-            if (m_block + kBlock >= m_length)
-                return m_length;
-            Load(m_block + kBlock);
-        }
-        const size_t at = m_block + static_cast<size_t>(__builtin_ctzll(m_bits));
-        m_bits &= m_bits - 1;
-        return at;
-    }
-
-private:
-    static constexpr size_t kBlock = 64;
-
-    void Load(size_t block)
-    {
-        m_block = block;
-        const char* const bytes = m_text + block;
-        std::uint64_t bits = 0;
-#if defined(__SSE2__)
-        const __m128i delimiter = _mm_set1_epi8(m_delimiter);
-        for (size_t k = 0; k < kBlock; k += 16) {
-            const __m128i chunk = _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes + k));
-            bits |= static_cast<std::uint64_t>(static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi8(chunk, delimiter))))
-                    << k;
-        }
-#else
-        for (size_t k = 0; k < kBlock; ++k)
-            bits |= static_cast<std::uint64_t>(bytes[k] == m_delimiter) << k;
-#endif
-        const size_t left = m_length - block;
-        if (left < kBlock)
-            bits &= (std::uint64_t{1} << left) - 1;
-        m_bits = bits;
-    }
-
-    const char* m_text;
-    size_t m_length;
-    char m_delimiter;
-    size_t m_block = 0;
-    std::uint64_t m_bits = 0;
-};
-
-} // namespace
-
 bool AsciiSeriesReader::ReadFieldValue(const char* field, size_t size, double& value) const
 {
     if (IsDeleted({field, size})) {
@@ -559,7 +434,7 @@ bool AsciiSeriesReader::ReadFieldValue(const char* field, size_t size, double& v
 
 bool AsciiSeriesReader::ReadDataLineByBlocks(std::string_view line, Row& row)
 {
-    DelimiterWalk delimiters(line, m_delimiter[0]);
+    delimited::DelimiterWalk delimiters(line, m_dialect.delimiter[0]);
     const size_t length = line.size();
     const size_t stampEnd = delimiters.Next();
     // No delimiter, a line ending just after the date/time, or a quote: the general walk's to judge.
@@ -612,10 +487,31 @@ bool AsciiSeriesReader::ReadDataLineByBlocks(std::string_view line, Row& row)
     return true;
 }
 
-// The same walk as ReadDataLine, with the fields taken as it goes instead of from a split line.
+namespace {
+
+// The next field of a plain line, with a field that is a plain decimal read on the way (`read` then
+// true and `value` set). False when the field is the rule's to take.
+bool NextReading(delimited::PlainFields& fields, std::string_view line, std::string_view& text, int& end,
+                 double& value, bool& read)
+{
+    read = false;
+    if (const size_t at = fields.Position(); at < line.size()) {
+        const char* const stop = ScanPlainDecimal(line.data() + at, line.data() + line.size(), value);
+        if (stop != nullptr && fields.TakeEndingAt(static_cast<size_t>(stop - line.data()), text, end)) {
+            read = true;
+            return true;
+        }
+    }
+    return fields.Next(text, end);
+}
+
+} // namespace
+
+// The same walk as ReadDataLine, with the fields taken as it goes instead of from a split line. A
+// first field that is the whole line (no delimiter in it) is ReadDataLine's to report.
 bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
 {
-    FieldCursor fields(line, m_delimiter[0]);
+    delimited::PlainFields fields(line, m_dialect.delimiter[0]);
     const bool readsPlain = m_numbers.ReadsPlainDecimals();
     const int length = static_cast<int>(line.size());
     row.values.assign(m_selection.size(), kMissing);
@@ -628,7 +524,7 @@ bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
         if (j + 1 == m_stampColumn) {
             std::string_view stampText;
             for (int w = 0; w < m_formatColumns; ++w) {
-                if (pos == -1 || !fields.Next(text, pos))
+                if (pos == -1 || !fields.Next(text, pos) || text.size() == line.size())
                     return false;
                 if (w == 0) {
                     stampText = text;
@@ -653,9 +549,9 @@ bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
             const int slot = item < m_slotOfItem.size() ? m_slotOfItem[item] : -1;
             double value = kMissing;
             bool scanned = false;
-            const bool taken =
-                slot >= 0 && readsPlain ? fields.NextReading(text, pos, value, scanned) : fields.Next(text, pos);
-            if (!taken)
+            const bool taken = slot >= 0 && readsPlain ? NextReading(fields, line, text, pos, value, scanned)
+                                                       : fields.Next(text, pos);
+            if (!taken || text.size() == line.size())
                 return false;
             if (pos != -1) {
                 ++item;
@@ -678,9 +574,7 @@ bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
 bool AsciiSeriesReader::ReadDataLine(std::string_view line, Row& row)
 {
     const long lineNumber = m_lines.LineNumber();
-    const bool hasDelimiter = m_delimiter.size() == 1 ? line.find(m_delimiter[0]) != std::string_view::npos
-                                                       : line.find(m_delimiter) != std::string_view::npos;
-    if (!hasDelimiter)
+    if (!delimited::Delimiter(m_dialect.delimiter).FoundIn(line))
         return Fail(m_path, lineNumber, res::LoadString(res::IDS_NO_DELIMITERS));
     m_splitter.Split(line);
     if (m_splitter.QuoteError())
@@ -711,7 +605,7 @@ bool AsciiSeriesReader::ReadDataLine(std::string_view line, Row& row)
                 ++j;
             }
         } else {
-            const FieldSplitter::Call& call = calls[next++];
+            const delimited::FieldSplitter::Call& call = calls[next++];
             pos = call.end;
             if (pos != -1) {
                 const int slot = item < m_slotOfItem.size() ? m_slotOfItem[item] : -1;

@@ -1,13 +1,14 @@
 #pragma once
 // Reads a delimited text file through an ASCII template, over the whole file: the header rows give
-// the items, every data line one row. The lines are split, the header rows read and the data lines
-// checked exactly as the preview parser does it; in addition the date/time texts are read with the
-// template's formats and the values as numbers with its decimal separator.
-#include "converter/FieldSplitter.h"
+// the items, every data line one row. The lines are split by the one field rule of delimited text
+// (delimited/FieldSplitter.h), the header rows read and the data lines checked exactly as the preview
+// parser does it; in addition the date/time texts are read with the template's formats and the
+// values as numbers with its decimal separator.
 #include "platform/system/TextLineReader.h"
 #include "converter/NumberText.h"
 #include "converter/SeriesReader.h"
 #include "converter/StampText.h"
+#include "delimited/FieldSplitter.h"
 
 #include <memory>
 #include <optional>
@@ -55,11 +56,11 @@ private:
 
     const CSpecification& m_spec;
     std::string m_path;
-    FieldSplitter m_splitter;
+    delimited::FieldSplitter m_splitter;  // with the template's dialect
+    const delimited::Dialect& m_dialect; // m_splitter's
     NumberReader m_numbers;
     sys::TextLineReader m_lines;
 
-    std::string m_delimiter;
     bool m_fusable = false; // the template allows the one-pass reading of data lines
     bool m_fusedOn = true;
     bool m_blockOn = true;

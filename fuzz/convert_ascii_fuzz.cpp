@@ -2,8 +2,8 @@
 // comma template that ignores consecutive and leading delimiters; the fast splitter must also give
 // NextField's calls for every line, and the date/time reader's shortcut its token-by-token reading.
 #include "converter/AsciiSeriesReader.h"
-#include "converter/FieldSplitter.h"
 #include "converter/StampText.h"
+#include "delimited/FieldSplitter.h"
 #include "platform/system/OleDateTime.h"
 #include "platform/ui/UserInterface.h"
 #include "templates/AsciiSpecification.h"
@@ -28,7 +28,7 @@ void ReadWhole(const CSpecification& spec, const std::string& path)
 
 void CompareSplits(const CSpecification& spec, const std::string& line)
 {
-    converter::FieldSplitter splitter(spec);
+    delimited::FieldSplitter splitter(spec.GetDialect());
     splitter.Split(line);
     CString copy = line;
     int pos = 0;

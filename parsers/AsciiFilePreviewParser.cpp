@@ -57,8 +57,6 @@ ui::Row RawRow(const CString& line)
     return ui::Row{std::move(shown)};
 }
 
-bool Contains(const CString& line, const CString& part) { return line.find(part) != CString::npos; }
-
 bool IsKnownValueType(const CString& name)
 {
     int code = 0;
@@ -428,7 +426,7 @@ bool CAsciiFilePreviewParser::ReadColumnCountAndNames(const DeleteValue& deleteV
         if (n == data.m_nStartRow)
             startLine = std::move(line);
     }
-    if (!Contains(startLine, m_pSpecification->GetDelimiterString()))
+    if (!delimited::Delimiter(m_pSpecification->GetDelimiterString()).FoundIn(startLine))
         return Refuse(res::IDS_NO_DELIMITERS, data.m_nStartRow);
     columns = CountFieldCalls(*m_pSpecification, startLine) - m_pSpecification->CountFormatColumns(1);
     if (columns < 1)
@@ -481,7 +479,8 @@ bool CAsciiFilePreviewParser::ReadNamesFromLine(const CString& nameLine, int col
 bool CAsciiFilePreviewParser::ReadHeaderAndDataLines(int columns, const DeleteValue& deleteValue)
 {
     const int startRow = m_pSpecification->m_DataDesc.m_nStartRow;
-    const CString delimiter = m_pSpecification->GetDelimiterString();
+    const CString delimiterText = m_pSpecification->GetDelimiterString();
+    const delimited::Delimiter delimiter(delimiterText);
     PreviewLines reader(m_strFile);
     CString line;
     for (long long n = 1; n < startRow && reader.Read(line, kShownLineBytes); ++n)
@@ -491,7 +490,7 @@ bool CAsciiFilePreviewParser::ReadHeaderAndDataLines(int columns, const DeleteVa
         m_vecRawLines.push_back(RawRow(line));
         if (line.empty())
             continue;
-        if (!Contains(line, delimiter))
+        if (!delimiter.FoundIn(line))
             return Refuse(res::IDS_NO_DELIMITERS, reader.LineNumber());
         if (!ParseDataLine(line, reader.LineNumber(), columns, deleteValue))
             return false;
@@ -504,7 +503,7 @@ bool CAsciiFilePreviewParser::ParseDataLine(const CString& line, long number, in
 {
     const int firstDateTimeField = m_pSpecification->GetDateTimeColumn();
     const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
-    const CString decimalSeparator = m_pSpecification->GetDecimalSeparatorString();
+    const delimited::Dialect dialect = m_pSpecification->GetDialect();
     CFieldCursor cursor(*m_pSpecification, line);
     ui::Row row;
     bool hasDateTime = false;
@@ -517,7 +516,7 @@ bool CAsciiFilePreviewParser::ParseDataLine(const CString& line, long number, in
         } else {
             CString field = cursor.Next();
             if (!cursor.AtEnd()) {
-                if (!UsesDecimalSeparator(field, decimalSeparator))
+                if (dialect.UsesOtherDecimalSeparator(field))
                     return Refuse(res::IDS_DECIMAL_SEPARATOR_MISMATCH, number);
                 row.push_back(deleteValue.Matches(field) ? CString() : std::move(field));
             }
@@ -561,13 +560,6 @@ bool CAsciiFilePreviewParser::TakeDateTime(CFieldCursor& cursor, long number, ui
         ++column;
     }
     return true;
-}
-
-bool CAsciiFilePreviewParser::UsesDecimalSeparator(const CString& field, const CString& separator)
-{
-    if (field.empty() || Contains(field, separator) || (separator != "." && separator != ","))
-        return true;
-    return !Contains(field, separator == "." ? "," : ".");
 }
 
 int CAsciiFilePreviewParser::ReadRawLines(const CString& path)

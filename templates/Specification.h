@@ -1,5 +1,6 @@
 #pragma once
 // The template: how the values of a delimited ASCII file or an Excel sheet are laid out.
+#include "delimited/Dialect.h"
 #include "platform/system/Types.h"
 
 // One item column described by hand.
@@ -74,9 +75,13 @@ public:
     // (sys::LocaleDecimalSeparator).
     // 0 (and a blank) for an unknown name.
     static int MapSeparatorName(const CString& name, CString& text);
+    // The delimiter, the two delimiter flags and the decimal separator as one value, for the readers
+    // of delimited text (delimited/Dialect.h).
+    delimited::Dialect GetDialect() const;
     // The next field of `line` from `pos` (0 for the first call); `pos` becomes -1 after the last
-    // field. A user delimiter of several characters separates only where its whole text stands. A
-    // malformed quoted field shows message 2305 and gives an empty field.
+    // field: delimited::FieldRule, which may also cut delimiters off the line's start. A user delimiter
+    // of several characters separates only where its whole text stands. A malformed quoted field shows
+    // message 2305 and gives an empty field.
     CString NextField(CString& line, int& pos) const;
 
     static int GetValueTypeCode(const CString& name, int& code);
