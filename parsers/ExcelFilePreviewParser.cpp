@@ -346,18 +346,24 @@ struct RowTimeParts {
     bool useFormat;
 };
 
+// `text` read by `format` from the fields `start` into `fields`, which stay as they were when the
+// text does not read.
+bool ReadFields(const CString& text, const CString& format, DateFormat::Reads reads, DateTimeFields start,
+                DateTimeFields& fields)
+{
+    if (!DateFormat(format, reads).Read(text, start))
+        return false;
+    fields = start;
+    return true;
+}
+
 // The two halves of a stamp: each is read from a text by its format, or taken from a date-time.
 struct DateHalf {
     static constexpr DateReading kGlobalReading = DateReading::DateOnly;
     // Year, month and day from the text, starting at 1 January of the year 100.
     static bool Parse(const CString& text, const CString& format, DateTimeFields& date)
     {
-        DateTimeFields read;
-        read.year = 100;
-        if (!DateFormat(format, DateFormat::Reads::Date).Read(text, read))
-            return false;
-        date = read;
-        return true;
+        return ReadFields(text, format, DateFormat::Reads::Date, {100, 1, 1, 0, 0, 0}, date);
     }
     static bool Take(const COleDateTime& value, DateTimeFields& date) { return TakeDate(value, date); }
     static COleDateTime With(const DateTimeFields& date, const DateTimeFields& time) { return Combine(date, time); }
@@ -368,11 +374,7 @@ struct TimeHalf {
     // Hour, minute and second from the text; those it does not reach keep the values passed in.
     static bool Parse(const CString& text, const CString& format, DateTimeFields& time)
     {
-        DateTimeFields read = time;
-        if (!DateFormat(format, DateFormat::Reads::Time).Read(text, read))
-            return false;
-        time = read;
-        return true;
+        return ReadFields(text, format, DateFormat::Reads::Time, time, time);
     }
     static bool Take(const COleDateTime& value, DateTimeFields& time) { return TakeTimeOfDay(value, time); }
     static COleDateTime With(const DateTimeFields& time, const DateTimeFields& date) { return Combine(date, time); }
