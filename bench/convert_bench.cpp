@@ -72,9 +72,9 @@ double PeakMegabytes()
     return static_cast<double>(usage.ru_maxrss) / 1024.0;
 }
 
-void Run(benchmark::State& state, converter::Format in, const std::string& input, converter::Format out, size_t rows)
+void Run(benchmark::State& state, sys::FileFormat in, const std::string& input, sys::FileFormat out, size_t rows)
 {
-    const std::string output = (Folder() / (std::string("out") + converter::OutputExtension(out))).string();
+    const std::string output = (Folder() / (std::string("out") + sys::FormatInfo(out).outputExtension)).string();
     std::unique_ptr<CSpecification> spec;
     sys::Status status;
     spec = converter::LoadTemplate(in, "", status);
@@ -92,7 +92,7 @@ void Run(benchmark::State& state, converter::Format in, const std::string& input
 
 void TextToRbx0(benchmark::State& state)
 {
-    Run(state, converter::Format::Ascii, MakeText(Rows()), converter::Format::Rbx0, Rows());
+    Run(state, sys::FileFormat::Ascii, MakeText(Rows()), sys::FileFormat::Rbx0, Rows());
 }
 
 void Rbx0ToText(benchmark::State& state)
@@ -100,15 +100,15 @@ void Rbx0ToText(benchmark::State& state)
     const std::string text = MakeText(Rows());
     const std::string rbx0 = (Folder() / "in.rbx0").string();
     sys::Status status;
-    auto spec = converter::LoadTemplate(converter::Format::Ascii, "", status);
-    converter::ConvertFile({converter::Format::Ascii, text, spec.get(), {}, converter::Format::Rbx0, rbx0, ""});
-    Run(state, converter::Format::Rbx0, rbx0, converter::Format::Ascii, Rows());
+    auto spec = converter::LoadTemplate(sys::FileFormat::Ascii, "", status);
+    converter::ConvertFile({sys::FileFormat::Ascii, text, spec.get(), {}, sys::FileFormat::Rbx0, rbx0, ""});
+    Run(state, sys::FileFormat::Rbx0, rbx0, sys::FileFormat::Ascii, Rows());
 }
 
 void TextToXlsx(benchmark::State& state)
 {
     const size_t rows = std::max<size_t>(1, Rows() / 10);
-    Run(state, converter::Format::Ascii, MakeText(rows), converter::Format::Excel, rows);
+    Run(state, sys::FileFormat::Ascii, MakeText(rows), sys::FileFormat::Excel, rows);
 }
 
 // Reading the benchmark's values ("%.4f" of 0 to 1000), ten fields a line: each plain field reader

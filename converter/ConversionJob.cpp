@@ -113,9 +113,9 @@ bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
 
 std::string CheckJobSetup(const JobSetup& setup)
 {
-    if (!IsFormat(setup.inputFormat))
+    if (!(sys::FindFormat(setup.inputFormat) != nullptr))
         return "the input format " + std::to_string(setup.inputFormat) + " is not 1 (rbx0), 2 (ASCII) or 3 (Excel)";
-    if (!IsFormat(setup.outputFormat))
+    if (!(sys::FindFormat(setup.outputFormat) != nullptr))
         return "the output format " + std::to_string(setup.outputFormat) + " is not 1 (rbx0), 2 (ASCII) or 3 (Excel)";
     if (std::string problem = SelectionProblem(setup.items, std::numeric_limits<size_t>::max()); !problem.empty())
         return problem;
@@ -195,11 +195,11 @@ std::string DescribeReport(const FileReport& report)
 int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
 {
     const std::string problem = CheckJobSetup(setup);
-    const Format in = static_cast<Format>(setup.inputFormat);
-    const Format out = static_cast<Format>(setup.outputFormat);
-    log.Write("run " + COleDateTime::GetCurrentTime().Format("%Y-%m-%d %H:%M:%S") + ": " + FormatName(in) + " " +
+    const sys::FileFormat in = static_cast<sys::FileFormat>(setup.inputFormat);
+    const sys::FileFormat out = static_cast<sys::FileFormat>(setup.outputFormat);
+    log.Write("run " + COleDateTime::GetCurrentTime().Format("%Y-%m-%d %H:%M:%S") + ": " + sys::FormatInfo(in).name + " " +
               Escaped(setup.inputType == 2 ? "folder " + setup.inputFolder : "file " + setup.inputFile) + " -> " +
-              FormatName(out) + " " +
+              sys::FormatInfo(out).name + " " +
               Escaped(setup.inputType == 2 ? "folder " + setup.outputFolder : "file " + setup.outputFile) + "; template " +
               (setup.templateName.empty() ? "(defaults)" : Escaped(setup.templateName)) + "; items " + Join(setup.items));
     if (!problem.empty()) {
@@ -274,7 +274,7 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
     std::string summary = "result: " + std::to_string(converted) + " converted, " + std::to_string(failed) +
                           " skipped or failed";
     if (reports.empty())
-        summary += "; the folder holds no " + std::string(FormatName(in)) + " file";
+        summary += "; the folder holds no " + std::string(sys::FormatInfo(in).name) + " file";
     if (setup.inputType == 2 && failed > 0)
         summary += "; " + res::LoadString(res::IDS_FOLDER_FILES_SKIPPED);
     log.Write(summary + "; exit status " + std::to_string(exitCode));

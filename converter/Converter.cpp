@@ -23,36 +23,6 @@ namespace converter {
 namespace {
 
 constexpr std::uint64_t kProgressEvery = 1u << 16;
-constexpr size_t kTextProbeBytes = 40960;
-
-std::string ExtensionOf(const std::string& path)
-{
-    const std::string name = sys::FileTitle(path);
-    const size_t dot = name.rfind('.');
-    return dot == std::string::npos ? std::string() : text::ToLower(name.substr(dot));
-}
-
-// A file without extension counts as text when its first bytes hold no zero byte.
-bool LooksLikeText(const std::string& path)
-{
-    std::FILE* file = std::fopen(path.c_str(), "rb");
-    if (!file)
-        return false;
-    char buffer[4096];
-    size_t total = 0;
-    bool text = true;
-    while (total < kTextProbeBytes && text) {
-        const size_t got = std::fread(buffer, 1, std::min(sizeof buffer, kTextProbeBytes - total), file);
-        if (got == 0)
-            break;
-        for (size_t i = 0; i < got; ++i)
-            if (buffer[i] == '\0')
-                text = false;
-        total += got;
-    }
-    std::fclose(file);
-    return text && total > 0;
-}
 
 FileReport Refuse(FileReport report, sys::Status status, bool templateFits)
 {
@@ -64,48 +34,12 @@ FileReport Refuse(FileReport report, sys::Status status, bool templateFits)
 
 } // namespace
 
-bool IsFormat(int number) { return number >= 1 && number <= 3; }
-
-const char* FormatName(Format format)
-{
-    switch (format) {
-    case Format::Rbx0: return "rbx0";
-    case Format::Ascii: return "ASCII";
-    case Format::Excel: return "Excel";
-    }
-    return "?";
-}
-
-const char* OutputExtension(Format format)
-{
-    switch (format) {
-    case Format::Rbx0: return ".rbx0";
-    case Format::Ascii: return ".txt";
-    case Format::Excel: return ".xlsx";
-    }
-    return "";
-}
-
-bool AcceptsExtension(Format format, const std::string& path)
-{
-    const std::string extension = ExtensionOf(path);
-    switch (format) {
-    case Format::Rbx0: return extension == ".rbx0";
-    case Format::Ascii:
-        if (extension == ".txt" || extension == ".tab" || extension == ".csv")
-            return true;
-        return extension.empty() && LooksLikeText(path);
-    case Format::Excel: return extension == ".xls" || extension == ".xlsx";
-    }
-    return false;
-}
-
-std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& path, sys::Status& status)
+std::unique_ptr<CSpecification> LoadTemplate(sys::FileFormat format, const std::string& path, sys::Status& status)
 {
     std::unique_ptr<CSpecification> spec;
-    if (format == Format::Ascii)
+    if (format == sys::FileFormat::Ascii)
         spec = std::make_unique<CAsciiSpecification>();
-    else if (format == Format::Excel)
+    else if (format == sys::FileFormat::Excel)
         spec = std::make_unique<CExcelSpecification>();
     else
         return nullptr;
@@ -118,23 +52,23 @@ std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& p
     return spec;
 }
 
-std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* spec)
+std::unique_ptr<SeriesReader> MakeReader(sys::FileFormat format, const CSpecification* spec)
 {
     switch (format) {
-    case Format::Rbx0: return std::make_unique<RbxSeriesReader>();
-    case Format::Ascii: return spec ? std::make_unique<AsciiSeriesReader>(*spec) : nullptr;
-    case Format::Excel: return spec ? std::make_unique<ExcelSeriesReader>(*spec) : nullptr;
+    case sys::FileFormat::Rbx0: return std::make_unique<RbxSeriesReader>();
+    case sys::FileFormat::Ascii: return spec ? std::make_unique<AsciiSeriesReader>(*spec) : nullptr;
+    case sys::FileFormat::Excel: return spec ? std::make_unique<ExcelSeriesReader>(*spec) : nullptr;
     }
     return nullptr;
 }
 
-std::unique_ptr<SeriesWriter> MakeWriter(Format format, const std::string& output)
+std::unique_ptr<SeriesWriter> MakeWriter(sys::FileFormat format, const std::string& output)
 {
     switch (format) {
-    case Format::Rbx0: return std::make_unique<RbxSeriesWriter>();
-    case Format::Ascii: return std::make_unique<AsciiSeriesWriter>();
-    case Format::Excel:
-        if (ExtensionOf(output) == ".xls")
+    case sys::FileFormat::Rbx0: return std::make_unique<RbxSeriesWriter>();
+    case sys::FileFormat::Ascii: return std::make_unique<AsciiSeriesWriter>();
+    case sys::FileFormat::Excel:
+        if (text::EqualsNoCase(sys::FileExtension(output), ".xls"))
             return std::make_unique<XlsSeriesWriter>();
         return std::make_unique<XlsxSeriesWriter>();
     }
@@ -156,7 +90,7 @@ std::string SelectionProblem(const CUIntArray& items, size_t count)
     return {};
 }
 
-bool CanConvert(Format format, const std::string& file, const std::string& templatePath, std::string* reason)
+bool CanConvert(sys::FileFormat format, const std::string& file, const std::string& templatePath, std::string* reason)
 {
     auto refuse = [&](const std::string& why) {
         if (reason)
@@ -166,15 +100,15 @@ bool CanConvert(Format format, const std::string& file, const std::string& templ
     try {
         if (!sys::IsRegularFile(file))
             return refuse(file + ": no such file");
-        if (!AcceptsExtension(format, file))
-            return refuse(file + ": the extension does not suit " + FormatName(format) + " input");
+        if (!sys::IsInputOf(format, file))
+            return refuse(file + ": the extension does not suit " + sys::FormatInfo(format).name + " input");
         sys::Status status;
         std::unique_ptr<CSpecification> spec = LoadTemplate(format, templatePath, status);
         if (!status)
             return refuse(status.problem().Describe());
         std::unique_ptr<SeriesReader> reader = MakeReader(format, spec.get());
         if (!reader)
-            return refuse(std::string(FormatName(format)) + " input cannot be read by this build");
+            return refuse(std::string(sys::FormatInfo(format).name) + " input cannot be read by this build");
         if (sys::Status opened = reader->Open(file); !opened)
             return refuse(opened.problem().Describe());
         Row row;
@@ -211,9 +145,9 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     report.output = job.output;
     std::unique_ptr<SeriesReader> reader = MakeReader(job.inputFormat, job.spec);
     if (!reader)
-        return Refuse(report, sys::Status::Fail(job.input, 0, std::string(FormatName(job.inputFormat)) + " input needs a template"), false);
+        return Refuse(report, sys::Status::Fail(job.input, 0, std::string(sys::FormatInfo(job.inputFormat).name) + " input needs a template"), false);
     // Only a template can fail to fit; an rbx0 file that cannot be opened is damaged.
-    const bool throughTemplate = job.inputFormat != Format::Rbx0;
+    const bool throughTemplate = job.inputFormat != sys::FileFormat::Rbx0;
     if (sys::Status opened = reader->Open(job.input); !opened)
         return Refuse(report, opened, !throughTemplate);
     report.itemsInFile = reader->Header().items.size();

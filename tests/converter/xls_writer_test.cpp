@@ -220,8 +220,8 @@ TEST(XlsWriter, LibreOfficeReadsTheWorkbook)
     ASSERT_TRUE(std::filesystem::exists(folder.Path("office.xlsx"))) << convtest::ReadFile(folder.Path("convert.log"));
 
     sys::Status status;
-    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Excel, "", status);
-    std::unique_ptr<SeriesReader> reader = MakeReader(Format::Excel, spec.get());
+    std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Excel, "", status);
+    std::unique_ptr<SeriesReader> reader = MakeReader(sys::FileFormat::Excel, spec.get());
     ASSERT_TRUE(reader->Open(folder.Path("office.xlsx"))) << reader->status().problem().Describe();
     EXPECT_EQ(reader->Header().timeTitle, "Date/time");
     ASSERT_EQ(reader->Header().items.size(), 2u);
@@ -262,8 +262,8 @@ TEST(XlsWriter, TheFormatsLimitsGiveClearErrors)
         text += FormatStamp(At(2020, 1, 1) + r * 60LL) + "\t" + std::to_string(r) + "\n";
     convtest::WriteFile(folder.Path("long.txt"), text);
     sys::Status status;
-    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Ascii, "", status);
-    FileJob job{Format::Ascii, folder.Path("long.txt"), spec.get(), {}, Format::Excel, folder.Path("long.xls"), ""};
+    std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Ascii, "", status);
+    FileJob job{sys::FileFormat::Ascii, folder.Path("long.txt"), spec.get(), {}, sys::FileFormat::Excel, folder.Path("long.xls"), ""};
     const FileReport report = ConvertFile(job);
     EXPECT_FALSE(report.converted);
     EXPECT_NE(report.problem.message.find("more rows than an .xls sheet holds (65536 with the two header rows)"),
@@ -278,8 +278,8 @@ TEST(XlsWriter, TheFormatsLimitsGiveClearErrors)
     convtest::WriteFile(folder.Path("long.txt"), text);
     const FileReport fits = ConvertFile(job);
     ASSERT_TRUE(fits.converted) << fits.problem.Describe();
-    std::unique_ptr<CSpecification> excel = LoadTemplate(Format::Excel, "", status);
-    FileJob back{Format::Excel, folder.Path("long.xls"), excel.get(), {}, Format::Ascii, folder.Path("back.txt"), ""};
+    std::unique_ptr<CSpecification> excel = LoadTemplate(sys::FileFormat::Excel, "", status);
+    FileJob back{sys::FileFormat::Excel, folder.Path("long.xls"), excel.get(), {}, sys::FileFormat::Ascii, folder.Path("back.txt"), ""};
     ASSERT_TRUE(ConvertFile(back).converted);
     EXPECT_EQ(convtest::ReadFile(folder.Path("back.txt")), text);
 }
@@ -298,12 +298,12 @@ TEST(ExcelOutput, StampsGetTheSheetsOwnDayNumbers)
         text += std::string(stamp) + "\t1\n";
     convtest::WriteFile(folder.Path("in.txt"), text);
     sys::Status status;
-    std::unique_ptr<CSpecification> ascii = LoadTemplate(Format::Ascii, "", status);
-    std::unique_ptr<CSpecification> excel = LoadTemplate(Format::Excel, "", status);
+    std::unique_ptr<CSpecification> ascii = LoadTemplate(sys::FileFormat::Ascii, "", status);
+    std::unique_ptr<CSpecification> excel = LoadTemplate(sys::FileFormat::Excel, "", status);
     for (const char* extension : {".xls", ".xlsx"}) {
         SCOPED_TRACE(extension);
         const std::string out = folder.Path(std::string("out") + extension);
-        FileJob job{Format::Ascii, folder.Path("in.txt"), ascii.get(), {}, Format::Excel, out, ""};
+        FileJob job{sys::FileFormat::Ascii, folder.Path("in.txt"), ascii.get(), {}, sys::FileFormat::Excel, out, ""};
         ASSERT_TRUE(ConvertFile(job).converted);
         // The other tools' view: xlrd's raw day numbers, openpyxl's dates (it knows the calendar).
         const pytools::Result read = pytools::Run(std::string(extension) == ".xls" ? R"(
@@ -325,7 +325,7 @@ for r in range(3, sheet.max_row + 1):
                                    ? "'0100/01/01 00:00:00'\n'1899/12/31 23:00:00'\n1.5\n59.0\n61.25\n44333.0\n"
                                    : "0100/01/01 00:00:00\n1899/12/31 23:00:00\n1900/01/01 12:00:00\n"
                                      "1900/02/28 00:00:00\n1900/03/01 06:00:00\n2021/05/17 00:00:00\n");
-        FileJob back{Format::Excel, out, excel.get(), {}, Format::Ascii, folder.Path("back.txt"), ""};
+        FileJob back{sys::FileFormat::Excel, out, excel.get(), {}, sys::FileFormat::Ascii, folder.Path("back.txt"), ""};
         const FileReport report = ConvertFile(back);
         ASSERT_TRUE(report.converted) << report.problem.Describe();
         EXPECT_EQ(convtest::ReadFile(folder.Path("back.txt")), text);

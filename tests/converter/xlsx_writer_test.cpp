@@ -47,8 +47,8 @@ ReadBack ReadWorkbook(const std::string& path)
 {
     ReadBack back;
     sys::Status status;
-    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Excel, "", status);
-    std::unique_ptr<SeriesReader> reader = MakeReader(Format::Excel, spec.get());
+    std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Excel, "", status);
+    std::unique_ptr<SeriesReader> reader = MakeReader(sys::FileFormat::Excel, spec.get());
     status = reader->Open(path);
     if (!status) {
         back.problem = status.problem().Describe();
@@ -329,9 +329,9 @@ TEST(XlsxWriter, WriteFailuresNameTheCauseAndLeaveNoOutput)
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), "Rainfall[mm]:Accumulated\nDate/time\tRain\n2020/01/01 00:00:00\t1\n");
     sys::Status status;
-    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Ascii, "", status);
+    std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Ascii, "", status);
     const std::string output = folder.Path("missing/out.xlsx");
-    const FileReport report = ConvertFile(FileJob{Format::Ascii, folder.Path("in.txt"), spec.get(), {}, Format::Excel, output, ""});
+    const FileReport report = ConvertFile(FileJob{sys::FileFormat::Ascii, folder.Path("in.txt"), spec.get(), {}, sys::FileFormat::Excel, output, ""});
     EXPECT_FALSE(report.converted);
     EXPECT_NE(report.problem.message.find("No such file or directory"), std::string::npos) << report.problem.message;
     EXPECT_FALSE(std::filesystem::exists(folder.Path("missing")));
