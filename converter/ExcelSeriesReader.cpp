@@ -84,8 +84,8 @@ sys::Status ExcelSeriesReader::ReadHeader()
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     sheet::WorkbookReader workbook;
-    if (!workbook.Open(m_path))
-        return sys::Status::Fail(m_path, 0, workbook.Error());
+    if (const sys::Status opened = workbook.Open(m_path); !opened)
+        return sys::Status::Fail(m_path, 0, opened.problem().message);
     if (m_sheet < 1 || m_sheet > workbook.SheetCount())
         return sys::Status::Fail(m_path, 0, res::LoadString(res::IDS_SHEET_INDEX_TOO_LARGE));
 
@@ -102,7 +102,7 @@ sys::Status ExcelSeriesReader::ReadHeader()
     // This pass goes over the whole sheet for its used columns; only the header rows need the
     // texts of their numbers.
     const std::vector<bool> noNumberTexts;
-    const bool read = workbook.ReadRows(m_sheet, [&](int row, const std::vector<sheet::RowCell>& cells) {
+    const sys::Status read = workbook.ReadRows(m_sheet, [&](int row, const std::vector<sheet::RowCell>& cells) {
         if (!cells.empty()) {
             first = first == 0 ? cells.front().column : std::min(first, cells.front().column);
             last = std::max(last, cells.back().column);
@@ -116,7 +116,7 @@ sys::Status ExcelSeriesReader::ReadHeader()
         return true;
     }, &noNumberTexts);
     if (!read)
-        return sys::Status::Fail(m_path, 0, workbook.Error());
+        return sys::Status::Fail(m_path, 0, read.problem().message);
     for (const auto& [row, header] : headerRows)
         if (row < data.m_nStartRow)
             NoteFormulasWithoutResult(header);
@@ -257,19 +257,19 @@ void ExcelSeriesReader::StartRows()
             m_changed.notify_all();
             return true;
         };
-        bool ok = workbook.Open(m_path);
-        if (ok)
-            ok = workbook.ReadRows(m_sheet, [&](int number, const std::vector<sheet::RowCell>& cells) {
+        sys::Status read = workbook.Open(m_path);
+        if (read)
+            read = workbook.ReadRows(m_sheet, [&](int number, const std::vector<sheet::RowCell>& cells) {
                 if (number < startRow)
                     return true;
                 batch.push_back(SheetRow{number, cells});
                 return batch.size() < kBatchRows || handOver();
             }, textColumns.empty() ? nullptr : &textColumns);
-        if (ok && !batch.empty())
+        if (read && !batch.empty())
             handOver();
         std::lock_guard<std::mutex> lock(m_mutex);
-        if (!ok && !m_stop)
-            m_producerError = workbook.Error();
+        if (!read && !m_stop)
+            m_producerError = read.problem().message;
         m_producerDone = true;
         m_changed.notify_all();
     });

@@ -183,14 +183,14 @@ print("workbook", len(book), zlib.crc32(book))
                                   std::to_string(rbx::Crc32(0, stream.data(), stream.size())) + "\n");
 
     sheet::WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(path)) << reader.Error();
+    ASSERT_TRUE(reader.Open(path)) << reader.status().problem().message;
     int rows = 0;
     std::vector<sheet::RowCell> last;
     ASSERT_TRUE(reader.ReadRows(1, [&](int number, const std::vector<sheet::RowCell>& cells) {
         rows = number;
         last = cells;
         return true;
-    })) << reader.Error();
+    })) << reader.status().problem().message;
     EXPECT_EQ(rows, 65536);
     ASSERT_EQ(last.size(), 21u);
     EXPECT_EQ(last[0].text, "2020/02/15 12:13:00");
