@@ -17,12 +17,6 @@ namespace {
 constexpr size_t kValuesPerBlock = 64 * 1024;
 
 // The reader's messages may already name the file; the problem names it once.
-std::string WithoutPath(const std::string& message, const std::string& path)
-{
-    const std::string prefix = path + ": ";
-    return message.compare(0, prefix.size(), prefix) == 0 ? message.substr(prefix.size()) : message;
-}
-
 // std::llround without the library call where the fraction is exact (below 2^52 the integer part
 // of a double and what remains are exact); the same result everywhere.
 long long RoundHalfAway(double x)
@@ -52,8 +46,8 @@ RbxSeriesReader::~RbxSeriesReader() = default;
 sys::Status RbxSeriesReader::Open(const std::string& path)
 {
     m_path = path;
-    if (!m_reader->Open(path))
-        return m_status = sys::Status::Fail(path, 0, WithoutPath(m_reader->Error(), path));
+    if (const sys::Status opened = m_reader->Open(path); !opened)
+        return m_status = sys::Status::Fail(path, 0, opened.problem().message);
     const rbx::FileHeader& header = m_reader->Header();
     const rbx::TimeAxis& axis = header.axis;
     if (!rbx::IsCalendarAxis(axis.type))
@@ -124,7 +118,7 @@ bool RbxSeriesReader::FillBlock()
 {
     size_t got = 0;
     if (!m_reader->ReadRawSteps(m_blockSteps, m_records.data(), got)) {
-        m_status = sys::Status::Fail(m_path, 0, WithoutPath(m_reader->Error(), m_path) + " (after " + std::to_string(m_stepIndex) + " time steps)");
+        m_status = sys::Status::Fail(m_path, 0, m_reader->status().problem().message + " (after " + std::to_string(m_stepIndex) + " time steps)");
         return false;
     }
     m_inBlock = got;

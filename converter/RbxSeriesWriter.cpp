@@ -56,8 +56,8 @@ sys::Status RbxSeriesWriter::Begin(const std::string& path, const SeriesHeader& 
 
 sys::Status RbxSeriesWriter::OpenWriter()
 {
-    if (!m_writer->Open(m_path, *m_definition))
-        return sys::Status::Fail(m_path, 0, m_writer->Error());
+    if (const sys::Status opened = m_writer->Open(m_path, *m_definition); !opened)
+        return sys::Status::Fail(m_path, 0, opened.problem().Describe());
     return sys::Status::Ok();
 }
 
@@ -75,7 +75,7 @@ sys::Status RbxSeriesWriter::Write(const Row& row)
     }
     m_previous = row.stamp;
     if (!m_writer->WriteStep(static_cast<double>(row.stamp - m_start), row.values.data()))
-        return sys::Status::Fail(m_path, 0, m_writer->Error());
+        return sys::Status::Fail(m_path, 0, m_writer->status().problem().Describe());
     return sys::Status::Ok();
 }
 
@@ -84,8 +84,8 @@ sys::Status RbxSeriesWriter::Finish()
     if (m_first)
         if (sys::Status opened = OpenWriter(); !opened)
             return opened;
-    if (!m_writer->Close())
-        return sys::Status::Fail(m_path, 0, m_writer->Error());
+    if (const sys::Status closed = m_writer->Close(); !closed)
+        return sys::Status::Fail(m_path, 0, closed.problem().Describe());
     return sys::Status::Ok();
 }
 

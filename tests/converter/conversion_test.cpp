@@ -170,7 +170,7 @@ TEST(Conversion, Rbx0HeaderDescribesAxisAndItems)
         convtest::WriteFile(folder.Path("in.txt"), c.text);
         ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("out.rbx0")).converted);
         rbx::CRbxReader reader;
-        ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.Error();
+        ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.status().problem().Describe();
         const rbx::FileHeader& header = reader.Header();
         EXPECT_EQ(header.title, "Title");
         EXPECT_EQ(header.axis.type, c.axisType);

@@ -103,7 +103,7 @@ TEST_F(TextInputConversion, EightBitNamesAreWindows1252InEveryOutput)
 
     ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("out.rbx0")).converted);
     rbx::CRbxReader reader;
-    ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.Error();
+    ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.status().problem().Describe();
     EXPECT_EQ(reader.Header().items.at(0).name, name);
 
     ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt")).converted);
