@@ -1,6 +1,7 @@
 #pragma once
 // The template: how the values of a delimited ASCII file or an Excel sheet are laid out.
 #include "delimited/Dialect.h"
+#include "platform/system/Status.h"
 #include "platform/system/Types.h"
 
 // One item column described by hand.
@@ -65,8 +66,10 @@ public:
     // The first column of the current date/time option; -1 for an unknown option.
     virtual int GetDateTimeColumn() const;
 
-    // Why the last Save or Load failed, for callers that can show more than a 0.
-    const CString& LastError() const { return m_strLastError; }
+    // Why the last Save or Load failed, for callers that can show more than a 0: the problem, and
+    // its text ("file: reason").
+    const sys::Status& LastStatus() const { return m_lastStatus; }
+    CString LastError() const { return m_lastStatus.problem().Describe(); }
 
     void SetTemplateFile(const CString& path);
     CString GetDelimiterString() const;
@@ -108,5 +111,5 @@ protected:
     CSpecification(const CSpecification&) = default;
     CSpecification& operator=(const CSpecification&) = default;
 
-    mutable CString m_strLastError;
+    sys::Status m_lastStatus;
 };
