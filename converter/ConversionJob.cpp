@@ -151,7 +151,7 @@ ConversionLog::ConversionLog(const std::string& path, std::FILE* echo) : m_echo(
         return;
     m_file = std::fopen(path.c_str(), "a");
     if (!m_file)
-        m_openError = path + ": cannot open the log file: " + std::strerror(errno);
+        m_status = sys::Status::Fail(path, 0, std::string("cannot open the log file: ") + std::strerror(errno));
 }
 
 ConversionLog::~ConversionLog()

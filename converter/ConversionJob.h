@@ -53,14 +53,15 @@ public:
     ConversionLog& operator=(const ConversionLog&) = delete;
 
     bool IsOpen() const { return m_file != nullptr; }
-    const std::string& OpenError() const { return m_openError; }
+    // Why the log file could not be opened.
+    const sys::Status& status() const { return m_status; }
     void Write(const std::string& entry);
 
 private:
     std::mutex m_mutex;
     std::FILE* m_file = nullptr;
     std::FILE* m_echo = nullptr;
-    std::string m_openError;
+    sys::Status m_status;
 };
 
 struct JobOptions {

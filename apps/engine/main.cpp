@@ -110,7 +110,7 @@ std::unique_ptr<converter::ConversionLog> OpenLog(const converter::JobSetup& set
     auto log = std::make_unique<converter::ConversionLog>(path, nullptr);
     if (log->IsOpen())
         return log;
-    std::fprintf(stderr, "Velmora: %s; logging to standard error\n", text::EscapeControls(log->OpenError()).c_str());
+    std::fprintf(stderr, "Velmora: %s; logging to standard error\n", text::EscapeControls(log->status().problem().Describe()).c_str());
     return std::make_unique<converter::ConversionLog>(std::string(), stderr);
 }
 
