@@ -64,19 +64,17 @@ private:
 
 } // namespace
 
-bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
+sys::Status ReadJobSetup(const std::string& path, JobSetup& setup)
 {
     WPXHANDLE doc = nullptr;
-    CString readError;
-    if (!wpxRead(path, &doc, &readError)) {
-        error = readError.empty() ? path + ": cannot read the setup file" : readError;
-        return false;
-    }
+    CString readError; // "file:line: message", as the parameter-file library words it
+    if (!wpxRead(path, &doc, &readError))
+        return readError.empty() ? sys::Status::Fail(path, 0, "cannot read the setup file")
+                                 : sys::Status::Fail({}, 0, readError);
     WPXHANDLE target = wpxTargetByNum(doc, 1);
     if (!target || wpxGetName(target) != "VELMORA") {
-        error = path + ": the setup file has no target \"VELMORA\"";
         wpxClose(&doc);
-        return false;
+        return sys::Status::Fail(path, 0, "the setup file has no target \"VELMORA\"");
     }
     setup.setupFile = path;
     WPXHANDLE input = wpxSectionByNameNum(target, "INPUT", 1);
@@ -93,10 +91,10 @@ bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
     for (int n = 1; n <= wpxGetNoParams(items); ++n) {
         const int item = wpxGetInt(wpxParamByNum(items, n));
         if (item < 0) {
-            error = path + ": Items entry " + std::to_string(n) + " is " + std::to_string(item) +
-                    ", not an item position (numbered from 0)";
             wpxClose(&doc);
-            return false;
+            return sys::Status::Fail(path, 0,
+                                     "Items entry " + std::to_string(n) + " is " + std::to_string(item) +
+                                         ", not an item position (numbered from 0)");
         }
         setup.items.push_back(static_cast<unsigned>(item));
     }
@@ -108,7 +106,7 @@ bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
     wpxGetParam(output, "File_title", &setup.title, 1, 1);
     wpxGetParam(output, "Log_file", &setup.logFile, 1, 1);
     wpxClose(&doc);
-    return true;
+    return sys::Status::Ok();
 }
 
 std::string CheckJobSetup(const JobSetup& setup)

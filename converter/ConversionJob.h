@@ -35,7 +35,7 @@ struct JobSetup {
 };
 
 // Reads the setup file; false with `error` ("file:line: ...") when it cannot be read.
-bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error);
+sys::Status ReadJobSetup(const std::string& path, JobSetup& setup);
 // Why the setup cannot run, or empty when it can. An output problem is not one: it refuses only the
 // files it concerns (see RunPlan).
 std::string CheckJobSetup(const JobSetup& setup);

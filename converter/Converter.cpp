@@ -90,33 +90,28 @@ std::string SelectionProblem(const CUIntArray& items, size_t count)
     return {};
 }
 
-bool CanConvert(sys::FileFormat format, const std::string& file, const std::string& templatePath, std::string* reason)
+sys::Status CanConvert(sys::FileFormat format, const std::string& file, const std::string& templatePath)
 {
-    auto refuse = [&](const std::string& why) {
-        if (reason)
-            *reason = why;
-        return false;
-    };
     try {
         if (!sys::IsRegularFile(file))
-            return refuse(file + ": no such file");
+            return sys::Status::Fail(file, 0, "no such file");
         if (!sys::IsInputOf(format, file))
-            return refuse(file + ": the extension does not suit " + sys::FormatInfo(format).name + " input");
+            return sys::Status::Fail(file, 0, std::string("the extension does not suit ") + sys::FormatInfo(format).name + " input");
         sys::Status status;
         std::unique_ptr<CSpecification> spec = LoadTemplate(format, templatePath, status);
         if (!status)
-            return refuse(status.problem().Describe());
+            return status;
         std::unique_ptr<SeriesReader> reader = MakeReader(format, spec.get());
         if (!reader)
-            return refuse(std::string(sys::FormatInfo(format).name) + " input cannot be read by this build");
+            return sys::Status::Fail({}, 0, std::string(sys::FormatInfo(format).name) + " input cannot be read by this build");
         if (sys::Status opened = reader->Open(file); !opened)
-            return refuse(opened.problem().Describe());
+            return opened;
         Row row;
         if (!reader->Next(row) && !reader->status())
-            return refuse(reader->status().problem().Describe());
-        return true;
+            return reader->status();
+        return sys::Status::Ok();
     } catch (const std::exception& e) {
-        return refuse(file + ": " + e.what());
+        return sys::Status::Fail(file, 0, e.what());
     }
 }
 

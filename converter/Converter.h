@@ -32,9 +32,9 @@ std::unique_ptr<SeriesWriter> MakeWriter(sys::FileFormat format, const std::stri
 // of `count` items: an item named twice or one beyond the file's. Empty when it can.
 std::string SelectionProblem(const CUIntArray& items, size_t count);
 
-// True when the engine would convert `file` with this template: its extension suits the format and
-// the reader accepts its header and its first data row. `reason` (may be null) says why not.
-bool CanConvert(sys::FileFormat format, const std::string& file, const std::string& templatePath, std::string* reason);
+// Ok when the engine would convert `file` with this template: its extension suits the format and
+// the reader accepts its header and its first data row; else the problem that stops it.
+sys::Status CanConvert(sys::FileFormat format, const std::string& file, const std::string& templatePath);
 
 struct FileJob {
     sys::FileFormat inputFormat = sys::FileFormat::Ascii;

@@ -51,9 +51,10 @@ Verdict JudgeSilently(const Request& request, const RecordingSilence& silence)
         if (attributes && attributes->hidden)
             return Refuse(Quoted(request.dataFile) + " is hidden; a folder run passes over it");
     }
-    std::string reason;
-    if (converter::CanConvert(format, request.dataFile, templatePath, &reason))
+    const sys::Status verdict = converter::CanConvert(format, request.dataFile, templatePath);
+    if (verdict)
         return Accept();
+    std::string reason = verdict.problem().Describe();
     if (reason.empty())
         reason = silence.FirstMessage();
     return Refuse(reason.empty() ? Quoted(request.dataFile) + ": the engine would not convert it" : reason);

@@ -256,14 +256,17 @@ TEST(Conversion, CanConvertJudgesExtensionTemplateAndContent)
     convtest::WriteFile(folder.Path("noext"), kSample);
     convtest::WriteFile(folder.Path("binary"), std::string("a\0b", 3));
     convtest::WriteFile(folder.Path("misfit.txt"), "just words\n");
-    std::string reason;
-    EXPECT_TRUE(CanConvert(sys::FileFormat::Ascii, folder.Path("good.txt"), "", &reason)) << reason;
-    EXPECT_TRUE(CanConvert(sys::FileFormat::Ascii, folder.Path("noext"), "", &reason)) << reason;
-    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("good.dat"), "", &reason));
-    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("binary"), "", &reason));
-    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("misfit.txt"), "", &reason));
-    EXPECT_NE(reason.find("misfit.txt"), std::string::npos);
-    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("good.txt"), folder.Path("no-template.xml"), &reason));
+    auto reason = [](const sys::Status& verdict) { return verdict.problem().Describe(); };
+    const sys::Status good = CanConvert(sys::FileFormat::Ascii, folder.Path("good.txt"), "");
+    EXPECT_TRUE(good) << reason(good);
+    const sys::Status noExtension = CanConvert(sys::FileFormat::Ascii, folder.Path("noext"), "");
+    EXPECT_TRUE(noExtension) << reason(noExtension);
+    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("good.dat"), ""));
+    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("binary"), ""));
+    const sys::Status misfit = CanConvert(sys::FileFormat::Ascii, folder.Path("misfit.txt"), "");
+    EXPECT_FALSE(misfit);
+    EXPECT_NE(reason(misfit).find("misfit.txt"), std::string::npos);
+    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("good.txt"), folder.Path("no-template.xml")));
 }
 
 TEST(ConversionJob, FolderConvertsTheRestAndReportsTheMisfit)

@@ -54,8 +54,8 @@ TEST_F(TextInputConversion, MarksAndUtf16ReadAsTheirText)
         const FileReport report = Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"));
         ASSERT_TRUE(report.converted) << c.label << ": " << report.problem.Describe();
         EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")), expected) << c.label;
-        std::string reason;
-        EXPECT_TRUE(CanConvert(sys::FileFormat::Ascii, folder.Path("in.txt"), folder.Path("t.xml"), &reason)) << c.label << ": " << reason;
+        const sys::Status verdict = CanConvert(sys::FileFormat::Ascii, folder.Path("in.txt"), folder.Path("t.xml"));
+        EXPECT_TRUE(verdict) << c.label << ": " << verdict.problem().Describe();
     }
 }
 
