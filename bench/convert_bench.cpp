@@ -9,6 +9,8 @@
 
 #include <benchmark/benchmark.h>
 
+#include <algorithm>
+#include <charconv>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
@@ -169,7 +171,62 @@ void DigitLoop(benchmark::State& state)
     state.counters["values/s"] = benchmark::Counter(static_cast<double>(lines.spans.size()), benchmark::Counter::kIsIterationInvariantRate);
 }
 
+// Values that are not plain decimals, the general reading's work: 4 decimals after a comma
+// (range 0: "123,4567"), 8 decimals after a comma (1), scientific form with a point (2). A fourth of
+// them negative.
+std::vector<std::string> GeneralNumbers(int kind)
+{
+    std::mt19937_64 random(1);
+    std::vector<std::string> fields;
+    for (int i = 0; i < 4096; ++i) {
+        std::string field;
+        if (kind == 0)
+            field = std::to_string(random() % 1000) + "," + std::to_string(10000 + random() % 90000).substr(1);
+        else if (kind == 1)
+            field = std::to_string(random() % 100000) + "," + std::to_string(1000000000 + random() % 900000000).substr(1);
+        else
+            field = std::to_string(random() % 10) + "." + std::to_string(10000 + random() % 90000).substr(1) + "e" +
+                    std::to_string(random() % 30);
+        fields.push_back(random() % 4 == 0 ? "-" + field : field);
+    }
+    return fields;
+}
+
+// The reader as conversions use it (NumberReader with the template's separator).
+void GeneralNumberReading(benchmark::State& state)
+{
+    const int kind = static_cast<int>(state.range(0));
+    const std::vector<std::string> fields = GeneralNumbers(kind);
+    const converter::NumberReader reader(kind == 2 ? "." : ",");
+    for (auto _ : state)
+        for (const std::string& field : fields) {
+            double value = 0;
+            if (reader.Read(field, value) != converter::ValueText::Number)
+                state.SkipWithError("a value did not read");
+            benchmark::DoNotOptimize(value);
+        }
+    state.counters["values/s"] = benchmark::Counter(static_cast<double>(fields.size()), benchmark::Counter::kIsIterationInvariantRate);
+}
+
+// The same texts, the separator written as a point, read by std::from_chars as the reader did before
+// it took fast_float.
+void GeneralNumberFromChars(benchmark::State& state)
+{
+    std::vector<std::string> fields = GeneralNumbers(static_cast<int>(state.range(0)));
+    for (std::string& field : fields)
+        std::replace(field.begin(), field.end(), ',', '.');
+    for (auto _ : state)
+        for (const std::string& field : fields) {
+            double value = 0;
+            std::from_chars(field.data(), field.data() + field.size(), value);
+            benchmark::DoNotOptimize(value);
+        }
+    state.counters["values/s"] = benchmark::Counter(static_cast<double>(fields.size()), benchmark::Counter::kIsIterationInvariantRate);
+}
+
 BENCHMARK(PlainFields)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
+BENCHMARK(GeneralNumberReading)->DenseRange(0, 2);
+BENCHMARK(GeneralNumberFromChars)->DenseRange(0, 2);
 BENCHMARK(DigitLoop)->Unit(benchmark::kMillisecond);
 BENCHMARK(TextToRbx0)->Unit(benchmark::kMillisecond)->Iterations(3)->UseRealTime();
 BENCHMARK(Rbx0ToText)->Unit(benchmark::kMillisecond)->Iterations(3)->UseRealTime();

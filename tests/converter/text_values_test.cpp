@@ -316,3 +316,31 @@ TEST(StampPrinter, WritesWhatFormatStampWrites)
 }
 
 } // namespace
+
+namespace {
+
+// The decimal comma and a locale's separator take the same general reading.
+TEST(NumberReader, DecimalCommaAndOtherSeparatorsReadAsBefore)
+{
+    const struct {
+        const char* separator;
+        const char* field;
+        ValueText expected;
+        double value;
+    } cases[] = {
+        {",", "3,5", ValueText::Number, 3.5},        {",", "-1,25e3", ValueText::Number, -1250},
+        {",", "1.234,5", ValueText::NotANumber, 0},  {",", "3.5", ValueText::WrongSeparator, 0},
+        {",", "1e400", ValueText::NotANumber, 0},    {",", "0,0", ValueText::Number, 0},
+        {"'", "1'5", ValueText::Number, 1.5},        {"'", "1.5", ValueText::Number, 1.5},
+        {"\xD9\xAB", "2\xD9\xAB" "5", ValueText::Number, 2.5},
+    };
+    for (const auto& c : cases) {
+        double value = 0;
+        ASSERT_EQ(NumberReader(c.separator).Read(c.field, value), c.expected) << c.separator << " [" << c.field << "]";
+        if (c.expected == ValueText::Number) {
+            EXPECT_EQ(value, c.value) << c.field;
+        }
+    }
+}
+
+} // namespace
