@@ -1,6 +1,7 @@
 #include "platform/ui/qt/Controls.h"
 
 #include <QAbstractButton>
+#include <QComboBox>
 #include <QFontMetrics>
 #include <QHBoxLayout>
 #include <QLabel>
@@ -109,6 +110,30 @@ QLabel* LabelFor(const QString& text, QWidget* buddy, QWidget* parent)
     label->setBuddy(buddy);
     buddy->setAccessibleName(WithoutAmpersands(text));
     return label;
+}
+
+void ChainTabs(const std::vector<QWidget*>& widgets)
+{
+    for (size_t i = 1; i < widgets.size(); ++i)
+        QWidget::setTabOrder(widgets[i - 1], widgets[i]);
+}
+
+void ShowEntries(QComboBox* list, const std::vector<std::string>& entries, int selected)
+{
+    if (EntriesOf(list) != entries) {
+        list->clear();
+        for (const std::string& entry : entries)
+            list->addItem(QString::fromStdString(entry));
+    }
+    list->setCurrentIndex(selected);
+}
+
+std::vector<std::string> EntriesOf(const QComboBox* list)
+{
+    std::vector<std::string> entries;
+    for (int i = 0; i < list->count(); ++i)
+        entries.push_back(list->itemText(i).toStdString());
+    return entries;
 }
 
 void AssignMnemonics(QWidget* root, const QString& reserved)
