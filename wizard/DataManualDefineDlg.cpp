@@ -9,7 +9,7 @@
 
 namespace {
 
-constexpr int kWidthUnits = 300;
+constexpr int kWidthUnits = 380;
 constexpr int kHeightUnits = 160;
 
 } // namespace

@@ -69,6 +69,7 @@ CManualDefGridWnd::CManualDefGridWnd(QWidget* parent) : QTableWidget(parent)
     horizontalHeader()->setSectionResizeMode(QHeaderView::Interactive);
     setEditTriggers(QAbstractItemView::AllEditTriggers);
     setSelectionMode(QAbstractItemView::SingleSelection);
+    setWordWrap(false);
     setItemDelegate(new ChoiceDelegate(this, this));
 }
 

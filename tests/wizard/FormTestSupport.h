@@ -36,6 +36,16 @@ protected:
         }
         screen.boxes.clear();
     }
+    // The record as the define-template page leaves it for `file` described by hand.
+    void DescribeByHand(int format, const std::string& file)
+    {
+        ASSERT_TRUE(AcceptSelectInput(InputChoice(format, true, file), &engine));
+        DefineTemplateState choice;
+        LoadDefineTemplate(choice, engine);
+        ClickManual(choice);
+        ASSERT_TRUE(AcceptDefineTemplate(choice, &engine));
+        screen.boxes.clear();
+    }
     std::vector<std::string> Messages() const
     {
         std::vector<std::string> texts;
