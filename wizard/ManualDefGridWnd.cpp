@@ -150,4 +150,8 @@ void CManualDefGridWnd::mousePressEvent(QMouseEvent* event)
     if (event->button() == Qt::LeftButton && index.isValid())
         OnLButtonClickedRowCol(index.row() + 1, index.column() + 1);
     QTableWidget::mousePressEvent(event);
+    // A click on a cell opens it, also when it was already the current cell.
+    if (event->button() == Qt::LeftButton && index.isValid() && state() != QAbstractItemView::EditingState &&
+        (index.flags() & Qt::ItemIsEditable))
+        edit(index);
 }

@@ -3,9 +3,11 @@
 #include <QAbstractButton>
 #include <QComboBox>
 #include <QFontMetrics>
+#include <QGroupBox>
 #include <QHBoxLayout>
 #include <QLabel>
 #include <QPushButton>
+#include <QRadioButton>
 #include <QWidget>
 
 namespace ui {
@@ -36,6 +38,9 @@ QString TextOf(QWidget* widget)
 {
     if (auto* button = qobject_cast<QAbstractButton*>(widget))
         return button->text();
+    // A group box's letter takes the keyboard to the group's chosen radio button.
+    if (auto* group = qobject_cast<QGroupBox*>(widget))
+        return group->title();
     if (auto* label = qobject_cast<QLabel*>(widget); label && label->buddy())
         return label->text();
     return QString();
@@ -45,6 +50,8 @@ void SetTextOf(QWidget* widget, const QString& text)
 {
     if (auto* button = qobject_cast<QAbstractButton*>(widget))
         button->setText(text);
+    else if (auto* group = qobject_cast<QGroupBox*>(widget))
+        group->setTitle(text);
     else if (auto* label = qobject_cast<QLabel*>(widget))
         label->setText(text);
 }
@@ -63,6 +70,11 @@ qsizetype MnemonicPosition(const QString& text, const QString& taken)
         }
     }
     return -1;
+}
+
+bool InGroupBox(QWidget* widget)
+{
+    return qobject_cast<QRadioButton*>(widget) && qobject_cast<QGroupBox*>(widget->parentWidget());
 }
 
 QList<QWidget*> MnemonicCandidates(QWidget* root)
@@ -145,7 +157,15 @@ void AssignMnemonics(QWidget* root, const QString& reserved)
         if (!letter.isNull())
             taken += letter;
     }
-    for (QWidget* widget : candidates) {
+    // Radio buttons in a group box come last: their group's letter already reaches them.
+    QList<QWidget*> ordered;
+    for (QWidget* widget : candidates)
+        if (!InGroupBox(widget))
+            ordered << widget;
+    for (QWidget* widget : candidates)
+        if (InGroupBox(widget))
+            ordered << widget;
+    for (QWidget* widget : ordered) {
         const QString text = TextOf(widget);
         if (!MnemonicOf(text).isNull() || text.contains("&&"))
             continue;

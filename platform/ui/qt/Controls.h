@@ -46,10 +46,12 @@ void ShowEntries(QComboBox* list, const std::vector<std::string>& entries, int s
 // The entries of `list`, in order.
 std::vector<std::string> EntriesOf(const QComboBox* list);
 
-// Puts a "&" before one letter of every button and buddy label under `root` that has none, taking
-// the first letter of a word (else any letter) not yet taken by another control or by `reserved`.
+// Puts a "&" before one letter of every button, buddy label and group box under `root` that has
+// none, taking the first letter of a word (else any letter) not yet taken by another control or by
+// `reserved`. A radio button may be left without one when its group box has one: the box's letter
+// leads to the group's chosen radio button, and the arrow keys to the others.
 void AssignMnemonics(QWidget* root, const QString& reserved);
-// The mnemonic letters of the visible buttons and buddy labels under `root`, lower case, in
+// The mnemonic letters of the visible buttons, buddy labels and group boxes under `root`, lower case, in
 // widget order (a letter twice means a clash).
 QString MnemonicsUnder(QWidget* root);
 
