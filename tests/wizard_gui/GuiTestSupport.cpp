@@ -25,8 +25,11 @@ CWizard* ShownWizard()
 
 std::string PictureFolder()
 {
-    QDir().mkpath(VELMORA_PICTURE_DIR);
-    return VELMORA_PICTURE_DIR;
+    // A run on another display keeps its pictures apart.
+    const QString folder = qEnvironmentVariableIsEmpty("VELMORA_PICTURE_DIR") ? QStringLiteral(VELMORA_PICTURE_DIR)
+                                                                               : qEnvironmentVariable("VELMORA_PICTURE_DIR");
+    QDir().mkpath(folder);
+    return folder.toStdString();
 }
 
 void SavePicture(QWidget& widget, const std::string& name)

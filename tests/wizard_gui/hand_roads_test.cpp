@@ -145,14 +145,17 @@ TEST_F(HandRoads, AsciiWithSemicolonsOneDateForAllRowsAndTheDeleteValueInARow)
         Describe(d, road, 2, file);
         d.Choose(Delimiters::IDC_DELIMITER, "Semi Colon");
         d.Choose(Delimiters::IDC_DECIMAL_SEPARATOR, "Comma");
+        guitest::SavePicture(d.Wizard(), road + "-delimiters-filled");
         NextTo(d, road, AsciiTime::IDD);
         d.Click(AsciiTime::IDC_OPTION_SAME_DATE);
         d.Find<QDateEdit>(AsciiTime::IDC_DATE_VALUE)->setDate(QDate(2021, 5, 1));
+        guitest::SavePicture(d.Wizard(), road + "-time-filled");
         NextTo(d, road, Data::IDD);
         d.Type(Data::IDC_START_ROW, "4");
         d.Tick(Data::IDC_DELETE_VALUE_CHECK, true);
         EXPECT_TRUE(d.Find<QAbstractButton>(Data::IDC_DELETE_VALUE_IN_ROW)->isChecked());
         d.Type(Data::IDC_DELETE_ROW, "3");
+        guitest::SavePicture(d.Wizard(), road + "-data-filled");
         NextTo(d, road, kItems);
         SaveAndFinish(d, road, inputs.output + "semicolon.txt");
     });
@@ -176,6 +179,7 @@ TEST_F(HandRoads, AsciiWithNamesTypesUnitsAndValueTypesDefinedInTheGrid)
         for (int radio : {Data::IDC_NAMES_BY_HAND, Data::IDC_TYPES_BY_HAND, Data::IDC_UNITS_BY_HAND, Data::IDC_VALUE_TYPES_BY_HAND})
             d.Click(radio);
         d.Type(Data::IDC_START_ROW, "1");
+        guitest::SavePicture(d.Wizard(), road + "-data-filled");
         guitest::WhenDialogShown([&](QDialog& shown) {
             auto& dialog = dynamic_cast<CDataManualDefineDlg&>(shown);
             CManualDefGridWnd& grid = *dialog.m_wndGrid;
@@ -240,6 +244,7 @@ TEST_F(HandRoads, ExcelWithTheDateAndTimeTextsReadByTheFormat)
         d.Tick(ExcelTime::IDC_USE_DATETIME_FORMAT, true);
         EXPECT_TRUE(d.Find(ExcelTime::IDC_DATETIME_FORMAT)->isEnabled());
         d.Type(ExcelTime::IDC_DATETIME_FORMAT, "YYYY-MM-DD|HH:mm:ss");
+        guitest::SavePicture(d.Wizard(), road + "-time-filled");
         NextTo(d, road, Data::IDD);
         NextTo(d, road, kItems);
         SaveAndFinish(d, road, inputs.output + "excel.txt");
