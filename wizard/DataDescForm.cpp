@@ -115,6 +115,20 @@ bool RowsAcceptable(const DataDescState& state)
     return true;
 }
 
+// Fills the unit list with the units of the selected item type, keeping the unit selected before
+// when the new list has it, else the first.
+void OfferUnitsOfItemType(DataDescState& state)
+{
+    CStringList units;
+    if (!UnitNamesOf(state.groups[kItemTypeGroup].list.Text(), units))
+        return;
+    ChoiceList& unitList = state.groups[kUnitGroup].list;
+    const CString previous = unitList.Text();
+    unitList.FillSorted(units);
+    if (!unitList.SelectStartingWith(previous))
+        unitList.selected = unitList.entries.empty() ? -1 : 0;
+}
+
 // The i-th text of `values` (from 0), or `missing` when the list is shorter.
 CString NthOr(const CStringList& values, size_t i, const CString& missing)
 {
@@ -169,6 +183,7 @@ void ShowDataDescription(DataDescState& state, const CDataDescription& record)
     state.deleteValueUsed = used ? 1 : 0;
 
     state.groups[kItemTypeGroup].list.SelectStartingWith(record.m_strGlobalUnitType);
+    OfferUnitsOfItemType(state);
     state.groups[kUnitGroup].list.SelectStartingWith(record.m_strGlobalUnit);
     state.groups[kValueTypeGroup].list.SelectStartingWith(record.m_strGlobalValueType);
     state.groups[kItemTypeGroup].row = record.m_nUnitTypeRow;

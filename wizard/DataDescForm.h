@@ -51,7 +51,8 @@ struct ManualDefinitionRequest {
 // with "Undefined", its units and "Instantaneous" selected, the lists and delete value controls
 // disabled.
 DataDescState InitialDataDescription();
-// Activation: `record` into the page. An option outside its range leaves that group as it was.
+// Activation: `record` into the page. An option outside its range leaves that group as it was. The
+// unit list offers the units of the item type shown, so that a stored unit can be found in it.
 void ShowDataDescription(DataDescState& state, const CDataDescription& record);
 
 // The radios and the check box of the page, clicked.

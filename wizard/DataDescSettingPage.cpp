@@ -44,8 +44,6 @@ QGridLayout* GroupGrid(QGroupBox* box)
     return grid;
 }
 
-void SetEnabled(QWidget* widget, bool enabled) { widget->setEnabled(enabled); }
-
 } // namespace
 
 CDataDescSettingPage::CDataDescSettingPage(QWidget* parent) : CTSHarborPage(IDD, parent)
@@ -249,17 +247,17 @@ void CDataDescSettingPage::ShowState(const DataDescState& state)
 {
     (state.titleOption == 0 ? m_radioNamesInRow : m_radioNamesByHand)->setChecked(true);
     m_editNameRow->setText(QString::number(state.nameRow));
-    SetEnabled(m_editNameRow, state.nameRowEnabled);
-    SetEnabled(m_btnDefineNames, state.defineNamesEnabled);
+    m_editNameRow->setEnabled(state.nameRowEnabled);
+    m_btnDefineNames->setEnabled(state.defineNamesEnabled);
     for (size_t g = 0; g < 3; ++g) {
         const GroupControls& controls = m_groups[g];
         const DescriptionGroup& group = state.groups[g];
         controls.radios[static_cast<size_t>(std::clamp(group.option, 0, 2))]->setChecked(true);
         ui::ShowEntries(controls.list, group.list.entries, group.list.selected);
         controls.row->setText(QString::number(group.row));
-        SetEnabled(controls.list, group.listEnabled);
-        SetEnabled(controls.row, group.rowEnabled);
-        SetEnabled(controls.define, group.defineEnabled);
+        controls.list->setEnabled(group.listEnabled);
+        controls.row->setEnabled(group.rowEnabled);
+        controls.define->setEnabled(group.defineEnabled);
     }
     m_editStartRow->setText(QString::number(state.startRow));
     m_checkDeleteValue->setChecked(state.deleteValueUsed != 0);
@@ -267,10 +265,10 @@ void CDataDescSettingPage::ShowState(const DataDescState& state)
         (state.deleteValueOption == 0 ? m_radioDeleteValue : m_radioDeleteRow)->setChecked(true);
     m_editDeleteValue->setText(QString::fromStdString(state.deleteValue));
     m_editDeleteRow->setText(QString::number(state.deleteValueRow));
-    SetEnabled(m_radioDeleteValue, state.deleteRadiosEnabled);
-    SetEnabled(m_radioDeleteRow, state.deleteRadiosEnabled);
-    SetEnabled(m_editDeleteValue, state.deleteValueEnabled);
-    SetEnabled(m_editDeleteRow, state.deleteRowEnabled);
+    m_radioDeleteValue->setEnabled(state.deleteRadiosEnabled);
+    m_radioDeleteRow->setEnabled(state.deleteRadiosEnabled);
+    m_editDeleteValue->setEnabled(state.deleteValueEnabled);
+    m_editDeleteRow->setEnabled(state.deleteRowEnabled);
     m_vecItemDefs = state.definitions;
 }
 

@@ -34,6 +34,18 @@ bool KnownToCatalogue(const CItemDefinition& item)
     return type && units::LookupUnit(*type, item.m_strUnit);
 }
 
+// Gives the row's unit cell, when it can be edited, the units of the row's item type; with `reset`,
+// or when the cell is empty, its first unit.
+void OfferUnitsOfType(ManualDefGrid& grid, int row, bool reset)
+{
+    GridCell& unit = grid.Cell(row, kUnitColumn);
+    if (!unit.enabled)
+        return;
+    unit.choices = GetUnitChoiceList(grid.Cell(row, kTypeColumn).value);
+    if (reset || unit.value.empty())
+        unit.value = FirstChoice(unit.choices);
+}
+
 } // namespace
 
 CString GetItemTypeChoiceList()
@@ -89,26 +101,15 @@ ManualDefGrid MakeManualDefGrid(const std::vector<CItemDefinition>& items, const
 
 int EndEditing(ManualDefGrid& grid, int row, int column)
 {
-    if (column != kTypeColumn)
-        return 1;
-    GridCell& unit = grid.Cell(row, kUnitColumn);
-    if (unit.enabled) {
-        unit.choices = GetUnitChoiceList(grid.Cell(row, kTypeColumn).value);
-        if (unit.value.empty())
-            unit.value = FirstChoice(unit.choices);
-    }
+    if (column == kTypeColumn)
+        OfferUnitsOfType(grid, row, false);
     return 1;
 }
 
 int ClickCell(ManualDefGrid& grid, int row, int column)
 {
-    if (column != kUnitColumn)
-        return 1;
-    GridCell& unit = grid.Cell(row, kUnitColumn);
-    if (unit.enabled) {
-        unit.choices = GetUnitChoiceList(grid.Cell(row, kTypeColumn).value);
-        unit.value = FirstChoice(unit.choices);
-    }
+    if (column == kUnitColumn)
+        OfferUnitsOfType(grid, row, true);
     return 1;
 }
 

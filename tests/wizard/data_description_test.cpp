@@ -30,13 +30,7 @@ protected:
     {
         screen.boxes.clear();
         CDataDescription record;
-        const int accepted = CollectDataDescription(state, record);
-        EXPECT_EQ(accepted == 1, screen.boxes.empty());
-        if (screen.boxes.empty())
-            return "";
-        EXPECT_EQ(screen.boxes.size(), 1u);
-        EXPECT_EQ(screen.boxes[0].type, ui::MB_OK | ui::MB_ICONEXCLAMATION);
-        return screen.boxes[0].text;
+        return WarningOf(CollectDataDescription(state, record));
     }
     bool TempFolderEmpty() const { return std::filesystem::is_empty(inputs.temp); }
 };
@@ -104,6 +98,21 @@ TEST_F(DataDescription, AnotherItemTypeBringsItsUnitsWithTheFirstSelected)
     SelectItemType(state, static_cast<int>(water - types.entries.begin()));
     EXPECT_EQ(state.groups[kUnitGroup].list.entries, (CStringList{"centimeter", "foot", "meter", "millimeter"}));
     EXPECT_EQ(state.groups[kUnitGroup].list.Text(), "centimeter");
+}
+
+TEST_F(DataDescription, AStoredUnitForAllItemsIsFoundAmongTheUnitsOfTheStoredItemType)
+{
+    DescribeByHand(2, inputs.asciiFile);
+    CDataDescription& stored = engine.m_pSpecification->m_DataDesc;
+    stored.m_nUnitTypeOption = stored.m_nUnitOption = 0;
+    stored.m_strGlobalUnitType = "Water Level";
+    stored.m_strGlobalUnit = "meter";
+    DataDescState state = Shown();
+    EXPECT_EQ(state.groups[kUnitGroup].list.entries, (CStringList{"centimeter", "foot", "meter", "millimeter"}));
+    EXPECT_EQ(state.groups[kUnitGroup].list.Text(), "meter");
+    CDataDescription collected;
+    ASSERT_EQ(CollectDataDescription(state, collected), 1);
+    EXPECT_EQ(collected.m_strGlobalUnit, "meter") << "Next stores the unit it was given";
 }
 
 TEST_F(DataDescription, TheRadiosAndTheDeleteValueBoxEnableTheirControls)

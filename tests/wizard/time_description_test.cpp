@@ -25,13 +25,7 @@ protected:
     {
         screen.boxes.clear();
         CTimeDescription record;
-        const int accepted = CollectTimeDescription(state, record);
-        EXPECT_EQ(accepted == 1, screen.boxes.empty());
-        if (screen.boxes.empty())
-            return "";
-        EXPECT_EQ(screen.boxes.size(), 1u);
-        EXPECT_EQ(screen.boxes[0].type, ui::MB_OK | ui::MB_ICONEXCLAMATION);
-        return screen.boxes[0].text;
+        return WarningOf(CollectTimeDescription(state, record));
     }
 };
 

@@ -52,6 +52,15 @@ protected:
         d.Type(singleFile ? kInputFile : kInputFolder, path);
         d.Next();
     }
+    // From the welcome page to `page` of `file` described by hand.
+    void ToDescriptionPage(Driver& d, int format, const std::string& file, int page)
+    {
+        ToAfterInput(d, format, true, file);
+        d.Click(kManual);
+        for (int step = 0; step < 5 && d.Page() != page; ++step)
+            d.Next();
+        ASSERT_EQ(d.Page(), page);
+    }
     void ToItems(Driver& d, int format, const std::string& file, const std::string& templatePath)
     {
         ToAfterInput(d, format, true, file);
@@ -378,10 +387,7 @@ TEST_F(Pages, BackFromTheDataDescriptionLeadsToTheTimePageOfTheFormat)
 TEST_F(Pages, TheTimePagesRefuseAColumnBeforeAFormatAndTheExcelFormatEvenWhenUnticked)
 {
     WizardWindow w(&engine);
-    ToAfterInput(w, 3, true, inputs.excelFile);
-    w.Click(kManual);
-    w.Next();
-    ASSERT_EQ(w.Page(), kExcelTime);
+    ToDescriptionPage(w, 3, inputs.excelFile, kExcelTime);
     w.Click(CExcelTimeDescSettingPage::IDC_OPTION_SAME_TIME);
     EXPECT_FALSE(w.Find(CExcelTimeDescSettingPage::IDC_DATE_FORMAT)->isEnabled());
     EXPECT_TRUE(w.Find(CExcelTimeDescSettingPage::IDC_DATE_COLUMN)->isEnabled());
@@ -404,11 +410,7 @@ TEST_F(Pages, TheTimePagesRefuseAColumnBeforeAFormatAndTheExcelFormatEvenWhenUnt
 TEST_F(Pages, TheSpinsStepWithinTheirRangeAndTypedNumbersStayAsTyped)
 {
     WizardWindow w(&engine);
-    ToAfterInput(w, 2, true, inputs.asciiFile);
-    w.Click(kManual);
-    w.Next();
-    w.Next();
-    ASSERT_EQ(w.Page(), kAsciiTime);
+    ToDescriptionPage(w, 2, inputs.asciiFile, kAsciiTime);
     auto* spin = w.Find<ui::SpinButton>(CTimeDescSettingPage::IDC_DATETIME_SPIN);
     ASSERT_NE(spin, nullptr);
     w.Type(CTimeDescSettingPage::IDC_DATETIME_COLUMN, "1");
@@ -431,12 +433,7 @@ TEST_F(Pages, TheGridsUnitListFollowsTheTypeAndOkChecksTheCatalogue)
                                                         "Time\tLevel\tFlow\n"
                                                         "2021/01/01 00:00:00\t1.5\t2.5\n");
     WizardWindow w(&engine);
-    ToAfterInput(w, 2, true, file);
-    w.Click(kManual);
-    w.Next();
-    w.Next();
-    w.Next();
-    ASSERT_EQ(w.Page(), kDataDesc);
+    ToDescriptionPage(w, 2, file, kDataDesc);
     w.Click(CDataDescSettingPage::IDC_TYPES_BY_HAND);
     bool shown = false;
     guitest::WhenDialogShown([&](QDialog& dialog) {
@@ -476,11 +473,7 @@ TEST_F(Pages, TheGridOffersTheUnitsOfTheRowsTypeAndAClickResetsTheUnit)
                                                         "Time\tLevel\n"
                                                         "2021/01/01 00:00:00\t1.5\n");
     WizardWindow w(&engine);
-    ToAfterInput(w, 2, true, file);
-    w.Click(kManual);
-    for (int i = 0; i < 3; ++i)
-        w.Next();
-    ASSERT_EQ(w.Page(), kDataDesc);
+    ToDescriptionPage(w, 2, file, kDataDesc);
     w.Click(CDataDescSettingPage::IDC_UNITS_BY_HAND);
     guitest::WhenDialogShown([&](QDialog& dialog) {
         auto& grid = *dynamic_cast<CDataManualDefineDlg&>(dialog).m_wndGrid;
@@ -506,11 +499,7 @@ TEST_F(Pages, DecliningToReplaceAFileKeepsTheSavePage)
 {
     const std::string existing = scratch.Write("template.xml", "old");
     WizardWindow w(&engine);
-    ToAfterInput(w, 2, true, inputs.asciiFile);
-    w.Click(kManual);
-    for (int i = 0; i < 5; ++i)
-        w.Next();
-    ASSERT_EQ(w.Page(), kSaveTemplate);
+    ToDescriptionPage(w, 2, inputs.asciiFile, kSaveTemplate);
     EXPECT_EQ(w.Text(CSaveTempFilePage::IDC_FILE), existing) << "folder/template.xml is proposed";
     screen.answers = {ui::IDNO};
     w.Next();
