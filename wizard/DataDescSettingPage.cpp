@@ -143,9 +143,7 @@ QWidget* CDataDescSettingPage::MakeDescriptionGroup(DescriptionGroupIndex index,
             ApplyRule(*this, [index, option](DataDescState& s) { ClickGroupOption(s, index, option); });
         });
     }
-    controls.list = ui::Identify(new QComboBox(this), ids[kList], texts[0]);
-    controls.list->setSizeAdjustPolicy(QComboBox::AdjustToMinimumContentsLengthWithIcon);
-    controls.list->setMinimumContentsLength(24);
+    controls.list = ui::Identify(ui::DropDownList(this), ids[kList], texts[0]);
     QLayout* row = RowField(ids[kRow], ids[kSpin], texts[1], controls.row, controls.spin);
     controls.define = DefineButton(ids[kDefine], tr("Define..."), texts[2].chopped(1));
     QGridLayout* grid = GroupGrid(box);
@@ -276,6 +274,12 @@ bool CDataDescSettingPage::OnInitDialog()
 {
     CTSHarborPage::OnInitDialog();
     ShowState(InitialDataDescription());
+    // The three lists as wide as the widest, the item types, whatever units they come to hold.
+    int width = 0;
+    for (const GroupControls& controls : m_groups)
+        width = std::max(width, controls.list->sizeHint().width());
+    for (const GroupControls& controls : m_groups)
+        controls.list->setMinimumWidth(width);
     return true;
 }
 

@@ -26,13 +26,13 @@ CDelimitersSettingPage::CDelimitersSettingPage(QWidget* parent) : CTSHarborPage(
     setTitle(tr("General Description"));
     setSubTitle(tr("Here you describe the delimiters and decimal separators used in the file. "));
     // Every control is owned by the page.
-    m_listDelimiter = ui::Identify(new QComboBox(this), IDC_DELIMITER);
+    m_listDelimiter = ui::Identify(ui::DropDownList(this), IDC_DELIMITER);
     m_editUserDelimiter = ui::Identify(new QLineEdit(this), IDC_USER_DELIMITER, tr("User-defined delimiter"));
     m_checkConsecutive =
         ui::Identify(new QCheckBox(tr("Treat consecutive delimiters as one"), this), IDC_CONSECUTIVE);
     m_checkLineStart =
         ui::Identify(new QCheckBox(tr("Ignore delimiters at beginning of line"), this), IDC_LINE_START);
-    m_listDecimal = ui::Identify(new QComboBox(this), IDC_DECIMAL_SEPARATOR);
+    m_listDecimal = ui::Identify(ui::DropDownList(this), IDC_DECIMAL_SEPARATOR);
     m_editUserDelimiter->setEnabled(false);
 
     auto* layout = new QGridLayout(this);

@@ -20,6 +20,7 @@
 #include "wizard/TimeDescSettingPage.h"
 
 #include <QComboBox>
+#include <QStyleOptionComboBox>
 #include <QGroupBox>
 #include <QRadioButton>
 #include <QLabel>
@@ -643,6 +644,16 @@ protected:
                                    ? button->fontMetrics().horizontalAdvance(QString(button->text()).remove('&')) + 8
                                    : button->sizeHint().width();
             EXPECT_GE(button->width(), needed) << button->text().toStdString();
+        }
+        for (QComboBox* list : wizard.findChildren<QComboBox*>()) {
+            if (!list->isVisible())
+                continue;
+            QStyleOptionComboBox option;
+            option.initFrom(list);
+            const int room =
+                list->style()->subControlRect(QStyle::CC_ComboBox, &option, QStyle::SC_ComboBoxEditField, list).width();
+            for (int i = 0; i < list->count(); ++i)
+                EXPECT_LE(list->fontMetrics().horizontalAdvance(list->itemText(i)), room) << list->itemText(i).toStdString();
         }
     }
     // Tab moves through the controls line by line, left to right.

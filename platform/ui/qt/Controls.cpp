@@ -130,6 +130,13 @@ void ChainTabs(const std::vector<QWidget*>& widgets)
         QWidget::setTabOrder(widgets[i - 1], widgets[i]);
 }
 
+QComboBox* DropDownList(QWidget* parent)
+{
+    auto* list = new QComboBox(parent); // owned by `parent`
+    list->setSizeAdjustPolicy(QComboBox::AdjustToContents);
+    return list;
+}
+
 void ShowEntries(QComboBox* list, const std::vector<std::string>& entries, int selected)
 {
     if (EntriesOf(list) != entries) {

@@ -40,6 +40,8 @@ QLabel* LabelFor(const QString& text, QWidget* buddy, QWidget* parent);
 // the order they are laid out.
 void ChainTabs(const std::vector<QWidget*>& widgets);
 
+// A drop-down list as wide as its longest entry, whenever its entries change.
+QComboBox* DropDownList(QWidget* parent);
 // Makes `list` hold `entries` (refilled only when they differ) with entry `selected` current, -1
 // for none.
 void ShowEntries(QComboBox* list, const std::vector<std::string>& entries, int selected);
