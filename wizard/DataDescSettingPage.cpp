@@ -121,10 +121,8 @@ QWidget* CDataDescSettingPage::MakeTitleGroup()
     grid->addWidget(m_radioNamesByHand, 0, kSecondOption);
     grid->addWidget(m_btnDefineNames, 0, kSecondField);
     m_groupGrids.push_back(grid);
-    connect(m_radioNamesInRow, &QRadioButton::clicked, this,
-            [this] { ApplyRule(*this, [](DataDescState& s) { ClickTitleOption(s, 0); }); });
-    connect(m_radioNamesByHand, &QRadioButton::clicked, this,
-            [this] { ApplyRule(*this, [](DataDescState& s) { ClickTitleOption(s, 1); }); });
+    ApplyRuleOnClick(this, m_radioNamesInRow, [](DataDescState& s) { ClickTitleOption(s, 0); });
+    ApplyRuleOnClick(this, m_radioNamesByHand, [](DataDescState& s) { ClickTitleOption(s, 1); });
     return box;
 }
 
@@ -139,9 +137,7 @@ QWidget* CDataDescSettingPage::MakeDescriptionGroup(DescriptionGroupIndex index,
         auto* radio = ui::Identify(new QRadioButton(texts[static_cast<size_t>(option)], this), ids[static_cast<size_t>(option)]);
         options->addButton(radio);
         controls.radios[static_cast<size_t>(option)] = radio;
-        connect(radio, &QRadioButton::clicked, this, [this, index, option] {
-            ApplyRule(*this, [index, option](DataDescState& s) { ClickGroupOption(s, index, option); });
-        });
+        ApplyRuleOnClick(this, radio, [index, option](DataDescState& s) { ClickGroupOption(s, index, option); });
     }
     controls.list = ui::Identify(ui::DropDownList(this), ids[kList], texts[0]);
     QLayout* row = RowField(ids[kRow], ids[kSpin], texts[1], controls.row, controls.spin);
@@ -186,11 +182,9 @@ QWidget* CDataDescSettingPage::MakeDataGroup()
     grid->addWidget(m_radioDeleteRow, 1, kSecondOption);
     grid->addLayout(deleteRow, 1, kSecondField);
     m_groupGrids.push_back(grid);
-    connect(m_checkDeleteValue, &QCheckBox::clicked, this, [this] { ApplyRule(*this, ClickDeleteValueUsed); });
-    connect(m_radioDeleteValue, &QRadioButton::clicked, this,
-            [this] { ApplyRule(*this, [](DataDescState& s) { ClickDeleteValueOption(s, 0); }); });
-    connect(m_radioDeleteRow, &QRadioButton::clicked, this,
-            [this] { ApplyRule(*this, [](DataDescState& s) { ClickDeleteValueOption(s, 1); }); });
+    connect(m_checkDeleteValue, &QCheckBox::clicked, this, &CDataDescSettingPage::OnClickedDeleteValueCheck);
+    ApplyRuleOnClick(this, m_radioDeleteValue, [](DataDescState& s) { ClickDeleteValueOption(s, 0); });
+    ApplyRuleOnClick(this, m_radioDeleteRow, [](DataDescState& s) { ClickDeleteValueOption(s, 1); });
     return box;
 }
 
@@ -285,15 +279,39 @@ bool CDataDescSettingPage::OnInitDialog()
 
 bool CDataDescSettingPage::OnSetActive()
 {
-    DataDescState state = ReadControls();
     CDataDescription record;
     if (CEngine* engine = Engine(); engine && engine->m_pSpecification)
         record = engine->m_pSpecification->m_DataDesc;
-    ShowDataDescription(state, record);
-    ShowState(state);
+    ShowDataDescription(record);
     SetPreviewButton(true, true);
     return CTSHarborPage::OnSetActive();
 }
+
+void CDataDescSettingPage::ShowDataDescription(const CDataDescription& record)
+{
+    ApplyRule(*this, [&record](DataDescState& state) { ::ShowDataDescription(state, record); });
+}
+
+int CDataDescSettingPage::CollectDataDescription(CDataDescription& record) const
+{
+    return ::CollectDataDescription(ReadControls(), record);
+}
+
+int CDataDescSettingPage::GetItemDefinitions(std::vector<CItemDefinition>& definitions)
+{
+    CEngine* engine = Engine();
+    return engine ? ::GetItemDefinitions(ReadControls(), *engine, definitions) : 0;
+}
+
+int CDataDescSettingPage::CheckManualDefinitions()
+{
+    DataDescState state = ReadControls();
+    const int complete = ::CheckManualDefinitions(state, Engine());
+    m_vecItemDefs = state.definitions;
+    return complete;
+}
+
+void CDataDescSettingPage::OnClickedDeleteValueCheck() { ApplyRule(*this, ClickDeleteValueUsed); }
 
 void CDataDescSettingPage::OnSelchangeItemType(int index)
 {

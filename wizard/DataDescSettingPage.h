@@ -40,6 +40,12 @@ public:
     int GetBackPageID() override;
     CString HelpText() const override;
 
+    // The page's operations, on its controls.
+    void ShowDataDescription(const CDataDescription& record);
+    int CollectDataDescription(CDataDescription& record) const;
+    int GetItemDefinitions(std::vector<CItemDefinition>& definitions);
+    int CheckManualDefinitions();
+
     DataDescState ReadControls() const;
     void ShowState(const DataDescState& state);
 
@@ -63,6 +69,7 @@ private:
     void AlignGroupColumns();
 
     void OnClickedDefine();
+    void OnClickedDeleteValueCheck();
     void OnSelchangeItemType(int index);
 
     QRadioButton* m_radioNamesInRow = nullptr;

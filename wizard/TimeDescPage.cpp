@@ -145,14 +145,22 @@ bool CTimeDescPage::OnInitDialog()
 
 bool CTimeDescPage::OnSetActive()
 {
-    TimeDescState state = ReadControls();
     CTimeDescription record;
     if (CEngine* engine = Engine(); engine && engine->m_pSpecification)
         record = engine->m_pSpecification->m_TimeDesc;
-    ShowTimeDescription(state, record);
-    ShowState(state);
+    ShowTimeDescription(record);
     SetPreviewButton(true, true);
     return CTSHarborPage::OnSetActive();
+}
+
+void CTimeDescPage::ShowTimeDescription(const CTimeDescription& record)
+{
+    ApplyRule(*this, [&record](TimeDescState& state) { ::ShowTimeDescription(state, record); });
+}
+
+int CTimeDescPage::CollectTimeDescription(CTimeDescription& record) const
+{
+    return ::CollectTimeDescription(ReadControls(), record);
 }
 
 void CTimeDescPage::OnClickedDateTimeOption(int option)

@@ -29,6 +29,10 @@ public:
     int GetBackPageID() override;
     CString HelpText() const override;
 
+    // The page's operations, on its controls.
+    void ShowTimeDescription(const CTimeDescription& record);
+    int CollectTimeDescription(CTimeDescription& record) const;
+
     TimeDescState ReadControls() const;
     void ShowState(const TimeDescState& state);
 
