@@ -14,8 +14,6 @@ namespace converter {
 namespace {
 
 constexpr std::uint64_t kZipLimit = 0xFFFFFFFFu;
-constexpr size_t kLocalHeaderBytes = 30;
-constexpr size_t kCentralHeaderBytes = 46;
 constexpr size_t kStoredBlockHeaderBytes = 5;
 constexpr std::uint16_t kVersionNeeded = 20; // deflate
 constexpr std::uint16_t kDeflated = 8;

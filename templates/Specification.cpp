@@ -164,11 +164,9 @@ int CSpecification::GetDateTimeColumn() const
 
 int CSpecification::GetValueTypeCode(const CString& name, int& code)
 {
-    static const char* const kNames[] = {"Accumulated", "Step_Accumulated", "Mean_Step_Accumulated",
-                                         "Reverse_Mean_Step_Accumulated"};
-    for (int i = 0; i < 4; ++i) {
-        if (text::EqualsNoCase(name, kNames[i])) {
-            code = i + 1;
+    for (int i = 1; i < static_cast<int>(kValueTypeNames.size()); ++i) {
+        if (text::EqualsNoCase(name, kValueTypeNames[static_cast<size_t>(i)])) {
+            code = i;
             return 1;
         }
     }

@@ -4,6 +4,12 @@
 #include "platform/system/Status.h"
 #include "platform/system/Types.h"
 
+#include <array>
+
+// The value types by code: "Instantaneous" is 0, the others are the codes GetValueTypeCode gives.
+inline constexpr std::array<const char*, 5> kValueTypeNames = {
+    "Instantaneous", "Accumulated", "Step_Accumulated", "Mean_Step_Accumulated", "Reverse_Mean_Step_Accumulated"};
+
 // One item column described by hand.
 struct CItemDefinition {
     CString m_strTitle;

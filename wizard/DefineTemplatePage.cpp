@@ -68,12 +68,9 @@ CDefineTemplatePage::CDefineTemplatePage(QWidget* parent) : CTSHarborPage(IDD, p
     layout->setRowStretch(10, 1);
     FinishPage(kPageWidthUnits, kPageHeightUnits);
 
-    auto onClick = [this](QRadioButton* radio, auto rule) {
-        connect(radio, &QRadioButton::clicked, this, [this, rule] { ApplyRule(*this, rule); });
-    };
-    onClick(m_radioUnchanged, [](DefineTemplateState& s) { ClickExistingTemplate(s, 1); });
-    onClick(m_radioModify, [](DefineTemplateState& s) { ClickExistingTemplate(s, 2); });
-    onClick(m_radioManual, [](DefineTemplateState& s) { ClickManual(s); });
+    ApplyRuleOnClick(this, m_radioUnchanged, [](DefineTemplateState& s) { ClickExistingTemplate(s, 1); });
+    ApplyRuleOnClick(this, m_radioModify, [](DefineTemplateState& s) { ClickExistingTemplate(s, 2); });
+    ApplyRuleOnClick(this, m_radioManual, [](DefineTemplateState& s) { ClickManual(s); });
     connect(m_btnBrowse, &QPushButton::clicked, this, &CDefineTemplatePage::OnBrowse);
 }
 

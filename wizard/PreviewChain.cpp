@@ -3,10 +3,6 @@
 #include "engine/Engine.h"
 #include "platform/system/FileSystem.h"
 
-namespace {
-
-// Saves the template to the working copy, asks the bridge whether it fits the preview file, and
-// removes the working copy again whatever the answer.
 bool TemplateFitsPreviewFile(CEngine& engine)
 {
     CString workTemplate;
@@ -21,8 +17,6 @@ bool TemplateFitsPreviewFile(CEngine& engine)
     sys::DeleteFile(workTemplate);
     return fits;
 }
-
-} // namespace
 
 int RunDefaultPreview(CEngine* engine)
 {

@@ -6,3 +6,6 @@ class CEngine;
 
 // 0 when there was nothing to show; otherwise the preview's result.
 int RunDefaultPreview(CEngine* engine);
+// Saves the template to the working copy, asks the bridge whether it fits the preview file, and
+// removes the working copy again whatever the answer.
+bool TemplateFitsPreviewFile(CEngine& engine);

@@ -51,14 +51,11 @@ CSelectInputPage::CSelectInputPage(QWidget* parent) : CTSHarborPage(IDD, parent)
     layout->setRowStretch(8, 1);
     FinishPage(kPageWidthUnits, kPageHeightUnits);
 
-    auto onClick = [this](QRadioButton* radio, auto rule) {
-        connect(radio, &QRadioButton::clicked, this, [this, rule] { ApplyRule(*this, rule); });
-    };
-    onClick(m_radioFolder, [this](SelectInputState& s) { ClickFolder(s, Engine()); });
-    onClick(m_radioSingleFile, [this](SelectInputState& s) { ClickSingleFile(s, Engine()); });
-    onClick(m_radioRbx0, [](SelectInputState& s) { ClickFormat(s, 1); });
-    onClick(m_radioAscii, [](SelectInputState& s) { ClickFormat(s, 2); });
-    onClick(m_radioExcel, [](SelectInputState& s) { ClickFormat(s, 3); });
+    ApplyRuleOnClick(this, m_radioFolder, [this](SelectInputState& s) { ClickFolder(s, Engine()); });
+    ApplyRuleOnClick(this, m_radioSingleFile, [this](SelectInputState& s) { ClickSingleFile(s, Engine()); });
+    ApplyRuleOnClick(this, m_radioRbx0, [](SelectInputState& s) { ClickFormat(s, 1); });
+    ApplyRuleOnClick(this, m_radioAscii, [](SelectInputState& s) { ClickFormat(s, 2); });
+    ApplyRuleOnClick(this, m_radioExcel, [](SelectInputState& s) { ClickFormat(s, 3); });
     connect(m_ctrlFile, &CVelmoraBrowseCtrl::SelectorOpening, this,
             [this](COkaFileSelectorDlg* dialog) { SelectorOpening(ReadControls(), Engine(), dialog); });
 }

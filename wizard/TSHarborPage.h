@@ -3,6 +3,8 @@
 // Back lead (the page-skipping flow of the wizard).
 #include "platform/harbor/qt/HarborPage.h"
 
+#include <QAbstractButton>
+
 class CEngine;
 
 class CTSHarborPage : public CHarborPage {
@@ -40,4 +42,11 @@ void ApplyRule(Page& page, Rule rule)
     auto state = page.ReadControls();
     rule(state);
     page.ShowState(state);
+}
+
+// Applies `rule` whenever `button` (a radio button, a check box) is clicked.
+template <typename Page, typename Rule>
+void ApplyRuleOnClick(Page* page, QAbstractButton* button, Rule rule)
+{
+    QObject::connect(button, &QAbstractButton::clicked, page, [page, rule] { ApplyRule(*page, rule); });
 }

@@ -3,11 +3,15 @@
 #include "platform/harbor/qt/OverviewPage.h"
 #include "platform/harbor/qt/WelcomePage.h"
 #include "platform/ui/qt/Controls.h"
-#include "resources/ResourceIds.h"
+#include "wizard/DataDescSettingPage.h"
 #include "wizard/DefineOutputItemsPage.h"
 #include "wizard/DefineTemplatePage.h"
+#include "wizard/DelimitersSettingPage.h"
+#include "wizard/ExcelTimeDescSettingPage.h"
 #include "wizard/OutputDataPage.h"
+#include "wizard/SaveTempFilePage.h"
 #include "wizard/SelectInputPage.h"
+#include "wizard/TimeDescSettingPage.h"
 
 #include <QPushButton>
 
@@ -23,21 +27,26 @@ CWizard::CWizard() : CHarborWizard("Velmora", nullptr, 0)
     m_pageWelcome = new CWelcomePage();
     m_pageSelectInput = new CSelectInputPage();
     m_pageDefineTemplate = new CDefineTemplatePage();
+    m_pageDelimiters = new CDelimitersSettingPage();
+    m_pageTimeDesc = new CTimeDescSettingPage();
+    m_pageDataDesc = new CDataDescSettingPage();
     m_pageOutput = new COutputDataPage();
+    m_pageSaveTemplate = new CSaveTempFilePage();
     m_pageItems = new CDefineOutputItemsPage();
     m_pageOverview = new COverviewPage();
+    m_pageExcelTimeDesc = new CExcelTimeDescSettingPage();
     m_pageWelcome->SetToolText("Velmora", "Using this tool you can do batch conversion amongst rbx0, ASCII and excel files");
 
-    // Sheet order. The pages that describe a file by hand keep their places until they exist.
+    // Sheet order, which differs from the order the pages are made in.
     AddPage(m_pageWelcome);
     AddPage(m_pageSelectInput);
     AddPage(m_pageDefineTemplate);
-    AddPagePlace(res::IDD_DELIMITERS);
-    AddPagePlace(res::IDD_TIME_DESC_ASCII);
-    AddPagePlace(res::IDD_TIME_DESC_EXCEL);
-    AddPagePlace(res::IDD_DATA_DESC);
+    AddPage(m_pageDelimiters);
+    AddPage(m_pageTimeDesc);
+    AddPage(m_pageExcelTimeDesc);
+    AddPage(m_pageDataDesc);
     AddPage(m_pageItems);
-    AddPagePlace(res::IDD_SAVE_TEMPLATE);
+    AddPage(m_pageSaveTemplate);
     AddPage(m_pageOutput);
     AddPage(m_pageOverview);
 }

@@ -3,11 +3,16 @@
 // order, and a Preview button that runs the active page's preview.
 #include "platform/harbor/qt/HarborWizard.h"
 
+class CDataDescSettingPage;
 class CDefineOutputItemsPage;
 class CDefineTemplatePage;
+class CDelimitersSettingPage;
+class CExcelTimeDescSettingPage;
 class COutputDataPage;
 class COverviewPage;
+class CSaveTempFilePage;
 class CSelectInputPage;
+class CTimeDescSettingPage;
 class CWelcomePage;
 class QPushButton;
 
@@ -23,9 +28,14 @@ public:
     CWelcomePage* m_pageWelcome = nullptr;
     CSelectInputPage* m_pageSelectInput = nullptr;
     CDefineTemplatePage* m_pageDefineTemplate = nullptr;
+    CDelimitersSettingPage* m_pageDelimiters = nullptr;
+    CTimeDescSettingPage* m_pageTimeDesc = nullptr;
+    CDataDescSettingPage* m_pageDataDesc = nullptr;
     COutputDataPage* m_pageOutput = nullptr;
+    CSaveTempFilePage* m_pageSaveTemplate = nullptr;
     CDefineOutputItemsPage* m_pageItems = nullptr;
     COverviewPage* m_pageOverview = nullptr;
+    CExcelTimeDescSettingPage* m_pageExcelTimeDesc = nullptr;
 
 protected:
     // Makes the Preview button, hidden, where it belongs.

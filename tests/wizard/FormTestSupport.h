@@ -36,6 +36,30 @@ protected:
         }
         screen.boxes.clear();
     }
+    // The record as the define-template page leaves it for `file` described by hand.
+    void DescribeByHand(int format, const std::string& file)
+    {
+        ASSERT_TRUE(AcceptSelectInput(InputChoice(format, true, file), &engine));
+        DefineTemplateState choice;
+        LoadDefineTemplate(choice, engine);
+        ClickManual(choice);
+        ASSERT_TRUE(AcceptDefineTemplate(choice, &engine));
+        screen.boxes.clear();
+    }
+    // The warning a check gave (its result `accepted`), or "" when it accepted; a refusal is one box
+    // with the warning icon.
+    std::string WarningOf(int accepted)
+    {
+        EXPECT_EQ(accepted == 1, screen.boxes.empty());
+        std::string text;
+        if (!screen.boxes.empty()) {
+            EXPECT_EQ(screen.boxes.size(), 1u);
+            EXPECT_EQ(screen.boxes[0].type, ui::MB_OK | ui::MB_ICONEXCLAMATION);
+            text = screen.boxes[0].text;
+        }
+        screen.boxes.clear();
+        return text;
+    }
     std::vector<std::string> Messages() const
     {
         std::vector<std::string> texts;

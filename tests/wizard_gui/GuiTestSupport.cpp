@@ -25,8 +25,11 @@ CWizard* ShownWizard()
 
 std::string PictureFolder()
 {
-    QDir().mkpath(VELMORA_PICTURE_DIR);
-    return VELMORA_PICTURE_DIR;
+    // A run on another display keeps its pictures apart.
+    const QString folder = qEnvironmentVariableIsEmpty("VELMORA_PICTURE_DIR") ? QStringLiteral(VELMORA_PICTURE_DIR)
+                                                                               : qEnvironmentVariable("VELMORA_PICTURE_DIR");
+    QDir().mkpath(folder);
+    return folder.toStdString();
 }
 
 void SavePicture(QWidget& widget, const std::string& name)
@@ -54,6 +57,8 @@ void Press(QAbstractButton* button)
     const bool hasIndicator = qobject_cast<QRadioButton*>(button) || qobject_cast<QCheckBox*>(button);
     const QPoint where = hasIndicator ? QPoint(8, button->height() / 2) : button->rect().center();
     QTest::mouseClick(button, Qt::LeftButton, Qt::NoModifier, where);
+    // Lets the layouts settle, as the event loop would before anyone looks.
+    QCoreApplication::processEvents();
 }
 
 WizardWindow::WizardWindow(CEngine* engine) : Driver(nullptr), m_owned(std::make_unique<CWizard>())
@@ -81,6 +86,77 @@ void Driver::Type(int id, const std::string& text)
     ASSERT_NE(edit, nullptr) << "no edit " << id;
     edit->clear();
     QTest::keyClicks(edit, QString::fromStdString(text));
+}
+
+void Driver::Choose(int id, const std::string& text) { ChooseEntry(Find<QComboBox>(id), text); }
+
+void Driver::Tick(int id, bool ticked)
+{
+    auto* box = Find<QAbstractButton>(id);
+    ASSERT_NE(box, nullptr) << "no check box " << id;
+    if (box->isChecked() != ticked)
+        Press(box);
+}
+
+void ChooseEntry(QComboBox* list, const std::string& text)
+{
+    ASSERT_NE(list, nullptr);
+    ASSERT_TRUE(list->isVisible() && list->isEnabled()) << "the list cannot be used for " << text;
+    const int index = list->findText(QString::fromStdString(text), Qt::MatchExactly);
+    ASSERT_GE(index, 0) << "no entry " << text;
+    list->setCurrentIndex(index);
+    emit list->activated(index);
+}
+
+void PressCell(CManualDefGridWnd& grid, int row, int column)
+{
+    const QModelIndex index = grid.model()->index(row - 1, column - 1);
+    grid.scrollTo(index);
+    QTest::mouseClick(grid.viewport(), Qt::LeftButton, Qt::NoModifier, grid.visualRect(index).center());
+    QCoreApplication::processEvents();
+}
+
+void TypeInCell(CManualDefGridWnd& grid, int row, int column, const std::string& text)
+{
+    PressCell(grid, row, column);
+    auto* edit = qobject_cast<QLineEdit*>(grid.indexWidget(grid.model()->index(row - 1, column - 1)));
+    ASSERT_NE(edit, nullptr) << "cell " << row << "," << column << " did not open for typing";
+    edit->selectAll();
+    QTest::keyClicks(edit, QString::fromStdString(text));
+    QTest::keyClick(edit, Qt::Key_Return);
+    QCoreApplication::processEvents();
+}
+
+void ChooseInCell(CManualDefGridWnd& grid, int row, int column, const std::string& text)
+{
+    PressCell(grid, row, column);
+    auto* list = qobject_cast<QComboBox*>(grid.indexWidget(grid.model()->index(row - 1, column - 1)));
+    ASSERT_NE(list, nullptr) << "cell " << row << "," << column << " did not open a list";
+    ChooseEntry(list, text);
+    QCoreApplication::processEvents();
+}
+
+std::string CellText(const CManualDefGridWnd& grid, int row, int column)
+{
+    const QTableWidgetItem* item = grid.item(row - 1, column - 1);
+    return item ? item->text().toStdString() : std::string("<no cell>");
+}
+
+void WhenDialogShown(const std::function<void(QDialog&)>& script)
+{
+    QTimer::singleShot(0, [script] {
+        QDialog* shown = nullptr;
+        for (QWidget* widget : QApplication::topLevelWidgets())
+            if (auto* dialog = qobject_cast<QDialog*>(widget);
+                dialog && dialog->isVisible() && !qobject_cast<CWizard*>(dialog))
+                shown = dialog;
+        EXPECT_NE(shown, nullptr) << "no dialog showed";
+        if (!shown)
+            return;
+        script(*shown);
+        if (shown->isVisible())
+            shown->reject();
+    });
 }
 
 void Driver::Next() { Press(m_wizard->button(QWizard::NextButton)); }

@@ -9,8 +9,20 @@
 #include "platform/harbor/qt/WelcomePage.h"
 #include "platform/wpx/Wpx.h"
 #include "resources/StringTable.h"
+#include "platform/ui/qt/SpinButton.h"
+#include "tests/wizard_gui/RoadTestSupport.h"
+#include "wizard/DataDescSettingPage.h"
+#include "wizard/DelimitersSettingPage.h"
+#include "wizard/DataManualDefineDlg.h"
+#include "wizard/ExcelTimeDescSettingPage.h"
+#include "wizard/SaveTempFilePage.h"
 #include "wizard/SetupGui.h"
+#include "wizard/TimeDescSettingPage.h"
 
+#include <QComboBox>
+#include <QStyleOptionComboBox>
+#include <QGroupBox>
+#include <QRadioButton>
 #include <QLabel>
 #include <QPushButton>
 #include <QTreeWidget>
@@ -21,8 +33,9 @@ using namespace wizardtest;
 using guitest::Driver;
 using guitest::WizardWindow;
 
-enum : int { kWelcome = CWelcomePage::IDD, kSelectInput = 2278, kDefineTemplate = 2279, kItems = 2285, kOutput = 2283,
-             kOverview = COverviewPage::IDD };
+enum : int { kWelcome = CWelcomePage::IDD, kSelectInput = 2278, kDefineTemplate = 2279, kDelimiters = 2280,
+             kAsciiTime = 2281, kExcelTime = 2289, kDataDesc = 2290, kItems = 2285, kSaveTemplate = 2282,
+             kOutput = 2283, kOverview = COverviewPage::IDD };
 enum : int { kSingleFile = 201, kAscii = 202, kRbx0 = 203, kExcel = 204, kFolder = 205, kInputFile = 206,
              kInputFolder = 208, kUnchanged = 249, kModify = 259, kManual = 261, kTemplate = 263, kItemList = 276,
              kOutputRbx0 = 207, kOutputAscii = 209, kOutputExcel = 210, kOutputFile = 264, kOutputFolder = 268,
@@ -39,6 +52,15 @@ protected:
         d.Click(format == 1 ? kRbx0 : format == 2 ? kAscii : kExcel);
         d.Type(singleFile ? kInputFile : kInputFolder, path);
         d.Next();
+    }
+    // From the welcome page to `page` of `file` described by hand.
+    void ToDescriptionPage(Driver& d, int format, const std::string& file, int page)
+    {
+        ToAfterInput(d, format, true, file);
+        d.Click(kManual);
+        for (int step = 0; step < 5 && d.Page() != page; ++step)
+            d.Next();
+        ASSERT_EQ(d.Page(), page);
     }
     void ToItems(Driver& d, int format, const std::string& file, const std::string& templatePath)
     {
@@ -113,6 +135,37 @@ TEST_F(Pages, PreviewButtonIsShownByThePagesThatPreviewAndHiddenAfterEveryBack)
     w.Back();
     ASSERT_EQ(w.Page(), kSelectInput);
     EXPECT_FALSE(w.PreviewVisible());
+}
+
+TEST_F(Pages, ThePagesThatDescribeAFileShowPreviewAndItRunsWithTheirValues)
+{
+    WizardWindow w(&engine);
+    ToAfterInput(w, 2, true, inputs.asciiFile);
+    w.Click(kManual);
+    EXPECT_FALSE(w.PreviewVisible());
+    for (int page : {kDelimiters, kAsciiTime, kDataDesc, kItems, kSaveTemplate}) {
+        w.Next();
+        ASSERT_EQ(w.Page(), page);
+        EXPECT_TRUE(w.PreviewVisible()) << page;
+    }
+    w.Next();
+    ASSERT_EQ(w.Page(), kOutput);
+    EXPECT_FALSE(w.PreviewVisible());
+    for (int page : {kSaveTemplate, kItems, kDataDesc, kAsciiTime, kDelimiters}) {
+        w.Back();
+        ASSERT_EQ(w.Page(), page);
+        EXPECT_TRUE(w.PreviewVisible()) << "the page reached shows it again: " << page;
+    }
+    w.Choose(CDelimitersSettingPage::IDC_DELIMITER, "Comma");
+    w.Preview();
+    ASSERT_EQ(screen.previews.size(), 1u);
+    EXPECT_TRUE(screen.previews[0].resultRows.empty()) << "split at commas, the file reads as it stands";
+    EXPECT_EQ(engine.m_pSpecification->m_strDelimiter, "Comma");
+    w.Choose(CDelimitersSettingPage::IDC_DELIMITER, "Tab");
+    w.Preview();
+    ASSERT_EQ(screen.previews.size(), 2u);
+    EXPECT_EQ(screen.previews[1].resultRows.size(), 7u);
+    EXPECT_TRUE(std::filesystem::is_empty(inputs.temp)) << "no working file left";
 }
 
 TEST_F(Pages, Rbx0NeverShowsTheTemplatePagesInEitherDirection)
@@ -296,18 +349,180 @@ TEST_F(Pages, AStoredModifyWithoutFileShowsManualAndFoldersHideTheRadios)
     EXPECT_EQ(w.Find<QLabel>(265)->text().toStdString(), res::LoadString(res::IDS_SINGLE_ASCII));
 }
 
-// The pages of the descriptions by hand come with the next part of the wizard; until then a road
-// that needs them passes their places.
-TEST_F(Pages, ARoadThroughPagesNotYetThereGoesOnToTheNextPageThatIs)
+TEST_F(Pages, ChangingATemplateBringsTheDescriptionPagesAndBackFromOutputLeadsToSaving)
 {
     WizardWindow w(&engine);
     ToAfterInput(w, 2, true, inputs.asciiFile);
-    w.Click(kManual);
+    w.Type(kTemplate, inputs.asciiTemplate);
+    w.Next();
+    EXPECT_EQ(w.Page(), kItems) << "a template used as it is";
+    w.Back();
+    w.Click(kModify);
+    std::vector<int> visited;
+    for (int i = 0; i < 6; ++i) {
+        w.Next();
+        visited.push_back(w.Page());
+    }
+    EXPECT_EQ(visited, (std::vector<int>{kDelimiters, kAsciiTime, kDataDesc, kItems, kSaveTemplate, kOutput}));
+    w.Back();
+    EXPECT_EQ(w.Page(), kSaveTemplate);
+}
+
+TEST_F(Pages, BackFromTheDataDescriptionLeadsToTheTimePageOfTheFormat)
+{
+    for (int format : {2, 3}) {
+        WizardWindow w(&engine);
+        ToAfterInput(w, format, true, format == 2 ? inputs.asciiFile : inputs.excelFile);
+        w.Click(kManual);
+        w.Next();
+        if (format == 2)
+            w.Next();
+        ASSERT_EQ(w.Page(), format == 2 ? kAsciiTime : kExcelTime);
+        w.Next();
+        ASSERT_EQ(w.Page(), kDataDesc);
+        w.Back();
+        EXPECT_EQ(w.Page(), format == 2 ? kAsciiTime : kExcelTime);
+    }
+}
+
+TEST_F(Pages, TheTimePagesRefuseAColumnBeforeAFormatAndTheExcelFormatEvenWhenUnticked)
+{
+    WizardWindow w(&engine);
+    ToDescriptionPage(w, 3, inputs.excelFile, kExcelTime);
+    w.Click(CExcelTimeDescSettingPage::IDC_OPTION_SAME_TIME);
+    EXPECT_FALSE(w.Find(CExcelTimeDescSettingPage::IDC_DATE_FORMAT)->isEnabled());
+    EXPECT_TRUE(w.Find(CExcelTimeDescSettingPage::IDC_DATE_COLUMN)->isEnabled());
+    EXPECT_TRUE(w.Find(CExcelTimeDescSettingPage::IDC_TIME_VALUE)->isEnabled());
+    EXPECT_FALSE(w.Find(CExcelTimeDescSettingPage::IDC_DATETIME_COLUMN)->isEnabled());
+    w.Find<QLineEdit>(CExcelTimeDescSettingPage::IDC_DATE_FORMAT)->setText("DD/MM/YYYY q");
+    w.Type(CExcelTimeDescSettingPage::IDC_DATE_COLUMN, "0");
+    w.Next();
+    EXPECT_EQ(w.Page(), kExcelTime);
+    EXPECT_EQ(Said(), res::LoadString(res::IDS_COLUMN_NOT_POSITIVE));
+    w.Type(CExcelTimeDescSettingPage::IDC_DATE_COLUMN, "1");
+    w.Next();
+    EXPECT_EQ(w.Page(), kExcelTime);
+    EXPECT_EQ(Said(), res::LoadString(res::IDS_DATETIME_FORMAT_LETTERS));
+    w.Preview();
+    EXPECT_EQ(Said(), res::LoadString(res::IDS_DATETIME_FORMAT_LETTERS));
+    EXPECT_TRUE(screen.previews.empty());
+}
+
+TEST_F(Pages, TheSpinsStepWithinTheirRangeAndTypedNumbersStayAsTyped)
+{
+    WizardWindow w(&engine);
+    ToDescriptionPage(w, 2, inputs.asciiFile, kAsciiTime);
+    auto* spin = w.Find<ui::SpinButton>(CTimeDescSettingPage::IDC_DATETIME_SPIN);
+    ASSERT_NE(spin, nullptr);
+    w.Type(CTimeDescSettingPage::IDC_DATETIME_COLUMN, "1");
+    QTest::mouseClick(spin, Qt::LeftButton, Qt::NoModifier, QPoint(spin->width() / 2, spin->height() - 2));
+    EXPECT_EQ(w.Text(CTimeDescSettingPage::IDC_DATETIME_COLUMN), "1") << "stops at 1";
+    QTest::mouseClick(spin, Qt::LeftButton, Qt::NoModifier, QPoint(spin->width() / 2, 2));
+    EXPECT_EQ(w.Text(CTimeDescSettingPage::IDC_DATETIME_COLUMN), "2");
+    w.Type(CTimeDescSettingPage::IDC_DATETIME_COLUMN, "100");
+    QTest::keyClick(w.Find(CTimeDescSettingPage::IDC_DATETIME_COLUMN), Qt::Key_Up);
+    EXPECT_EQ(w.Text(CTimeDescSettingPage::IDC_DATETIME_COLUMN), "100") << "stops at 100";
+    w.Type(CTimeDescSettingPage::IDC_DATETIME_COLUMN, "250");
+    w.Next();
+    EXPECT_EQ(w.Page(), kDataDesc);
+    EXPECT_EQ(engine.m_pSpecification->m_TimeDesc.m_nDateTimeCol, 250);
+}
+
+TEST_F(Pages, TheGridsUnitListFollowsTheTypeAndOkChecksTheCatalogue)
+{
+    const std::string file = scratch.Write("upper.txt", "Water Level[M]:Instantaneous\tDischarge[m^3/s]:Instantaneous\n"
+                                                        "Time\tLevel\tFlow\n"
+                                                        "2021/01/01 00:00:00\t1.5\t2.5\n");
+    WizardWindow w(&engine);
+    ToDescriptionPage(w, 2, file, kDataDesc);
+    w.Click(CDataDescSettingPage::IDC_TYPES_BY_HAND);
+    bool shown = false;
+    guitest::WhenDialogShown([&](QDialog& dialog) {
+        shown = true;
+        auto& grid = *dynamic_cast<CDataManualDefineDlg&>(dialog).m_wndGrid;
+        EXPECT_EQ(dialog.windowTitle(), "User Defined");
+        EXPECT_EQ(grid.horizontalHeaderItem(0)->text(), "Name ");
+        EXPECT_EQ(guitest::CellText(grid, 1, 3), "M") << "the file's unit, which only types may change here";
+        EXPECT_EQ(guitest::CellText(grid, 1, 2), "Undefined") << "no types defined yet";
+        EXPECT_FALSE(grid.item(0, 2)->flags() & Qt::ItemIsEditable);
+        guitest::ChooseInCell(grid, 1, 2, "Discharge");
+        guitest::PressCell(grid, 1, 3);
+        EXPECT_EQ(guitest::CellText(grid, 1, 3), "M") << "a unit that cannot be edited is not reset";
+        auto* ok = dialog.findChild<QPushButton*>(ui::ControlName(CDataManualDefineDlg::IDOK));
+        guitest::Press(ok);
+        EXPECT_TRUE(dialog.isVisible());
+        ASSERT_EQ(screen.boxes.size(), 1u);
+        EXPECT_EQ(screen.boxes[0].text, res::LoadString(res::IDS_UNIT_TYPE_MISMATCH));
+        screen.boxes.clear();
+        guitest::ChooseInCell(grid, 1, 2, "Water Level");
+        guitest::ChooseInCell(grid, 2, 2, "Discharge");
+        guitest::Press(ok);
+        EXPECT_FALSE(dialog.isVisible()) << "M is meter's abbreviation in another case";
+    });
+    w.Click(CDataDescSettingPage::IDC_DEFINE_TYPES);
+    EXPECT_TRUE(shown);
+    EXPECT_TRUE(screen.boxes.empty());
     w.Next();
     EXPECT_EQ(w.Page(), kItems);
-    EXPECT_EQ(engine.m_nTemplateOption, 3);
-    w.Back();
-    EXPECT_EQ(w.Page(), kDefineTemplate);
+    ASSERT_EQ(engine.m_pSpecification->m_DataDesc.m_vecItemDefs.size(), 2u);
+    EXPECT_EQ(engine.m_pSpecification->m_DataDesc.m_vecItemDefs[0].m_strType, "Water Level");
+}
+
+TEST_F(Pages, TheGridOffersTheUnitsOfTheRowsTypeAndAClickResetsTheUnit)
+{
+    const std::string file = scratch.Write("level.txt", "Water Level[m]:Instantaneous\n"
+                                                        "Time\tLevel\n"
+                                                        "2021/01/01 00:00:00\t1.5\n");
+    WizardWindow w(&engine);
+    ToDescriptionPage(w, 2, file, kDataDesc);
+    w.Click(CDataDescSettingPage::IDC_UNITS_BY_HAND);
+    guitest::WhenDialogShown([&](QDialog& dialog) {
+        auto& grid = *dynamic_cast<CDataManualDefineDlg&>(dialog).m_wndGrid;
+        EXPECT_EQ(guitest::CellText(grid, 1, 3), "undefined") << "the file gives no units";
+        EXPECT_EQ(grid.item(0, 1)->background().color(), grid.palette().button().color()) << "types are shaded";
+        guitest::PressCell(grid, 1, 3);
+        auto* list = qobject_cast<QComboBox*>(grid.indexWidget(grid.model()->index(0, 2)));
+        ASSERT_NE(list, nullptr);
+        EXPECT_EQ(list->itemText(0), "centimeter") << "Water Level's units, sorted";
+        EXPECT_EQ(guitest::CellText(grid, 1, 3), "centimeter") << "the click reset the unit";
+        guitest::ChooseEntry(list, "meter");
+        EXPECT_EQ(guitest::CellText(grid, 1, 3), "meter");
+        guitest::Press(dialog.findChild<QPushButton*>(ui::ControlName(CDataManualDefineDlg::IDCANCEL)));
+    });
+    w.Click(CDataDescSettingPage::IDC_DEFINE_UNITS);
+    w.Next();
+    EXPECT_EQ(w.Page(), kItems) << "cancelled: Next fills the definitions from the file";
+    ASSERT_EQ(engine.m_pSpecification->m_DataDesc.m_vecItemDefs.size(), 1u);
+    EXPECT_EQ(engine.m_pSpecification->m_DataDesc.m_vecItemDefs[0].m_strUnit, "undefined");
+}
+
+TEST_F(Pages, DecliningToReplaceAFileKeepsTheSavePage)
+{
+    const std::string existing = scratch.Write("template.xml", "old");
+    WizardWindow w(&engine);
+    ToDescriptionPage(w, 2, inputs.asciiFile, kSaveTemplate);
+    EXPECT_EQ(w.Text(CSaveTempFilePage::IDC_FILE), existing) << "folder/template.xml is proposed";
+    screen.answers = {ui::IDNO};
+    w.Next();
+    EXPECT_EQ(w.Page(), kSaveTemplate);
+    ASSERT_EQ(screen.boxes.size(), 1u);
+    EXPECT_EQ(screen.boxes[0].text, res::LoadString(res::IDS_FILE_EXISTS_REPLACE));
+    EXPECT_EQ(screen.boxes[0].caption, "Save template file");
+    EXPECT_EQ(w.Text(CSaveTempFilePage::IDC_FILE), existing);
+    screen.boxes.clear();
+    w.Type(CSaveTempFilePage::IDC_FILE, scratch / "template.TXT");
+    w.Next();
+    EXPECT_EQ(w.Page(), kSaveTemplate);
+    EXPECT_EQ(Said(), res::LoadString(res::IDS_TEMPLATE_NAME_INVALID));
+    screen.chosenPaths = {scratch / "chosen.xml"};
+    guitest::Press(w.Find<QAbstractButton>(CSaveTempFilePage::IDC_BROWSE));
+    EXPECT_EQ(w.Text(CSaveTempFilePage::IDC_FILE), scratch / "chosen.xml");
+    ASSERT_EQ(screen.fileRequests.size(), 1u);
+    EXPECT_FALSE(screen.fileRequests[0].open);
+    EXPECT_EQ(screen.fileRequests[0].filter, "XML Files (*.xml)|*.xml|All Files (*.*)|*.*||");
+    w.Next();
+    EXPECT_EQ(w.Page(), kOutput);
+    EXPECT_EQ(guitest::ReadFile(existing), "old");
 }
 
 TEST_F(Pages, CancelAndClosingWriteNothingAndKeepTheHostsDocument)
@@ -380,24 +595,36 @@ class Accessibility : public Pages {
 protected:
     void CheckPage(Driver& d)
     {
-        CWizard& wizard = d.Wizard();
-        QWidget* page = wizard.currentPage();
         SCOPED_TRACE(testing::Message() << "page " << d.Page());
-        for (QWidget* control : guitest::Controls(*page)) {
-            if (qobject_cast<QLineEdit*>(control) || qobject_cast<QAbstractItemView*>(control)) {
+        CheckWindow(d.Wizard(), *d.Wizard().currentPage());
+    }
+    // The controls of `content` on `window`: names, mnemonics, nothing cut off, the tab order.
+    static void CheckWindow(QWidget& window, QWidget& content)
+    {
+        for (QWidget* control : guitest::Controls(content)) {
+            if (qobject_cast<QLineEdit*>(control) || qobject_cast<QAbstractItemView*>(control) ||
+                qobject_cast<QComboBox*>(control) || qobject_cast<ui::SpinButton*>(control)) {
                 EXPECT_FALSE(control->accessibleName().isEmpty()) << control->objectName().toStdString();
             }
         }
-        const QString letters = ui::MnemonicsUnder(&wizard);
+        const QString letters = ui::MnemonicsUnder(&window);
         for (QChar letter : letters)
             EXPECT_EQ(letters.count(letter), 1) << "mnemonic " << QString(letter).toStdString() << " in " << letters.toStdString();
-        for (QAbstractButton* button : page->findChildren<QAbstractButton*>()) {
-            if (button->isVisibleTo(page) && button->text() != "...") {
+        for (QAbstractButton* button : content.findChildren<QAbstractButton*>()) {
+            if (button->isVisibleTo(&content) && button->text() != "..." && !button->text().isEmpty() &&
+                !ReachedThroughItsGroup(*button)) {
                 EXPECT_TRUE(button->text().contains('&')) << button->text().toStdString() << " has no mnemonic";
             }
         }
-        CheckNothingClipped(wizard);
-        CheckTabOrder(*page);
+        CheckNothingClipped(window);
+        CheckTabOrder(content);
+    }
+    // A radio button in a group box with a letter: the letter leads to the group's chosen button,
+    // the arrow keys to the others.
+    static bool ReachedThroughItsGroup(const QAbstractButton& button)
+    {
+        auto* group = qobject_cast<QGroupBox*>(button.parentWidget());
+        return qobject_cast<const QRadioButton*>(&button) && group && group->title().contains('&');
     }
     static void CheckNothingClipped(QWidget& wizard)
     {
@@ -417,6 +644,16 @@ protected:
                                    ? button->fontMetrics().horizontalAdvance(QString(button->text()).remove('&')) + 8
                                    : button->sizeHint().width();
             EXPECT_GE(button->width(), needed) << button->text().toStdString();
+        }
+        for (QComboBox* list : wizard.findChildren<QComboBox*>()) {
+            if (!list->isVisible())
+                continue;
+            QStyleOptionComboBox option;
+            option.initFrom(list);
+            const int room =
+                list->style()->subControlRect(QStyle::CC_ComboBox, &option, QStyle::SC_ComboBoxEditField, list).width();
+            for (int i = 0; i < list->count(); ++i)
+                EXPECT_LE(list->fontMetrics().horizontalAdvance(list->itemText(i)), room) << list->itemText(i).toStdString();
         }
     }
     // Tab moves through the controls line by line, left to right.
@@ -461,6 +698,43 @@ TEST_F(Accessibility, EveryPageOfTheRoadsIsNamedReachableAndUnclipped)
     EXPECT_EQ(w.Find(kInputFile)->accessibleName(), "File:");
     EXPECT_EQ(w.Find(kTitle)->accessibleName(), "Title:");
     EXPECT_EQ(w.Find(277)->accessibleName().isEmpty() ? w.Find<QAbstractButton>(277)->text() : QString(), "&Preview");
+}
+
+TEST_F(Accessibility, EveryPageOfTheDescriptionByHandAndTheGridAreNamedReachableAndUnclipped)
+{
+    WizardWindow w(&engine);
+    ToAfterInput(w, 2, true, inputs.asciiFile);
+    w.Click(kManual);
+    const std::vector<int> road = {kDelimiters, kAsciiTime, kDataDesc, kItems, kSaveTemplate, kOutput};
+    for (int page : road) {
+        w.Next();
+        ASSERT_EQ(w.Page(), page);
+        CheckPage(w);
+        if (page == kDataDesc) {
+            w.Click(CDataDescSettingPage::IDC_NAMES_BY_HAND);
+            bool shown = false;
+            guitest::WhenDialogShown([&](QDialog& dialog) {
+                shown = true;
+                CheckWindow(dialog, dialog);
+                EXPECT_EQ(dialog.findChild<QWidget*>("id314")->accessibleName(), "Item definitions");
+            });
+            w.Click(CDataDescSettingPage::IDC_DEFINE_NAMES);
+            EXPECT_TRUE(shown);
+            w.Click(CDataDescSettingPage::IDC_NAMES_IN_ROW);
+        }
+    }
+    EXPECT_EQ(w.Find(CDataDescSettingPage::IDC_NAME_ROW)->accessibleName(), "Item names in row:");
+    EXPECT_EQ(w.Find(CDataDescSettingPage::IDC_DEFINE_TYPES)->accessibleName(), "Define item types manually");
+
+    WizardWindow excel(&engine);
+    ToAfterInput(excel, 3, true, inputs.excelFile);
+    excel.Click(kManual);
+    excel.Next();
+    ASSERT_EQ(excel.Page(), kExcelTime);
+    excel.Click(CExcelTimeDescSettingPage::IDC_OPTION_SAME_DATE);
+    CheckPage(excel);
+    EXPECT_EQ(excel.Find(CExcelTimeDescSettingPage::IDC_TIME_FORMAT)->accessibleName(), "Time format:");
+    EXPECT_EQ(excel.Find(CExcelTimeDescSettingPage::IDC_DATE_VALUE)->accessibleName(), "Date value:");
 }
 
 } // namespace

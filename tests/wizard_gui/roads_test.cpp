@@ -1,100 +1,23 @@
 // Every road of the wizard that uses a template as it is, a folder, or rbx0 input, clicked through
 // on the real widgets with the dialogs answered by script: each ends in Finish and a document the
 // host program then runs. Every page of every road is saved as a picture under the build folder.
-#include "tests/wizard_gui/GuiTestSupport.h"
+#include "tests/wizard_gui/RoadTestSupport.h"
 
-#include "engine/ModuleHandle.h"
-#include "platform/harbor/qt/OverviewPage.h"
-#include "platform/wpx/Wpx.h"
 #include "wizard/DefineOutputItemsPage.h"
-#include "wizard/SetupGui.h"
 
 #include <QTreeWidget>
-
-#include <cstdlib>
-#include <fstream>
-#include <sstream>
-#include <sys/wait.h>
 
 namespace {
 
 using namespace wizardtest;
 using guitest::Driver;
 
-constexpr int kFinished = 12325;
-
 // Control ids the roads use.
 enum : int { kSingleFile = 201, kAscii = 202, kRbx0 = 203, kExcel = 204, kFolder = 205, kInputFile = 206,
              kInputFolder = 208, kUnchanged = 249, kTemplateBrowse = 254, kTemplate = 263, kOutputAscii = 209,
              kOutputExcel = 210, kOutputFile = 264, kOutputFolder = 268, kTitle = 270 };
 
-std::string ReadFile(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream text;
-    text << in.rdbuf();
-    return text.str();
-}
-
-class Roads : public testing::Test {
-protected:
-    void SetUp() override { SetModuleWpxHandle(0); }
-    void TearDown() override
-    {
-        WPXHANDLE document = ModuleWpxDocument();
-        if (document)
-            wpxClose(&document);
-        SetModuleWpxHandle(0);
-    }
-
-    // Saves a picture of the page the road has reached.
-    void Snap(Driver& driver, const std::string& road)
-    {
-        guitest::SavePicture(driver.Wizard(), road + "-" + std::to_string(++m_step) + "-" + std::to_string(driver.Page()));
-    }
-    // Next, expecting to arrive at `page`, and a picture of it.
-    void NextTo(Driver& driver, const std::string& road, int page)
-    {
-        driver.Next();
-        ASSERT_EQ(driver.Page(), page) << road << ": " << (screen.boxes.empty() ? "" : screen.boxes.back().text);
-        Snap(driver, road);
-    }
-    void FinishFrom(Driver& driver, const std::string& road)
-    {
-        NextTo(driver, road, COverviewPage::IDD);
-        driver.Finish();
-    }
-
-    // Runs the wizard as the plug-in's entry point does, then stores the new document and runs it
-    // with the host program; returns what the run said.
-    std::string RunRoad(const std::string& road, const std::function<void(Driver&)>& script)
-    {
-        m_step = 0;
-        const int result = guitest::RunModal(ShowSetupWizard, [&](Driver& driver) {
-            Snap(driver, road);
-            driver.Next();
-            Snap(driver, road);
-            script(driver);
-        });
-        EXPECT_EQ(result, kFinished) << road;
-        EXPECT_TRUE(std::filesystem::is_empty(inputs.temp)) << road << ": the wizard left a working file";
-        if (result != kFinished || !GetModuleWpxHandle())
-            return std::string();
-        const std::string document = scratch / (road + ".wpx");
-        EXPECT_EQ(wpxWrite(ModuleWpxDocument(), document), 1);
-        const std::string err = scratch / (road + ".err");
-        const std::string command = "'" VELMORA_BIN_DIR "/velmora' run '" + document + "' >/dev/null 2>'" + err + "'";
-        const int status = std::system(command.c_str());
-        EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0) << road << ": " << ReadFile(err);
-        return ReadFile(err);
-    }
-
-    TempFolder scratch;
-    Inputs inputs{scratch};
-    ui::ScriptedUserInterface screen;
-    ui::ScopedUserInterface watching{screen};
-    int m_step = 0;
-};
+using Roads = guitest::RoadTest;
 
 TEST_F(Roads, Rbx0FileChosenInTheSelectorToAscii)
 {

@@ -21,7 +21,8 @@ int CHarborPage::MessageBoxA(const CString& text, const char* caption, unsigned 
 
 void CHarborPage::SetPageSize(int widthUnits, int heightUnits)
 {
-    setMinimumSize(ui::DialogUnitsToPixels(font(), widthUnits, heightUnits));
+    // A page whose controls need more room than the dialog template's size gets it.
+    setMinimumSize(ui::DialogUnitsToPixels(font(), widthUnits, heightUnits).expandedTo(minimumSizeHint()));
 }
 
 void CHarborPage::InitializeOnce()

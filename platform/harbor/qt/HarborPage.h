@@ -47,7 +47,8 @@ public:
     virtual CString HelpText() const;
 
 protected:
-    // Gives the page its size in the dialog units of the toolbox's dialog templates.
+    // Gives the page its size in the dialog units of the toolbox's dialog templates, or the size its
+    // laid-out controls need when that is larger.
     void SetPageSize(int widthUnits, int heightUnits);
 
     unsigned m_dwFlags = 0;

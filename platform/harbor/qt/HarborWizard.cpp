@@ -47,9 +47,19 @@ void CHarborWizard::setVisible(bool visible)
 {
     if (visible && !m_bInitialized) {
         m_bInitialized = true;
+        SizePagesAlike();
         OnInitDialog();
     }
     QWizard::setVisible(visible);
+}
+
+void CHarborWizard::SizePagesAlike()
+{
+    QSize largest;
+    for (int id : pageIds())
+        largest = largest.expandedTo(page(id)->minimumSize());
+    for (int id : pageIds())
+        page(id)->setMinimumSize(largest);
 }
 
 int CHarborWizard::SheetIndex(int id) const

@@ -49,6 +49,9 @@ protected:
     bool validateCurrentPage() override;
 
 private:
+    // Gives every page the size of the largest, as a property sheet does, so the wizard keeps its
+    // size from page to page.
+    void SizePagesAlike();
     void OnCurrentIdChanged(int id);
     void Activate(int id);
     // The page a move reaches: `result` of OnWizardNext/OnWizardBack (0 = the neighbour in sheet

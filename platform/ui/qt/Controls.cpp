@@ -1,10 +1,13 @@
 #include "platform/ui/qt/Controls.h"
 
 #include <QAbstractButton>
+#include <QComboBox>
 #include <QFontMetrics>
+#include <QGroupBox>
 #include <QHBoxLayout>
 #include <QLabel>
 #include <QPushButton>
+#include <QRadioButton>
 #include <QWidget>
 
 namespace ui {
@@ -35,6 +38,9 @@ QString TextOf(QWidget* widget)
 {
     if (auto* button = qobject_cast<QAbstractButton*>(widget))
         return button->text();
+    // A group box's letter takes the keyboard to the group's chosen radio button.
+    if (auto* group = qobject_cast<QGroupBox*>(widget))
+        return group->title();
     if (auto* label = qobject_cast<QLabel*>(widget); label && label->buddy())
         return label->text();
     return QString();
@@ -44,6 +50,8 @@ void SetTextOf(QWidget* widget, const QString& text)
 {
     if (auto* button = qobject_cast<QAbstractButton*>(widget))
         button->setText(text);
+    else if (auto* group = qobject_cast<QGroupBox*>(widget))
+        group->setTitle(text);
     else if (auto* label = qobject_cast<QLabel*>(widget))
         label->setText(text);
 }
@@ -62,6 +70,11 @@ qsizetype MnemonicPosition(const QString& text, const QString& taken)
         }
     }
     return -1;
+}
+
+bool InGroupBox(QWidget* widget)
+{
+    return qobject_cast<QRadioButton*>(widget) && qobject_cast<QGroupBox*>(widget->parentWidget());
 }
 
 QList<QWidget*> MnemonicCandidates(QWidget* root)
@@ -111,6 +124,37 @@ QLabel* LabelFor(const QString& text, QWidget* buddy, QWidget* parent)
     return label;
 }
 
+void ChainTabs(const std::vector<QWidget*>& widgets)
+{
+    for (size_t i = 1; i < widgets.size(); ++i)
+        QWidget::setTabOrder(widgets[i - 1], widgets[i]);
+}
+
+QComboBox* DropDownList(QWidget* parent)
+{
+    auto* list = new QComboBox(parent); // owned by `parent`
+    list->setSizeAdjustPolicy(QComboBox::AdjustToContents);
+    return list;
+}
+
+void ShowEntries(QComboBox* list, const std::vector<std::string>& entries, int selected)
+{
+    if (EntriesOf(list) != entries) {
+        list->clear();
+        for (const std::string& entry : entries)
+            list->addItem(QString::fromStdString(entry));
+    }
+    list->setCurrentIndex(selected);
+}
+
+std::vector<std::string> EntriesOf(const QComboBox* list)
+{
+    std::vector<std::string> entries;
+    for (int i = 0; i < list->count(); ++i)
+        entries.push_back(list->itemText(i).toStdString());
+    return entries;
+}
+
 void AssignMnemonics(QWidget* root, const QString& reserved)
 {
     QString taken = reserved.toLower();
@@ -120,7 +164,15 @@ void AssignMnemonics(QWidget* root, const QString& reserved)
         if (!letter.isNull())
             taken += letter;
     }
-    for (QWidget* widget : candidates) {
+    // Radio buttons in a group box come last: their group's letter already reaches them.
+    QList<QWidget*> ordered;
+    for (QWidget* widget : candidates)
+        if (!InGroupBox(widget))
+            ordered << widget;
+    for (QWidget* widget : candidates)
+        if (InGroupBox(widget))
+            ordered << widget;
+    for (QWidget* widget : ordered) {
         const QString text = TextOf(widget);
         if (!MnemonicOf(text).isNull() || text.contains("&&"))
             continue;

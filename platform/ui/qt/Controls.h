@@ -7,8 +7,11 @@
 #include <QString>
 
 #include <initializer_list>
+#include <string>
+#include <vector>
 
 class QAbstractButton;
+class QComboBox;
 class QHBoxLayout;
 class QLabel;
 class QPushButton;
@@ -33,10 +36,24 @@ QHBoxLayout* ButtonRow(std::initializer_list<QAbstractButton*> buttons);
 // A label for `buddy`: the buddy takes the label's text (without "&") as its accessible name.
 QLabel* LabelFor(const QString& text, QWidget* buddy, QWidget* parent);
 
-// Puts a "&" before one letter of every button and buddy label under `root` that has none, taking
-// the first letter of a word (else any letter) not yet taken by another control or by `reserved`.
+// Puts `widgets` one after the other in the tab order, for pages whose controls are not made in
+// the order they are laid out.
+void ChainTabs(const std::vector<QWidget*>& widgets);
+
+// A drop-down list as wide as its longest entry, whenever its entries change.
+QComboBox* DropDownList(QWidget* parent);
+// Makes `list` hold `entries` (refilled only when they differ) with entry `selected` current, -1
+// for none.
+void ShowEntries(QComboBox* list, const std::vector<std::string>& entries, int selected);
+// The entries of `list`, in order.
+std::vector<std::string> EntriesOf(const QComboBox* list);
+
+// Puts a "&" before one letter of every button, buddy label and group box under `root` that has
+// none, taking the first letter of a word (else any letter) not yet taken by another control or by
+// `reserved`. A radio button may be left without one when its group box has one: the box's letter
+// leads to the group's chosen radio button, and the arrow keys to the others.
 void AssignMnemonics(QWidget* root, const QString& reserved);
-// The mnemonic letters of the visible buttons and buddy labels under `root`, lower case, in
+// The mnemonic letters of the visible buttons, buddy labels and group boxes under `root`, lower case, in
 // widget order (a letter twice means a clash).
 QString MnemonicsUnder(QWidget* root);
 
