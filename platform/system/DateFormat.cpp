@@ -13,6 +13,18 @@ constexpr std::string_view kDateTimeSeparators = "/ T:-.|";
 
 } // namespace
 
+std::vector<std::string_view> DateTimeTokens(std::string_view text)
+{
+    std::vector<std::string_view> tokens;
+    size_t pos = 0;
+    while ((pos = text.find_first_not_of(kDateTimeSeparators, pos)) != std::string_view::npos) {
+        const size_t end = std::min(text.find_first_of(kDateTimeSeparators, pos), text.size());
+        tokens.push_back(text.substr(pos, end - pos));
+        pos = end;
+    }
+    return tokens;
+}
+
 DateFormat::DateFormat(std::string_view format, Reads reads, std::string_view extraSeparators)
 {
     for (char c : kDateTimeSeparators)

@@ -52,4 +52,7 @@ private:
     bool m_compact = false; // the format is Y M D H m S, so ReadCompact may apply
 };
 
+// The tokens of a date/time text split as the reader splits it (at any run of "/ T:-.|").
+std::vector<std::string_view> DateTimeTokens(std::string_view text);
+
 } // namespace sys
