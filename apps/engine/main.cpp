@@ -110,7 +110,7 @@ std::unique_ptr<converter::ConversionLog> OpenLog(const converter::JobSetup& set
     auto log = std::make_unique<converter::ConversionLog>(path, nullptr);
     if (log->IsOpen())
         return log;
-    std::fprintf(stderr, "Velmora: %s; logging to standard error\n", text::EscapeControls(log->OpenError()).c_str());
+    std::fprintf(stderr, "Velmora: %s; logging to standard error\n", text::EscapeControls(log->status().problem().Describe()).c_str());
     return std::make_unique<converter::ConversionLog>(std::string(), stderr);
 }
 
@@ -172,9 +172,8 @@ int main(int argc, char** argv)
     ui::SetProcessUserInterface(&silent);
     try {
         converter::JobSetup setup;
-        std::string error;
-        if (!converter::ReadJobSetup(arguments.setupFile, setup, error)) {
-            std::fprintf(stderr, "Velmora: %s\n", text::EscapeControls(error).c_str());
+        if (const sys::Status read = converter::ReadJobSetup(arguments.setupFile, setup); !read) {
+            std::fprintf(stderr, "Velmora: %s\n", text::EscapeControls(read.problem().Describe()).c_str());
             return converter::kExitSetup;
         }
         std::unique_ptr<converter::ConversionLog> log = OpenLog(setup);
