@@ -4,7 +4,8 @@
 # package, one thread, written to Parquet). Installs python3-pandas (apt) and DuckDB (npm, into a
 # temporary folder) when they are missing.
 #   bench/compare_peers.sh [BUILD_DIR] [ROWS]     (defaults: build, 1000000)
-# BASELINE_ENGINE=path/to/an/older/Velmora adds its text <-> rbx0 rows, for before/after in one run.
+# BASELINE_ENGINE=path/to/an/older/Velmora adds its text <-> rbx0 and .xlsx rows, for before/after in one
+# run; ENGINES_ONLY=1 leaves out the peers.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 build="${1:-build}"
@@ -24,14 +25,16 @@ if [ -n "${BASELINE_ENGINE:-}" ]; then
   BASELINE_ENGINE="$work/engines/baseline/Velmora"
 fi
 
-if ! /usr/bin/python3 -c 'import pandas' 2>/dev/null; then
-  echo "installing python3-pandas ..." >&2
-  (apt-get update -qq && apt-get install -y -qq python3-pandas) >/dev/null
-fi
-if [ ! -d "$work/duckdb/node_modules/@duckdb/node-api" ]; then
-  echo "installing DuckDB for node into $work/duckdb ..." >&2
-  mkdir -p "$work/duckdb"
-  (cd "$work/duckdb" && npm init -y >/dev/null && npm install --silent @duckdb/node-api >/dev/null)
+if [ -z "${ENGINES_ONLY:-}" ]; then
+  if ! /usr/bin/python3 -c 'import pandas' 2>/dev/null; then
+    echo "installing python3-pandas ..." >&2
+    (apt-get update -qq && apt-get install -y -qq python3-pandas) >/dev/null
+  fi
+  if [ ! -d "$work/duckdb/node_modules/@duckdb/node-api" ]; then
+    echo "installing DuckDB for node into $work/duckdb ..." >&2
+    mkdir -p "$work/duckdb"
+    (cd "$work/duckdb" && npm init -y >/dev/null && npm install --silent @duckdb/node-api >/dev/null)
+  fi
 fi
 
 echo "generating $rows rows ..." >&2
@@ -98,6 +101,7 @@ with open(sys.argv[2], "wb") as out:
     stamps.to_numpy().astype("int64").tofile(out)
     frame.iloc[:, 1:].to_numpy(dtype=numpy.float64).tofile(out)
 PY
+mkdir -p "$work/duckdb"
 cat > "$work/duckdb/convert.mjs" <<'JS'
 import { DuckDBInstance } from "@duckdb/node-api";
 const instance = await DuckDBInstance.create(":memory:", { threads: "1" });
@@ -123,6 +127,15 @@ head -n $((rows / 10 + 2)) "$work/series.txt" > "$work/tenth.txt"
 setup 2 "$work/tenth.txt" 3 "$work/tenth.xlsx"
 bytes_all=$bytes; rows_all=$rows; bytes=$(stat -c %s "$work/tenth.txt"); rows=$((rows / 10))
 measure "Velmora text -> xlsx (1/10)" "$engine" "$work/setup.wpx" 1 --threads 1 --quiet
+setup 3 "$work/tenth.xlsx" 1 "$work/tenth.rbx0"
+measure "Velmora xlsx -> rbx0 (1/10)" "$engine" "$work/setup.wpx" 1 --threads 1 --quiet
+if [ -n "${BASELINE_ENGINE:-}" ]; then
+  setup 2 "$work/tenth.txt" 3 "$work/base.xlsx"
+  measure "baseline text -> xlsx (1/10)" "$BASELINE_ENGINE" "$work/setup.wpx" 1 --threads 1 --quiet
+  setup 3 "$work/base.xlsx" 1 "$work/base.rbx0"
+  measure "baseline xlsx -> rbx0 (1/10)" "$BASELINE_ENGINE" "$work/setup.wpx" 1 --threads 1 --quiet
+fi
 bytes=$bytes_all; rows=$rows_all
+[ -n "${ENGINES_ONLY:-}" ] && exit 0
 measure "pandas read_csv + binary" /usr/bin/python3 "$work/pandas_read.py" "$work/series.txt" "$work/pandas.bin"
 measure "DuckDB 1 thread + Parquet" node "$work/duckdb/convert.mjs" "$work/series.txt" "$work/duck.parquet"
