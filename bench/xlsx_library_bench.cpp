@@ -19,6 +19,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <exception>
+#include <fstream>
 #include <memory>
 #include <stdexcept>
 #include <string>
@@ -549,6 +550,9 @@ void BM_UnpackOurs(benchmark::State& state)
             bytes += got;
     }
     state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * bytes));
+    state.counters["part_MB"] = static_cast<double>(bytes) / 1e6;
+    std::ifstream file(WorkbookPath(), std::ios::binary | std::ios::ate);
+    state.counters["file_MB"] = static_cast<double>(file.tellg()) / 1e6;
 }
 
 void BM_UnpackLibzip(benchmark::State& state)
