@@ -89,6 +89,7 @@ void Report(benchmark::State& state, const TallySink& sink)
     if (sink.cells != kRows * (kNumberColumns + 2))
         state.SkipWithError(("read " + std::to_string(sink.cells) + " cells").c_str());
     state.counters["cells"] = static_cast<double>(sink.cells);
+    state.counters["value_sum"] = sink.sum; // equal for every reader that reads the same cells
     benchmark::DoNotOptimize(sink.sum);
 }
 
@@ -502,40 +503,30 @@ const sheet::xlsx::SharedStrings& Strings()
 
 // ---- benchmarks --------------------------------------------------------------------------------
 
-void BM_WorkbookImport(benchmark::State& state)
+// Reads the workbook into a sink with `read` for each iteration.
+template <typename Read>
+void ReadWhole(benchmark::State& state, Read read)
 {
     WorkbookPath(); // made before the timing starts
     TallySink sink;
     for (auto _ : state) {
         sink.Reset();
+        read(sink);
+    }
+    Report(state, sink);
+}
+
+void BM_WorkbookImport(benchmark::State& state)
+{
+    ReadWhole(state, [&](TallySink& sink) {
         sheet::StyleTable styles;
         if (!sheet::ImportWorkbook(WorkbookPath(), sink, styles).ok())
             state.SkipWithError("the workbook did not read");
-    }
-    Report(state, sink);
+    });
 }
 
-void BM_SheetOurs(benchmark::State& state)
-{
-    WorkbookPath(); // made before the timing starts
-    TallySink sink;
-    for (auto _ : state) {
-        sink.Reset();
-        ReadWithOurs(sink);
-    }
-    Report(state, sink);
-}
-
-void BM_SheetLibzipExpat(benchmark::State& state)
-{
-    WorkbookPath(); // made before the timing starts
-    TallySink sink;
-    for (auto _ : state) {
-        sink.Reset();
-        ReadWithLibraries(sink);
-    }
-    Report(state, sink);
-}
+void BM_SheetOurs(benchmark::State& state) { ReadWhole(state, ReadWithOurs); }
+void BM_SheetLibzipExpat(benchmark::State& state) { ReadWhole(state, ReadWithLibraries); }
 
 void BM_UnpackOurs(benchmark::State& state)
 {
@@ -567,7 +558,9 @@ void BM_UnpackLibzip(benchmark::State& state)
     state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * bytes));
 }
 
-void BM_XmlOurs(benchmark::State& state)
+// Reads the unpacked sheet from memory into a sink with `read` for each iteration.
+template <typename Read>
+void ReadUnpacked(benchmark::State& state, Read read)
 {
     WorkbookPath(); // made before the timing starts
     const std::string& text = UnpackedSheet();
@@ -576,6 +569,15 @@ void BM_XmlOurs(benchmark::State& state)
     TallySink sink;
     for (auto _ : state) {
         sink.Reset();
+        read(text, sheet::xlsx::SheetContext{Strings(), styles, false, limits}, sink);
+    }
+    state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * text.size()));
+    Report(state, sink);
+}
+
+void BM_XmlOurs(benchmark::State& state)
+{
+    ReadUnpacked(state, [](const std::string& text, const sheet::xlsx::SheetContext& context, TallySink& sink) {
         std::size_t at = 0;
         sheet::XmlScanner xml(
             [&](char* out, std::size_t capacity) {
@@ -585,22 +587,14 @@ void BM_XmlOurs(benchmark::State& state)
                 return take;
             },
             kSheetPart);
-        sheet::xlsx::ReadSheetCells(xml, {Strings(), styles, false, limits}, 0, sink);
-    }
-    state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * text.size()));
-    Report(state, sink);
+        sheet::xlsx::ReadSheetCells(xml, context, 0, sink);
+    });
 }
 
 void BM_XmlExpat(benchmark::State& state)
 {
-    WorkbookPath(); // made before the timing starts
-    const std::string& text = UnpackedSheet();
-    const sheet::xlsx::CellStyles styles;
-    const sheet::ImportLimits limits;
-    TallySink sink;
-    for (auto _ : state) {
-        sink.Reset();
-        ExpatSheet reader({Strings(), styles, false, limits}, 0, sink);
+    ReadUnpacked(state, [](const std::string& text, const sheet::xlsx::SheetContext& context, TallySink& sink) {
+        ExpatSheet reader(context, 0, sink);
         // Through a 64 KiB buffer, as the unpacked chunks would arrive.
         char buffer[kChunk];
         std::size_t at = 0;
@@ -610,9 +604,7 @@ void BM_XmlExpat(benchmark::State& state)
             at += take;
             reader.Feed(buffer, take, at == text.size());
         } while (at < text.size());
-    }
-    state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * text.size()));
-    Report(state, sink);
+    });
 }
 
 // The floor under any expat reader: the parse alone, its handlers only counting elements.
