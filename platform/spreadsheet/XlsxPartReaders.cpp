@@ -237,47 +237,146 @@ CellStyles ReadStyles(XmlScanner& xml, StyleTable& table)
     return styles;
 }
 
-namespace {
+CellBuilder::CellBuilder(const SheetContext& context, std::string part) : m_context(context), m_part(std::move(part)) {}
 
-// One <c> element as read, before it becomes an ImportedCell.
-struct RawCell {
-    std::string reference;
-    std::string type;
-    unsigned style = 0;
-    bool hasValue = false;
-    bool hasFormula = false;
-    std::string value;      // <v>
-    bool hasInline = false;
-    std::string inlineText; // <is>
-    std::uint64_t offset = 0;
-};
+void CellBuilder::Fail(const std::string& why, std::uint64_t offset) const
+{
+    throw XmlScanner::Error(m_part + ", byte " + std::to_string(offset) + ": " + why);
+}
+
+void CellBuilder::FailOutsideGrid(int row, int column, std::uint64_t offset) const
+{
+    Fail("cell row " + std::to_string(row) + ", column " + std::to_string(column) + " lies outside the sheet's grid of " +
+             std::to_string(m_context.limits.maxRows) + " rows and " + std::to_string(m_context.limits.maxColumns) +
+             " columns",
+         offset);
+}
+
+// A row without a number follows the one before.
+void CellBuilder::StartRow(std::optional<std::string_view> number, std::uint64_t offset)
+{
+    if (number) {
+        const std::optional<int> row = ParseUnsigned<int>(*number);
+        if (!row || *row < 1 || *row > 1048576)
+            Fail("the row number '" + std::string(*number) +
+                     "' is malformed or lies outside the sheet's grid (1048576 rows, 16384 columns)",
+                 offset);
+        m_row = *row;
+    } else {
+        ++m_row;
+    }
+    if (m_row > m_context.limits.maxRows)
+        FailOutsideGrid(m_row, 1, offset);
+    m_column = 0;
+}
+
+const ImportedCell* CellBuilder::Build(const RawCell& raw)
+{
+    m_cell = ImportedCell();
+    m_cell.style = raw.style;
+    Place(raw, m_cell);
+    Interpret(raw, m_cell);
+    // A blank cell counts only when it carries a style other than General's default.
+    return m_cell.type != Variant::Empty || m_cell.style != 0 ? &m_cell : nullptr;
+}
+
+// A cell without a reference follows the one before in its row.
+void CellBuilder::Place(const RawCell& raw, ImportedCell& cell)
+{
+    if (raw.reference.empty()) {
+        cell.row = std::max(m_row, 1);
+        cell.column = m_column + 1;
+    } else {
+        const std::optional<CellPosition> position = ParseCellAddress(raw.reference);
+        if (!position)
+            Fail("the cell reference '" + raw.reference +
+                     "' is malformed or lies outside the sheet's grid (1048576 rows, 16384 columns)",
+                 raw.offset);
+        cell.row = position->row;
+        cell.column = position->column;
+    }
+    if (cell.row > m_context.limits.maxRows || cell.column > m_context.limits.maxColumns)
+        FailOutsideGrid(cell.row, cell.column, raw.offset);
+    m_row = cell.row;
+    m_column = cell.column;
+}
+
+void CellBuilder::Interpret(const RawCell& raw, ImportedCell& cell) const
+{
+    const std::string& type = raw.type;
+    const std::string& value = raw.value;
+    if (type == "inlineStr") {
+        cell.type = Variant::Text;
+        cell.text = raw.hasInline ? raw.inlineText : value;
+    } else if (type == "str") {
+        cell.type = Variant::Text; // a formula's text result
+        cell.text = value;
+        cell.formulaWithoutResult = raw.hasFormula && value.empty();
+    } else if (TrimSpaces(value).empty()) {
+        // A cell without a value is blank; a formula without one was written by a tool that does
+        // not calculate (<f>...</f><v></v>) and reads as the empty text.
+        if (raw.hasFormula) {
+            cell.type = Variant::Text;
+            cell.formulaWithoutResult = true;
+        }
+    } else if (type == "n") {
+        const std::optional<double> number = ParseNumber(value);
+        if (!number)
+            Fail("the cell " + CellName(cell) + " holds '" + value.substr(0, 40) + "', which is not a number", raw.offset);
+        cell.type = Variant::Number;
+        cell.number = *number;
+        const std::vector<bool>& dates = m_context.styles.dateStyles;
+        if (m_context.date1904 && cell.style < dates.size() && dates[cell.style])
+            cell.number += k1904Offset;
+    } else if (type == "s") {
+        const std::optional<std::size_t> index = ParseUnsigned<std::size_t>(value);
+        if (!index || *index >= m_context.strings.Count())
+            Fail("the cell " + CellName(cell) + " refers to shared string '" + value.substr(0, 40) + "' of " +
+                 std::to_string(m_context.strings.Count()), raw.offset);
+        cell.type = Variant::Text;
+        cell.text = m_context.strings.At(*index);
+    } else if (type == "str") {
+        cell.type = Variant::Text;
+        cell.text = value;
+    } else if (type == "b") {
+        const std::string_view flag = TrimSpaces(value);
+        if (flag != "0" && flag != "1" && flag != "true" && flag != "false")
+            Fail("the cell " + CellName(cell) + " holds '" + value.substr(0, 40) + "', which is not a boolean", raw.offset);
+        cell.type = Variant::Boolean;
+        cell.number = flag == "1" || flag == "true" ? 1 : 0;
+    } else if (type == "e") {
+        cell.type = Variant::Error;
+        cell.text = TrimSpaces(value);
+    } else if (type == "d") {
+        const std::optional<double> serial = ParseIsoDate(value);
+        if (!serial)
+            Fail("the cell " + CellName(cell) + " holds '" + value.substr(0, 40) + "', which is not an ISO 8601 date", raw.offset);
+        cell.type = Variant::Number;
+        cell.number = *serial;
+    } else {
+        Fail("the cell " + CellName(cell) + " has the unknown type '" + type.substr(0, 40) + "'", raw.offset);
+    }
+}
+
+namespace {
 
 class SheetCellReader {
 public:
     SheetCellReader(XmlScanner& xml, const SheetContext& context, int index, ImportSink& sink)
-        : m_xml(xml), m_context(context), m_index(index), m_sink(sink) {}
+        : m_xml(xml), m_builder(context, xml.PartName()), m_index(index), m_sink(sink) {}
 
     // False when the sink stopped the reading.
     bool Read();
 
 private:
-    void StartRow();
     void ReadCell();
-    void Place(ImportedCell& cell);
-    void Interpret(ImportedCell& cell);
-    [[noreturn]] void Fail(const std::string& why) const { m_xml.Fail(why, m_raw.offset); }
-    [[noreturn]] void FailOutsideGrid(int row, int column) const;
-    static std::string CellName(const ImportedCell& cell) { return ColumnLetters(cell.column) + std::to_string(cell.row); }
 
     XmlScanner& m_xml;
-    const SheetContext& m_context;
+    CellBuilder m_builder;
     int m_index;
     ImportSink& m_sink;
     bool m_stopped = false;
-    int m_row = 0;    // of the last row or cell
-    int m_column = 0; // of the last cell in the row
     RawCell m_raw;
-    ImportedCell m_cell;
 };
 
 bool SheetCellReader::Read()
@@ -291,37 +390,12 @@ bool SheetCellReader::Read()
         } else if (m_xml.Depth() == 2) {
             inSheetData = m_xml.Name() == "sheetData";
         } else if (inSheetData && m_xml.Name() == "row") {
-            StartRow();
+            m_builder.StartRow(m_xml.Attribute("r"), m_xml.TokenOffset());
         } else if (inSheetData && m_xml.Name() == "c") {
             ReadCell();
         }
     }
     return !m_stopped;
-}
-
-void SheetCellReader::FailOutsideGrid(int row, int column) const
-{
-    Fail("cell row " + std::to_string(row) + ", column " + std::to_string(column) + " lies outside the sheet's grid of " +
-         std::to_string(m_context.limits.maxRows) + " rows and " + std::to_string(m_context.limits.maxColumns) + " columns");
-}
-
-// A row without a number follows the one before.
-void SheetCellReader::StartRow()
-{
-    m_raw.offset = m_xml.TokenOffset();
-    const std::optional<std::string_view> number = m_xml.Attribute("r");
-    if (number) {
-        const std::optional<int> row = ParseUnsigned<int>(*number);
-        if (!row || *row < 1 || *row > 1048576)
-            Fail("the row number '" + std::string(*number) +
-                 "' is malformed or lies outside the sheet's grid (1048576 rows, 16384 columns)");
-        m_row = *row;
-    } else {
-        ++m_row;
-    }
-    if (m_row > m_context.limits.maxRows)
-        FailOutsideGrid(m_row, 1);
-    m_column = 0;
 }
 
 void SheetCellReader::ReadCell()
@@ -353,91 +427,8 @@ void SheetCellReader::ReadCell()
             m_xml.SkipElement(); // the formula itself, and extensions
         }
     }
-
-    m_cell = ImportedCell();
-    m_cell.style = m_raw.style;
-    Place(m_cell);
-    Interpret(m_cell);
-    // A blank cell counts only when it carries a style other than General's default.
-    if (m_cell.type != Variant::Empty || m_cell.style != 0)
-        m_stopped = !m_sink.AddCell(m_index, m_cell);
-}
-
-// A cell without a reference follows the one before in its row.
-void SheetCellReader::Place(ImportedCell& cell)
-{
-    if (m_raw.reference.empty()) {
-        cell.row = std::max(m_row, 1);
-        cell.column = m_column + 1;
-    } else {
-        const std::optional<CellPosition> position = ParseCellAddress(m_raw.reference);
-        if (!position)
-            Fail("the cell reference '" + m_raw.reference +
-                 "' is malformed or lies outside the sheet's grid (1048576 rows, 16384 columns)");
-        cell.row = position->row;
-        cell.column = position->column;
-    }
-    if (cell.row > m_context.limits.maxRows || cell.column > m_context.limits.maxColumns)
-        FailOutsideGrid(cell.row, cell.column);
-    m_row = cell.row;
-    m_column = cell.column;
-}
-
-void SheetCellReader::Interpret(ImportedCell& cell)
-{
-    const std::string& type = m_raw.type;
-    const std::string& value = m_raw.value;
-    if (type == "inlineStr") {
-        cell.type = Variant::Text;
-        cell.text = m_raw.hasInline ? m_raw.inlineText : value;
-    } else if (type == "str") {
-        cell.type = Variant::Text; // a formula's text result
-        cell.text = value;
-        cell.formulaWithoutResult = m_raw.hasFormula && value.empty();
-    } else if (TrimSpaces(value).empty()) {
-        // A cell without a value is blank; a formula without one was written by a tool that does
-        // not calculate (<f>...</f><v></v>) and reads as the empty text.
-        if (m_raw.hasFormula) {
-            cell.type = Variant::Text;
-            cell.formulaWithoutResult = true;
-        }
-    } else if (type == "n") {
-        const std::optional<double> number = ParseNumber(value);
-        if (!number)
-            Fail("the cell " + CellName(cell) + " holds '" + value.substr(0, 40) + "', which is not a number");
-        cell.type = Variant::Number;
-        cell.number = *number;
-        const std::vector<bool>& dates = m_context.styles.dateStyles;
-        if (m_context.date1904 && cell.style < dates.size() && dates[cell.style])
-            cell.number += k1904Offset;
-    } else if (type == "s") {
-        const std::optional<std::size_t> index = ParseUnsigned<std::size_t>(value);
-        if (!index || *index >= m_context.strings.Count())
-            Fail("the cell " + CellName(cell) + " refers to shared string '" + value.substr(0, 40) + "' of " +
-                 std::to_string(m_context.strings.Count()));
-        cell.type = Variant::Text;
-        cell.text = m_context.strings.At(*index);
-    } else if (type == "str") {
-        cell.type = Variant::Text;
-        cell.text = value;
-    } else if (type == "b") {
-        const std::string_view flag = TrimSpaces(value);
-        if (flag != "0" && flag != "1" && flag != "true" && flag != "false")
-            Fail("the cell " + CellName(cell) + " holds '" + value.substr(0, 40) + "', which is not a boolean");
-        cell.type = Variant::Boolean;
-        cell.number = flag == "1" || flag == "true" ? 1 : 0;
-    } else if (type == "e") {
-        cell.type = Variant::Error;
-        cell.text = TrimSpaces(value);
-    } else if (type == "d") {
-        const std::optional<double> serial = ParseIsoDate(value);
-        if (!serial)
-            Fail("the cell " + CellName(cell) + " holds '" + value.substr(0, 40) + "', which is not an ISO 8601 date");
-        cell.type = Variant::Number;
-        cell.number = *serial;
-    } else {
-        Fail("the cell " + CellName(cell) + " has the unknown type '" + type.substr(0, 40) + "'");
-    }
+    if (const ImportedCell* cell = m_builder.Build(m_raw))
+        m_stopped = !m_sink.AddCell(m_index, *cell);
 }
 
 } // namespace

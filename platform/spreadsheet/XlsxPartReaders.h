@@ -3,9 +3,11 @@
 // styles and the sheets. Each reads one part through an XmlScanner, so a sheet streams straight
 // into the sink and is never held whole. Content that cannot be read throws XmlScanner::Error
 // naming the part and the byte offset.
+#include "platform/spreadsheet/CellAddress.h"
 #include "platform/spreadsheet/WorkbookImport.h"
 #include "platform/spreadsheet/XmlScanner.h"
 
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -44,6 +46,44 @@ struct SheetContext {
     const CellStyles& styles;
     bool date1904 = false;
     const ImportLimits& limits;
+};
+
+// One <c> element as read, before it becomes an ImportedCell.
+struct RawCell {
+    std::string reference;
+    std::string type;
+    unsigned style = 0;
+    bool hasValue = false;
+    bool hasFormula = false;
+    std::string value; // <v>
+    bool hasInline = false;
+    std::string inlineText; // <is>
+    std::uint64_t offset = 0; // of the <c> tag in its part
+};
+
+// Turns a sheet's <row> and <c> elements, in file order, into cells, whichever parser reads the
+// XML. Content that cannot be read throws XmlScanner::Error naming the part and the byte offset.
+class CellBuilder {
+public:
+    CellBuilder(const SheetContext& context, std::string part);
+
+    // A <row> with its "r" attribute, if it has one, at `offset`.
+    void StartRow(std::optional<std::string_view> number, std::uint64_t offset);
+    // The cell, or null for a blank cell without a style of its own (it does not count).
+    const ImportedCell* Build(const RawCell& raw);
+
+private:
+    void Place(const RawCell& raw, ImportedCell& cell);
+    void Interpret(const RawCell& raw, ImportedCell& cell) const;
+    [[noreturn]] void Fail(const std::string& why, std::uint64_t offset) const;
+    [[noreturn]] void FailOutsideGrid(int row, int column, std::uint64_t offset) const;
+    static std::string CellName(const ImportedCell& cell) { return ColumnLetters(cell.column) + std::to_string(cell.row); }
+
+    const SheetContext& m_context;
+    std::string m_part;
+    int m_row = 0;    // of the last row or cell
+    int m_column = 0; // of the last cell in the row
+    ImportedCell m_cell;
 };
 
 // <worksheet>: every cell of <sheetData> goes to `sink` as a cell of sheet `index`; false when the
