@@ -41,6 +41,8 @@ public:
 
     // What the sheet displays for `cell`, for one read without its text.
     std::string DisplayedText(const RowCell& cell) const { return m_styles.Format(cell.style).Render(cell.value); }
+    // True when the cell's number format shows numbers as dates or times.
+    bool ShowsDateTime(const RowCell& cell) const { return m_styles.Format(cell.style).IsDateTime(); }
 
     // Why the last Open or ReadRows failed: names the file and the cause.
     const std::string& Error() const { return m_error; }
