@@ -294,7 +294,7 @@ void GuessDeleteValue(const std::vector<ColumnValues>& columns, ItemLayout& item
     std::map<std::string, size_t> markers, sentinels;
     for (const ColumnValues& column : columns) {
         // A text that stands in a column of numbers, as the only text there, marks missing values.
-        if (column.texts.size() == 1)
+        if (column.texts.size() == 1 && column.numbers > 0)
             markers[column.texts.begin()->first] += column.texts.begin()->second;
         for (const auto& [text, count] : column.sentinels)
             sentinels[text] += count;

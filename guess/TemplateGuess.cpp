@@ -73,6 +73,9 @@ std::optional<Refusal> Prove(const std::string& path, InputKind kind, const CSpe
         const converter::Format format = kind == InputKind::Excel ? converter::Format::Excel : converter::Format::Ascii;
         std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(format, &spec);
         converter::Status opened = reader->Open(path);
+        // Items that hold no numbers are left out of the selection, and so are not read.
+        if (opened && !spec.m_arrSelItems.empty())
+            reader->Select(std::vector<size_t>(spec.m_arrSelItems.begin(), spec.m_arrSelItems.end()));
         converter::Row row;
         for (size_t i = 0; opened && i < rows && reader->Next(row); ++i) {
         }

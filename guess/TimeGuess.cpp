@@ -106,7 +106,7 @@ std::string FlawReason(StampFlaw flaw, const std::string& text)
     case StampFlaw::NoSeparators:
         return "the date/time " + Quote(text) + " has no separators between its numbers, which no template format reads";
     case StampFlaw::AmPm:
-        return "the time " + Quote(text) + " counts hours with AM/PM, which no template format reads";
+        return "the date/time " + Quote(text) + " counts hours with AM/PM, which no template format reads";
     default: return {};
     }
 }
@@ -138,7 +138,17 @@ Refusal NoStampColumn(const Sample& sample, const std::vector<size_t>& rows)
     Refusal refusal;
     if (FindFlaw(sample, all, columns, refusal))
         return refusal;
-    const SampleRow& row = sample.rows[rows.empty() ? sample.rows.size() - 1 : rows[rows.size() / 2]];
+    // The first row that looks like data: every cell a number, a date, a time or blank.
+    const SampleRow* typical = &sample.rows[rows.empty() ? sample.rows.size() - 1 : rows[rows.size() / 2]];
+    for (size_t index : rows) {
+        const SampleRow& candidate = sample.rows[index];
+        if (std::all_of(candidate.cells.begin(), candidate.cells.end(),
+                        [](const SampleCell& cell) { return cell.numberCell || LooksTyped(cell.text); })) {
+            typical = &candidate;
+            break;
+        }
+    }
+    const SampleRow& row = *typical;
     const std::string what = sample.excel ? "no column of the sheet holds dates or times that a template reads; row "
                                           : "no field of the data lines holds dates or times that a template reads: ";
     refusal.line = row.number;
@@ -236,10 +246,22 @@ std::string DefaultFormat(int option)
     return option == 1 ? "HH:mm:ss" : option == 2 ? "YYYY/MM/DD" : "YYYY/MM/DD HH:mm:ss";
 }
 
+// An empty date/time text reads (every field keeps its starting value), but it is no data row's.
+bool HasStampText(const SampleRow& row, const TimeLayout& layout)
+{
+    for (int w = 0; w < layout.width; ++w) {
+        const SampleCell* cell = CellAt(row, static_cast<size_t>(layout.column - 1 + w));
+        if (!cell || (!cell->numberCell && ShapeOf(cell->text).kind == StampKind::None))
+            return false;
+    }
+    return true;
+}
+
 bool IsData(const Sample& sample, const SampleRow& row, const TimeLayout& layout, const TimeContext& context)
 {
     Stamp stamp = 0;
-    return (sample.excel || row.cells.size() == context.fieldCount) && RowStamp(row, layout, context, sample.excel, stamp);
+    return (sample.excel || row.cells.size() == context.fieldCount) && HasStampText(row, layout) &&
+           RowStamp(row, layout, context, sample.excel, stamp);
 }
 
 // The data rows of the layout: from the first row that reads and is followed by rows that read.
@@ -401,7 +423,7 @@ std::optional<TimeLayout> GuessTime(const Sample& sample, const TimeContext& con
     for (size_t w = 0; w < placement->kinds.size(); ++w)
         spanned.push_back(placement->column + w);
     const std::vector<size_t> laterRows(rows.begin() + static_cast<std::ptrdiff_t>(rows.size() / 2), rows.end());
-    if (FindFlaw(sample, laterRows, spanned, refusal))
+    if (FindFlaw(sample, rows, spanned, refusal))
         return std::nullopt;
 
     TimeLayout layout;
@@ -495,10 +517,12 @@ std::optional<TimeLayout> GuessTime(const Sample& sample, const TimeContext& con
     std::string example;
     for (size_t w = 0; w < spanned.size(); ++w)
         example += (w ? " + " : "") + Quote(Trimmed(startRow.cells[spanned[w]].text));
-    findings.push_back({layout.option == 0 ? "DateTimeOption" : "DateTimeOption", OptionText(layout.option),
-                        (layout.width == 2 ? "the date and the time stand in two columns, " : "") +
-                            ColumnName(sample.excel, placement->column) + (layout.width == 2 ? " and the next" : "") +
-                            " of the data rows hold " + KindText(kind) + ", such as " + example,
+    findings.push_back({"DateTimeOption", OptionText(layout.option),
+                        layout.width == 2 ? "the date and the time stand in two columns: " +
+                                                ColumnName(sample.excel, placement->column) + " and the next hold " +
+                                                example
+                                          : ColumnName(sample.excel, placement->column) + " of the data rows holds " +
+                                                KindText(kind) + ", such as " + example,
                         ""});
     const char* columnKey = layout.option == 1 ? "TimeCol" : layout.option == 2 ? "DateCol" : "DateTimeCol";
     findings.push_back({columnKey, std::to_string(layout.column),
