@@ -9,6 +9,8 @@
 
 #include <benchmark/benchmark.h>
 
+#include <algorithm>
+#include <charconv>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
@@ -72,11 +74,11 @@ double PeakMegabytes()
     return static_cast<double>(usage.ru_maxrss) / 1024.0;
 }
 
-void Run(benchmark::State& state, converter::Format in, const std::string& input, converter::Format out, size_t rows)
+void Run(benchmark::State& state, sys::FileFormat in, const std::string& input, sys::FileFormat out, size_t rows)
 {
-    const std::string output = (Folder() / (std::string("out") + converter::OutputExtension(out))).string();
+    const std::string output = (Folder() / (std::string("out") + sys::FormatInfo(out).outputExtension)).string();
     std::unique_ptr<CSpecification> spec;
-    converter::Status status;
+    sys::Status status;
     spec = converter::LoadTemplate(in, "", status);
     const double inputBytes = static_cast<double>(fs::file_size(input));
     for (auto _ : state) {
@@ -92,23 +94,23 @@ void Run(benchmark::State& state, converter::Format in, const std::string& input
 
 void TextToRbx0(benchmark::State& state)
 {
-    Run(state, converter::Format::Ascii, MakeText(Rows()), converter::Format::Rbx0, Rows());
+    Run(state, sys::FileFormat::Ascii, MakeText(Rows()), sys::FileFormat::Rbx0, Rows());
 }
 
 void Rbx0ToText(benchmark::State& state)
 {
     const std::string text = MakeText(Rows());
     const std::string rbx0 = (Folder() / "in.rbx0").string();
-    converter::Status status;
-    auto spec = converter::LoadTemplate(converter::Format::Ascii, "", status);
-    converter::ConvertFile({converter::Format::Ascii, text, spec.get(), {}, converter::Format::Rbx0, rbx0, ""});
-    Run(state, converter::Format::Rbx0, rbx0, converter::Format::Ascii, Rows());
+    sys::Status status;
+    auto spec = converter::LoadTemplate(sys::FileFormat::Ascii, "", status);
+    converter::ConvertFile({sys::FileFormat::Ascii, text, spec.get(), {}, sys::FileFormat::Rbx0, rbx0, ""});
+    Run(state, sys::FileFormat::Rbx0, rbx0, sys::FileFormat::Ascii, Rows());
 }
 
 void TextToXlsx(benchmark::State& state)
 {
     const size_t rows = std::max<size_t>(1, Rows() / 10);
-    Run(state, converter::Format::Ascii, MakeText(rows), converter::Format::Excel, rows);
+    Run(state, sys::FileFormat::Ascii, MakeText(rows), sys::FileFormat::Excel, rows);
 }
 
 // Reading the benchmark's values ("%.4f" of 0 to 1000), ten fields a line: each plain field reader
@@ -169,7 +171,62 @@ void DigitLoop(benchmark::State& state)
     state.counters["values/s"] = benchmark::Counter(static_cast<double>(lines.spans.size()), benchmark::Counter::kIsIterationInvariantRate);
 }
 
+// Values that are not plain decimals, the general reading's work: 4 decimals after a comma
+// (range 0: "123,4567"), 8 decimals after a comma (1), scientific form with a point (2). A fourth of
+// them negative.
+std::vector<std::string> GeneralNumbers(int kind)
+{
+    std::mt19937_64 random(1);
+    std::vector<std::string> fields;
+    for (int i = 0; i < 4096; ++i) {
+        std::string field;
+        if (kind == 0)
+            field = std::to_string(random() % 1000) + "," + std::to_string(10000 + random() % 90000).substr(1);
+        else if (kind == 1)
+            field = std::to_string(random() % 100000) + "," + std::to_string(1000000000 + random() % 900000000).substr(1);
+        else
+            field = std::to_string(random() % 10) + "." + std::to_string(10000 + random() % 90000).substr(1) + "e" +
+                    std::to_string(random() % 30);
+        fields.push_back(random() % 4 == 0 ? "-" + field : field);
+    }
+    return fields;
+}
+
+// The reader as conversions use it (NumberReader with the template's separator).
+void GeneralNumberReading(benchmark::State& state)
+{
+    const int kind = static_cast<int>(state.range(0));
+    const std::vector<std::string> fields = GeneralNumbers(kind);
+    const converter::NumberReader reader(kind == 2 ? "." : ",");
+    for (auto _ : state)
+        for (const std::string& field : fields) {
+            double value = 0;
+            if (reader.Read(field, value) != converter::ValueText::Number)
+                state.SkipWithError("a value did not read");
+            benchmark::DoNotOptimize(value);
+        }
+    state.counters["values/s"] = benchmark::Counter(static_cast<double>(fields.size()), benchmark::Counter::kIsIterationInvariantRate);
+}
+
+// The same texts, the separator written as a point, read by std::from_chars as the reader did before
+// it took fast_float.
+void GeneralNumberFromChars(benchmark::State& state)
+{
+    std::vector<std::string> fields = GeneralNumbers(static_cast<int>(state.range(0)));
+    for (std::string& field : fields)
+        std::replace(field.begin(), field.end(), ',', '.');
+    for (auto _ : state)
+        for (const std::string& field : fields) {
+            double value = 0;
+            std::from_chars(field.data(), field.data() + field.size(), value);
+            benchmark::DoNotOptimize(value);
+        }
+    state.counters["values/s"] = benchmark::Counter(static_cast<double>(fields.size()), benchmark::Counter::kIsIterationInvariantRate);
+}
+
 BENCHMARK(PlainFields)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond);
+BENCHMARK(GeneralNumberReading)->DenseRange(0, 2);
+BENCHMARK(GeneralNumberFromChars)->DenseRange(0, 2);
 BENCHMARK(DigitLoop)->Unit(benchmark::kMillisecond);
 BENCHMARK(TextToRbx0)->Unit(benchmark::kMillisecond)->Iterations(3)->UseRealTime();
 BENCHMARK(Rbx0ToText)->Unit(benchmark::kMillisecond)->Iterations(3)->UseRealTime();

@@ -126,10 +126,10 @@ void BM_ExcelPreviewTall(benchmark::State& state)
 void BM_ExcelSeriesHeaderWide(benchmark::State& state)
 {
     const std::string path = WriteEngineLayout("wide", 1, static_cast<int>(state.range(0)));
-    converter::Status status;
-    std::unique_ptr<CSpecification> spec = converter::LoadTemplate(converter::Format::Excel, "", status);
+    sys::Status status;
+    std::unique_ptr<CSpecification> spec = converter::LoadTemplate(sys::FileFormat::Excel, "", status);
     for (auto _ : state) {
-        std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(converter::Format::Excel, spec.get());
+        std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(sys::FileFormat::Excel, spec.get());
         if (!reader->Open(path) || reader->Header().items.size() != static_cast<size_t>(state.range(0)))
             state.SkipWithError("open failed");
     }

@@ -64,7 +64,7 @@ void BM_ReadSteps(benchmark::State& state)
     for (auto _ : state) {
         rbx::CRbxReader reader;
         if (!reader.Open(path, verify)) {
-            state.SkipWithError(reader.Error().c_str());
+            state.SkipWithError(reader.status().problem().Describe().c_str());
             break;
         }
         std::size_t got = 0;

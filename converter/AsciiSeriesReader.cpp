@@ -43,14 +43,13 @@ struct AsciiSeriesReader::HeaderLines {
 };
 
 AsciiSeriesReader::AsciiSeriesReader(const CSpecification& spec)
-    : m_spec(spec), m_splitter(spec), m_numbers(spec.GetDecimalSeparatorString()), m_delimiter(spec.GetDelimiterString()),
-      m_fusable(m_delimiter.size() == 1 && spec.m_bIgnoreConsecutiveDelimiters == 0 &&
-                spec.m_bIgnoreBegginingOfLineDelimiters == 0),
+    : m_spec(spec), m_splitter(spec.GetDialect()), m_dialect(m_splitter.dialect()), m_numbers(m_dialect.decimalSeparator),
+      m_fusable(m_dialect.IsPlain()),
       m_pointDecimals(m_numbers.ReadsPlainDecimals())
 {
 }
 
-Status AsciiSeriesReader::Open(const std::string& path)
+sys::Status AsciiSeriesReader::Open(const std::string& path)
 {
     m_path = path;
     m_header = SeriesHeader();
@@ -58,13 +57,13 @@ Status AsciiSeriesReader::Open(const std::string& path)
     m_stampColumn = m_spec.GetDateTimeColumn();
     const CDataDescription& data = m_spec.m_DataDesc;
     if (data.m_nStartRow < 1)
-        return m_status = Status::Fail(path, 0, "the data start row of the template must be 1 or more");
+        return m_status = sys::Status::Fail(path, 0, "the data start row of the template must be 1 or more");
     if (m_stampColumn < 1)
-        return m_status = Status::Fail(path, 0, "the template's date/time option must be 0, 1 or 2");
+        return m_status = sys::Status::Fail(path, 0, "the template's date/time option must be 0, 1 or 2");
 
     m_deleteInUse = data.m_nDeleteValueCheck != 0;
     HeaderLines lines;
-    Status status = ReadHeaderLines(lines);
+    sys::Status status = ReadHeaderLines(lines);
     if (status)
         status = CountItems(lines);
     if (status)
@@ -82,7 +81,7 @@ Status AsciiSeriesReader::Open(const std::string& path)
     Select(all);
 
     // The data pass: a second reading from the start, passing over the header lines.
-    if (Status opened = m_lines.Open(path); !opened)
+    if (sys::Status opened = m_lines.Open(path); !opened)
         return m_status = opened;
     std::string_view skipped;
     for (long row = 1; row < data.m_nStartRow; ++row)
@@ -91,7 +90,7 @@ Status AsciiSeriesReader::Open(const std::string& path)
     return m_status = m_lines.status();
 }
 
-Status AsciiSeriesReader::ReadHeaderLines(HeaderLines& lines)
+sys::Status AsciiSeriesReader::ReadHeaderLines(HeaderLines& lines)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     std::vector<long> rows{data.m_nStartRow};
@@ -107,8 +106,8 @@ Status AsciiSeriesReader::ReadHeaderLines(HeaderLines& lines)
         rows.push_back(data.m_nDeleteValueRow);
     const long last = *std::max_element(rows.begin(), rows.end());
 
-    LineSource source;
-    if (Status opened = source.Open(m_path); !opened)
+    sys::TextLineReader source;
+    if (sys::Status opened = source.Open(m_path); !opened)
         return opened;
     std::string_view line;
     while (source.LineNumber() < last && source.Next(line))
@@ -121,41 +120,41 @@ Status AsciiSeriesReader::ReadHeaderLines(HeaderLines& lines)
     if (m_deleteInUse)
         m_deleteValue = data.m_nDeleteValueRadio == 1 ? lines.Line(data.m_nDeleteValueRow) : data.m_strDeleteValue;
     if (lines.fileLines < data.m_nStartRow)
-        return Status::Fail(m_path, data.m_nStartRow,
+        return sys::Status::Fail(m_path, data.m_nStartRow,
                             "the file has " + std::to_string(lines.fileLines) +
                                 " lines; the template's data start row is past its end");
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 // The item count from the data start line, and the item name line's agreement with it.
-Status AsciiSeriesReader::CountItems(const HeaderLines& lines)
+sys::Status AsciiSeriesReader::CountItems(const HeaderLines& lines)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     const std::string startLine = lines.Line(data.m_nStartRow);
     m_splitter.Split(startLine);
     const auto& calls = m_splitter.Calls();
     if (calls.front().end == -1 || calls.front().text.size() == startLine.size())
-        return Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_START_ROW_NO_DELIMITER));
+        return sys::Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_START_ROW_NO_DELIMITER));
     const long count = static_cast<long>(calls.size()) - 1 - m_formatColumns;
     if (count < 1)
-        return Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_ITEM_COUNT_WRONG));
+        return sys::Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_ITEM_COUNT_WRONG));
     m_itemCount = static_cast<size_t>(count);
     m_columns = static_cast<int>(calls.size()) - m_formatColumns;
 
     if (data.m_nItemTitleOption != 0)
-        return Status::Ok();
+        return sys::Status::Ok();
     const std::string nameLine = data.m_nItemDescriptionRow < 1 ? std::string() : lines.Line(data.m_nItemDescriptionRow);
     if (nameLine.empty())
-        return Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_ITEM_NAME_LINE_EMPTY));
+        return sys::Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_ITEM_NAME_LINE_EMPTY));
     m_splitter.Split(nameLine);
     if (m_splitter.Calls().front().text.size() == nameLine.size())
-        return Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_ITEM_NAME_LINE_NO_DELIMITER));
+        return sys::Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_ITEM_NAME_LINE_NO_DELIMITER));
     if (count > static_cast<long>(m_splitter.Calls().size()) - 1 - m_formatColumns)
-        return Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
-    return Status::Ok();
+        return sys::Status::Fail(m_path, data.m_nItemDescriptionRow, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
+    return sys::Status::Ok();
 }
 
-Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
+sys::Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     if (data.m_nItemTitleOption == 1) {
@@ -165,10 +164,10 @@ Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
                                                                  : data.m_vecItemDefs[i].m_strTitle;
             m_header.items.push_back(item);
         }
-        return Status::Ok();
+        return sys::Status::Ok();
     }
     if (data.m_nItemTitleOption != 0)
-        return Status::Fail(m_path, 0, "the template's item title option must be 0 or 1");
+        return sys::Status::Fail(m_path, 0, "the template's item title option must be 0 or 1");
 
     // Walks the name line column by column, the date/time titles taking W fields at column K.
     const long row = data.m_nItemDescriptionRow;
@@ -184,11 +183,11 @@ Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
     for (int j = 1; j <= m_columns; ++j) {
         if (j != m_stampColumn) {
             if (pos == -1 || pos >= length || next >= calls.size())
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
             const auto& call = calls[next++];
             pos = call.end;
             if (pos == -1)
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_NAME_COLUMNS_MISMATCH));
             names.push_back(named(call.text));
             continue;
         }
@@ -201,13 +200,13 @@ Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
         size_t c = restart;
         for (int k = 1; k < m_stampColumn; ++k) {
             if (p == -1)
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_DATETIME_UNPARSABLE));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_DATETIME_UNPARSABLE));
             p = calls[c++].end;
         }
         const size_t titleCall = c;
         for (int w = 0; w < m_formatColumns; ++w) {
             if (p >= length)
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_ITEM_COUNT_WRONG));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_ITEM_COUNT_WRONG));
             if (p != -1)
                 p = calls[c++].end;
         }
@@ -223,19 +222,19 @@ Status AsciiSeriesReader::ReadNames(const HeaderLines& lines)
         item.name = i < names.size() ? names[i] : std::string();
         m_header.items.push_back(item);
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
+sys::Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     auto& items = m_header.items;
 
     // Item types and units: `count` fields from the start of their row, no date/time passed over.
-    auto fromRow = [&](long row, int stringId, const char* what, auto cut, auto assign) -> Status {
+    auto fromRow = [&](long row, int stringId, const char* what, auto cut, auto assign) -> sys::Status {
         const std::string line = lines.Line(row);
         if (line.empty())
-            return Status::Fail(m_path, row, res::LoadString(stringId));
+            return sys::Status::Fail(m_path, row, res::LoadString(stringId));
         m_splitter.Split(line);
         size_t taken = 0;
         std::string dropped;
@@ -250,12 +249,12 @@ Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
             assign(items[taken++], std::move(value));
         }
         if (taken < m_itemCount)
-            return Status::Fail(m_path, row,
+            return sys::Status::Fail(m_path, row,
                                 std::string("the ") + what + " row gives " + std::to_string(taken) + " of the " +
                                     std::to_string(m_itemCount) + " items" +
                                     (dropped.empty() ? std::string()
                                                      : "; the item type " + Quote(dropped) + " is not in the unit catalogue"));
-        return Status::Ok();
+        return sys::Status::Ok();
     };
     auto defs = [&](auto assign, auto member) {
         for (size_t i = 0; i < items.size(); ++i)
@@ -268,25 +267,25 @@ Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
     switch (data.m_nUnitTypeOption) {
     case 0: for (auto& item : items) item.type = data.m_strGlobalUnitType; break;
     case 1:
-        if (Status s = fromRow(data.m_nUnitTypeRow, res::IDS_ITEM_TYPE_LINE_EMPTY, "item type", TextBeforeBracket, setType); !s)
+        if (sys::Status s = fromRow(data.m_nUnitTypeRow, res::IDS_ITEM_TYPE_LINE_EMPTY, "item type", TextBeforeBracket, setType); !s)
             return s;
         break;
     case 2: defs(setType, &CItemDefinition::m_strType); break;
-    default: return Status::Fail(m_path, 0, "the template's item type option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's item type option must be 0, 1 or 2");
     }
     switch (data.m_nUnitOption) {
     case 0: for (auto& item : items) item.unit = data.m_strGlobalUnit; break;
     case 1:
-        if (Status s = fromRow(data.m_nUnitRow, res::IDS_UNIT_LINE_EMPTY, "unit", TextInBrackets, setUnit); !s)
+        if (sys::Status s = fromRow(data.m_nUnitRow, res::IDS_UNIT_LINE_EMPTY, "unit", TextInBrackets, setUnit); !s)
             return s;
         break;
     case 2: defs(setUnit, &CItemDefinition::m_strUnit); break;
-    default: return Status::Fail(m_path, 0, "the template's unit option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's unit option must be 0, 1 or 2");
     }
     switch (data.m_nValueTypeOption) {
     case 0:
         if (!IsValueTypeName(data.m_strGlobalValueType))
-            return Status::Fail(m_path, 0, res::LoadString(res::IDS_VALUE_TYPE_INVALID));
+            return sys::Status::Fail(m_path, 0, res::LoadString(res::IDS_VALUE_TYPE_INVALID));
         for (auto& item : items)
             item.valueType = data.m_strGlobalValueType;
         break;
@@ -294,61 +293,61 @@ Status AsciiSeriesReader::ReadTypesUnitsValueTypes(const HeaderLines& lines)
         const long row = data.m_nValueTypeRow;
         const std::string line = lines.Line(row);
         if (line.empty())
-            return Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_LINE_EMPTY));
+            return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_LINE_EMPTY));
         m_splitter.Split(line);
         const auto& calls = m_splitter.Calls();
         int pos = 0;
         for (size_t i = 0; i < m_itemCount; ++i) {
             if (pos == -1)
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_LINE_SHORT));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_LINE_SHORT));
             pos = calls[i].end;
             std::string name = TextAfterColon(std::string(calls[i].text));
             if (pos != -1 && !IsValueTypeName(name))
-                return Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_INVALID) + " " + Quote(name));
+                return sys::Status::Fail(m_path, row, res::LoadString(res::IDS_VALUE_TYPE_INVALID) + " " + Quote(name));
             items[i].valueType = name;
         }
         break;
     }
     case 2: defs(setValueType, &CItemDefinition::m_strValueType); break;
-    default: return Status::Fail(m_path, 0, "the template's value type option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's value type option must be 0, 1 or 2");
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status AsciiSeriesReader::PrepareStamps()
+sys::Status AsciiSeriesReader::PrepareStamps()
 {
     const CTimeDescription& time = m_spec.m_TimeDesc;
     // Fields joined for reading are separated by blanks; the delimiter also separates the format.
-    const std::string extra = m_formatColumns > 1 ? m_delimiter : std::string();
-    m_start = StampFields();
+    const std::string extra = m_formatColumns > 1 ? m_dialect.delimiter : std::string();
+    m_start = sys::DateTimeFields();
     switch (time.m_nDateTimeOption) {
     case 0:
-        m_format = std::make_unique<DateFormat>(time.m_strDateTimeFormat, DateFormat::Reads::DateTime, extra);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strDateTimeFormat, sys::DateFormat::Reads::DateTime, extra);
         break;
     case 1: {
-        StampFields date;
+        sys::DateTimeFields date;
         date.year = 100;
-        if (!DateFormat("YYYY-MM-DD", DateFormat::Reads::Date).Read(time.m_strGlobalDate, date))
-            return Status::Fail(m_path, 0, "the template's global date " + Quote(time.m_strGlobalDate) +
+        if (!sys::DateFormat("YYYY-MM-DD", sys::DateFormat::Reads::Date).Read(time.m_strGlobalDate, date))
+            return sys::Status::Fail(m_path, 0, "the template's global date " + Quote(time.m_strGlobalDate) +
                                                " is not a date of the form YYYY-MM-DD");
         m_start.year = date.year, m_start.month = date.month, m_start.day = date.day;
-        m_format = std::make_unique<DateFormat>(time.m_strTimeFormat, DateFormat::Reads::Time, extra);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strTimeFormat, sys::DateFormat::Reads::Time, extra);
         break;
     }
     case 2: {
-        StampFields clock;
-        if (!DateFormat("HH:mm:ss", DateFormat::Reads::Time).Read(time.m_strGlobalTime, clock))
-            return Status::Fail(m_path, 0, "the template's global time " + Quote(time.m_strGlobalTime) +
+        sys::DateTimeFields clock;
+        if (!sys::DateFormat("HH:mm:ss", sys::DateFormat::Reads::Time).Read(time.m_strGlobalTime, clock))
+            return sys::Status::Fail(m_path, 0, "the template's global time " + Quote(time.m_strGlobalTime) +
                                                " is not a time of the form HH:mm:ss");
         m_start.year = 100;
         m_start.hour = clock.hour, m_start.minute = clock.minute, m_start.second = clock.second;
-        m_format = std::make_unique<DateFormat>(time.m_strDateFormat, DateFormat::Reads::Date, extra);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strDateFormat, sys::DateFormat::Reads::Date, extra);
         break;
     }
-    default: return Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
     }
     m_stamps = std::make_unique<StampReader>(*m_format, m_start);
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 void AsciiSeriesReader::Select(const std::vector<size_t>& items)
@@ -410,7 +409,7 @@ bool AsciiSeriesReader::ReadStamp(size_t firstCall, Stamp& stamp)
         text = m_stampBuffer;
     }
     const long line = m_lines.LineNumber();
-    StampFields fields = m_start;
+    sys::DateTimeFields fields = m_start;
     if (!m_format->Read(text, fields))
         return Fail(m_path, line, res::LoadString(res::IDS_DATETIME_UNPARSABLE) + " " + Quote(text));
     std::optional<Stamp> value = StampFromFields(fields);
@@ -419,130 +418,6 @@ bool AsciiSeriesReader::ReadStamp(size_t firstCall, Stamp& stamp)
     stamp = *value;
     return true;
 }
-
-namespace {
-
-// The fields of a line the splitter would give with a one-character delimiter and both delimiter
-// flags off, one at a time: the text up to the next delimiter and the position after it; a
-// delimiter at the line's end adds an empty field, and the last field ends at -1.
-class FieldCursor {
-public:
-    FieldCursor(std::string_view line, char delimiter) : m_line(line), m_delimiter(delimiter) {}
-
-    // False when the field starts with a quote or the line holds no delimiter: the splitter's case.
-    bool Next(std::string_view& text, int& end)
-    {
-        const size_t length = m_line.size();
-        if (m_trailing) {
-            m_trailing = false;
-            text = {};
-            end = -1;
-            return true;
-        }
-        if (m_at == length) {
-            text = {};
-            m_trailing = length > 0 && m_line[length - 1] == m_delimiter;
-            end = m_trailing ? static_cast<int>(length) + 1 : -1;
-            return true;
-        }
-        if (m_line[m_at] == '"')
-            return false;
-        const size_t found = FindDelimiter(m_line, m_at, m_delimiter);
-        if (m_at == 0 && found == length)
-            return false;
-        text = m_line.substr(m_at, found - m_at);
-        m_at = found < length ? found + 1 : length;
-        end = static_cast<int>(m_at);
-        return true;
-    }
-
-    // Next, with a field that is a plain decimal read on the way (`read` then true and `value` set).
-    bool NextReading(std::string_view& text, int& end, double& value, bool& read)
-    {
-        read = false;
-        const size_t length = m_line.size();
-        if (!m_trailing && m_at < length) {
-            const char* const start = m_line.data() + m_at;
-            const char* const lineEnd = m_line.data() + length;
-            const char* const stop = ScanPlainDecimal(start, lineEnd, value);
-            if (stop != nullptr && (stop == lineEnd ? m_at != 0 : *stop == m_delimiter)) {
-                const size_t found = static_cast<size_t>(stop - m_line.data());
-                text = m_line.substr(m_at, found - m_at);
-                m_at = found < length ? found + 1 : length;
-                end = static_cast<int>(m_at);
-                read = true;
-                return true;
-            }
-        }
-        return Next(text, end);
-    }
-
-private:
-    std::string_view m_line;
-    char m_delimiter;
-    size_t m_at = 0;
-    bool m_trailing = false;
-};
-
-} // namespace
-
-namespace {
-
-// The positions of a line's delimiters in order, found sixty-four bytes at a time. Reads up to 64
-// bytes past the line's end.
-class DelimiterWalk {
-public:
-    DelimiterWalk(std::string_view line, char delimiter) : m_text(line.data()), m_length(line.size()), m_delimiter(delimiter)
-    {
-        Load(0);
-    }
-
-    // The next delimiter's position, or the line's length when none is left.
-    size_t Next()
-    {
-        while (m_bits == 0) {
-            if (m_block + kBlock >= m_length)
-                return m_length;
-            Load(m_block + kBlock);
-        }
-        const size_t at = m_block + static_cast<size_t>(__builtin_ctzll(m_bits));
-        m_bits &= m_bits - 1;
-        return at;
-    }
-
-private:
-    static constexpr size_t kBlock = 64;
-
-    void Load(size_t block)
-    {
-        m_block = block;
-        const char* const bytes = m_text + block;
-        std::uint64_t bits = 0;
-#if defined(__SSE2__)
-        const __m128i delimiter = _mm_set1_epi8(m_delimiter);
-        for (size_t k = 0; k < kBlock; k += 16) {
-            const __m128i chunk = _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes + k));
-            bits |= static_cast<std::uint64_t>(static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi8(chunk, delimiter))))
-                    << k;
-        }
-#else
-        for (size_t k = 0; k < kBlock; ++k)
-            bits |= static_cast<std::uint64_t>(bytes[k] == m_delimiter) << k;
-#endif
-        const size_t left = m_length - block;
-        if (left < kBlock)
-            bits &= (std::uint64_t{1} << left) - 1;
-        m_bits = bits;
-    }
-
-    const char* m_text;
-    size_t m_length;
-    char m_delimiter;
-    size_t m_block = 0;
-    std::uint64_t m_bits = 0;
-};
-
-} // namespace
 
 bool AsciiSeriesReader::ReadFieldValue(const char* field, size_t size, double& value) const
 {
@@ -562,7 +437,7 @@ bool AsciiSeriesReader::ReadFieldValue(const char* field, size_t size, double& v
 
 bool AsciiSeriesReader::ReadDataLineByBlocks(std::string_view line, Row& row)
 {
-    DelimiterWalk delimiters(line, m_delimiter[0]);
+    delimited::DelimiterWalk delimiters(line, m_dialect.delimiter[0]);
     const size_t length = line.size();
     const size_t stampEnd = delimiters.Next();
     // No delimiter, a line ending just after the date/time, or a quote: the general walk's to judge.
@@ -615,10 +490,31 @@ bool AsciiSeriesReader::ReadDataLineByBlocks(std::string_view line, Row& row)
     return true;
 }
 
-// The same walk as ReadDataLine, with the fields taken as it goes instead of from a split line.
+namespace {
+
+// The next field of a plain line, with a field that is a plain decimal read on the way (`read` then
+// true and `value` set). False when the field is the rule's to take.
+bool NextReading(delimited::PlainFields& fields, std::string_view line, std::string_view& text, int& end,
+                 double& value, bool& read)
+{
+    read = false;
+    if (const size_t at = fields.Position(); at < line.size()) {
+        const char* const stop = ScanPlainDecimal(line.data() + at, line.data() + line.size(), value);
+        if (stop != nullptr && fields.TakeEndingAt(static_cast<size_t>(stop - line.data()), text, end)) {
+            read = true;
+            return true;
+        }
+    }
+    return fields.Next(text, end);
+}
+
+} // namespace
+
+// The same walk as ReadDataLine, with the fields taken as it goes instead of from a split line. A
+// first field that is the whole line (no delimiter in it) is ReadDataLine's to report.
 bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
 {
-    FieldCursor fields(line, m_delimiter[0]);
+    delimited::PlainFields fields(line, m_dialect.delimiter[0]);
     const bool readsPlain = m_numbers.ReadsPlainDecimals();
     const int length = static_cast<int>(line.size());
     row.values.assign(m_selection.size(), kMissing);
@@ -631,7 +527,7 @@ bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
         if (j + 1 == m_stampColumn) {
             std::string_view stampText;
             for (int w = 0; w < m_formatColumns; ++w) {
-                if (pos == -1 || !fields.Next(text, pos))
+                if (pos == -1 || !fields.Next(text, pos) || text.size() == line.size())
                     return false;
                 if (w == 0) {
                     stampText = text;
@@ -656,9 +552,9 @@ bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
             const int slot = item < m_slotOfItem.size() ? m_slotOfItem[item] : -1;
             double value = kMissing;
             bool scanned = false;
-            const bool taken =
-                slot >= 0 && readsPlain ? fields.NextReading(text, pos, value, scanned) : fields.Next(text, pos);
-            if (!taken)
+            const bool taken = slot >= 0 && readsPlain ? NextReading(fields, line, text, pos, value, scanned)
+                                                       : fields.Next(text, pos);
+            if (!taken || text.size() == line.size())
                 return false;
             if (pos != -1) {
                 ++item;
@@ -681,9 +577,7 @@ bool AsciiSeriesReader::ReadDataLineFused(std::string_view line, Row& row)
 bool AsciiSeriesReader::ReadDataLine(std::string_view line, Row& row)
 {
     const long lineNumber = m_lines.LineNumber();
-    const bool hasDelimiter = m_delimiter.size() == 1 ? line.find(m_delimiter[0]) != std::string_view::npos
-                                                       : line.find(m_delimiter) != std::string_view::npos;
-    if (!hasDelimiter)
+    if (!delimited::Delimiter(m_dialect.delimiter).FoundIn(line))
         return Fail(m_path, lineNumber, res::LoadString(res::IDS_NO_DELIMITERS));
     m_splitter.Split(line);
     if (m_splitter.QuoteError())
@@ -714,7 +608,7 @@ bool AsciiSeriesReader::ReadDataLine(std::string_view line, Row& row)
                 ++j;
             }
         } else {
-            const FieldSplitter::Call& call = calls[next++];
+            const delimited::FieldSplitter::Call& call = calls[next++];
             pos = call.end;
             if (pos != -1) {
                 const int slot = item < m_slotOfItem.size() ? m_slotOfItem[item] : -1;

@@ -1,13 +1,14 @@
 #pragma once
 // Reads a delimited text file through an ASCII template, over the whole file: the header rows give
-// the items, every data line one row. The lines are split, the header rows read and the data lines
-// checked exactly as the preview parser does it; in addition the date/time texts are read with the
-// template's formats and the values as numbers with its decimal separator.
-#include "converter/FieldSplitter.h"
-#include "converter/LineSource.h"
+// the items, every data line one row. The lines are split by the one field rule of delimited text
+// (delimited/FieldSplitter.h), the header rows read and the data lines checked exactly as the preview
+// parser does it; in addition the date/time texts are read with the template's formats and the
+// values as numbers with its decimal separator.
+#include "platform/system/TextLineReader.h"
 #include "converter/NumberText.h"
 #include "converter/SeriesReader.h"
 #include "converter/StampText.h"
+#include "delimited/FieldSplitter.h"
 
 #include <memory>
 #include <optional>
@@ -21,7 +22,7 @@ public:
     // The template must outlive the reader.
     explicit AsciiSeriesReader(const CSpecification& spec);
 
-    Status Open(const std::string& path) override;
+    sys::Status Open(const std::string& path) override;
     bool Next(Row& row) override;
     void Select(const std::vector<size_t>& items) override;
     std::uint64_t BytesConsumed() const override { return m_lines.BytesConsumed(); }
@@ -36,11 +37,11 @@ public:
 
 private:
     struct HeaderLines; // the lines the header rows name, read before the data
-    Status ReadHeaderLines(HeaderLines& lines);
-    Status CountItems(const HeaderLines& lines);
-    Status ReadNames(const HeaderLines& lines);
-    Status ReadTypesUnitsValueTypes(const HeaderLines& lines);
-    Status PrepareStamps();
+    sys::Status ReadHeaderLines(HeaderLines& lines);
+    sys::Status CountItems(const HeaderLines& lines);
+    sys::Status ReadNames(const HeaderLines& lines);
+    sys::Status ReadTypesUnitsValueTypes(const HeaderLines& lines);
+    sys::Status PrepareStamps();
     bool IsDeleted(std::string_view field) const;
     // One data line into `row`; false with m_status set when the line does not fit the template.
     bool ReadDataLine(std::string_view line, Row& row);
@@ -55,11 +56,11 @@ private:
 
     const CSpecification& m_spec;
     std::string m_path;
-    FieldSplitter m_splitter;
+    delimited::FieldSplitter m_splitter;  // with the template's dialect
+    const delimited::Dialect& m_dialect; // m_splitter's
     NumberReader m_numbers;
-    LineSource m_lines;
+    sys::TextLineReader m_lines;
 
-    std::string m_delimiter;
     bool m_fusable = false; // the template allows the one-pass reading of data lines
     bool m_fusedOn = true;
     bool m_blockOn = true;
@@ -77,9 +78,9 @@ private:
     bool m_deleteInUse = false;
     std::string m_deleteValue;
 
-    std::unique_ptr<DateFormat> m_format;
+    std::unique_ptr<sys::DateFormat> m_format;
     std::unique_ptr<StampReader> m_stamps; // reads with m_format from m_start
-    StampFields m_start;           // starting fields: the global date or time where one applies
+    sys::DateTimeFields m_start;           // starting fields: the global date or time where one applies
     std::string m_stampBuffer;     // the date/time fields joined by blanks
     std::vector<int> m_slotOfItem; // item position -> place in the row, -1 when not selected
 };

@@ -33,12 +33,12 @@ std::string AsciiSeriesWriter::CleanField(const std::string& text)
     return clean;
 }
 
-Status AsciiSeriesWriter::Begin(const std::string& path, const SeriesHeader& header, const std::string&)
+sys::Status AsciiSeriesWriter::Begin(const std::string& path, const SeriesHeader& header, const std::string&)
 {
     m_path = path;
     m_file = std::fopen(path.c_str(), "wb");
     if (!m_file)
-        return Status::Fail(path, 0, std::string("cannot create the file: ") + std::strerror(errno));
+        return sys::Status::Fail(path, 0, std::string("cannot create the file: ") + std::strerror(errno));
     m_buffer.resize(kBufferSize);
 
     std::string head;
@@ -66,23 +66,23 @@ Status AsciiSeriesWriter::Begin(const std::string& path, const SeriesHeader& hea
         head += '\t' + CleanField(item.name);
     head += '\n';
     if (std::fwrite(head.data(), 1, head.size(), m_file) != head.size())
-        return Status::Fail(path, 0, std::string("write error: ") + std::strerror(errno));
-    return Status::Ok();
+        return sys::Status::Fail(path, 0, std::string("write error: ") + std::strerror(errno));
+    return sys::Status::Ok();
 }
 
-Status AsciiSeriesWriter::Flush()
+sys::Status AsciiSeriesWriter::Flush()
 {
     if (m_used > 0 && std::fwrite(m_buffer.data(), 1, m_used, m_file) != m_used)
-        return Status::Fail(m_path, 0, std::string("write error: ") + std::strerror(errno));
+        return sys::Status::Fail(m_path, 0, std::string("write error: ") + std::strerror(errno));
     m_used = 0;
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status AsciiSeriesWriter::Write(const Row& row)
+sys::Status AsciiSeriesWriter::Write(const Row& row)
 {
     const size_t needed = 21 + row.values.size() * kLongestValue;
     if (m_used + needed > m_buffer.size()) {
-        if (Status flushed = Flush(); !flushed)
+        if (sys::Status flushed = Flush(); !flushed)
             return flushed;
         if (needed > m_buffer.size())
             m_buffer.resize(needed);
@@ -96,14 +96,14 @@ Status AsciiSeriesWriter::Write(const Row& row)
     }
     *out++ = '\n';
     m_used += static_cast<size_t>(out - begin);
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status AsciiSeriesWriter::Finish()
+sys::Status AsciiSeriesWriter::Finish()
 {
-    Status status = Flush();
+    sys::Status status = Flush();
     if (std::fclose(m_file) != 0 && status)
-        status = Status::Fail(m_path, 0, std::string("write error: ") + std::strerror(errno));
+        status = sys::Status::Fail(m_path, 0, std::string("write error: ") + std::strerror(errno));
     m_file = nullptr;
     return status;
 }

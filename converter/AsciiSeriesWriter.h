@@ -15,15 +15,15 @@ namespace converter {
 class AsciiSeriesWriter : public SeriesWriter {
 public:
     ~AsciiSeriesWriter() override;
-    Status Begin(const std::string& path, const SeriesHeader& header, const std::string& title) override;
-    Status Write(const Row& row) override;
-    Status Finish() override;
+    sys::Status Begin(const std::string& path, const SeriesHeader& header, const std::string& title) override;
+    sys::Status Write(const Row& row) override;
+    sys::Status Finish() override;
 
     // A header text made safe for a tab-delimited field that the reader splits back unchanged.
     static std::string CleanField(const std::string& text);
 
 private:
-    Status Flush();
+    sys::Status Flush();
 
     std::FILE* m_file = nullptr;
     std::string m_path;

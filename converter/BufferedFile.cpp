@@ -16,12 +16,12 @@ BufferedFile::~BufferedFile()
         ::close(m_fd);
 }
 
-Status BufferedFile::SystemError(const char* what) const
+sys::Status BufferedFile::SystemError(const char* what) const
 {
     return Fail(std::string(what) + ": " + std::strerror(errno));
 }
 
-Status BufferedFile::Open(const std::string& path)
+sys::Status BufferedFile::Open(const std::string& path)
 {
     m_path = path;
     m_used = 0;
@@ -29,16 +29,16 @@ Status BufferedFile::Open(const std::string& path)
     m_fd = ::open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666);
     if (m_fd < 0)
         return SystemError("cannot create the file");
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status BufferedFile::Write(const void* data, size_t size)
+sys::Status BufferedFile::Write(const void* data, size_t size)
 {
     const auto* bytes = static_cast<const unsigned char*>(data);
     while (size > 0) {
         unsigned char* at = nullptr;
         size_t room = 0;
-        if (Status free = Room(at, room); !free)
+        if (sys::Status free = Room(at, room); !free)
             return free;
         const size_t piece = std::min(size, room);
         std::memcpy(at, bytes, piece);
@@ -46,19 +46,19 @@ Status BufferedFile::Write(const void* data, size_t size)
         bytes += piece;
         size -= piece;
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status BufferedFile::Room(unsigned char*& at, size_t& size)
+sys::Status BufferedFile::Room(unsigned char*& at, size_t& size)
 {
     if (m_fd < 0)
         return Fail("the file is not open for writing");
     if (m_used == m_buffer.size())
-        if (Status flushed = Flush(); !flushed)
+        if (sys::Status flushed = Flush(); !flushed)
             return flushed;
     at = m_buffer.data() + m_used;
     size = m_buffer.size() - m_used;
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 void BufferedFile::Used(size_t size)
@@ -67,7 +67,7 @@ void BufferedFile::Used(size_t size)
     m_written += size;
 }
 
-Status BufferedFile::Flush()
+sys::Status BufferedFile::Flush()
 {
     size_t done = 0;
     while (done < m_used) {
@@ -79,10 +79,10 @@ Status BufferedFile::Flush()
         done += static_cast<size_t>(wrote);
     }
     m_used = 0;
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status BufferedFile::WriteAt(std::uint64_t offset, const void* data, size_t size)
+sys::Status BufferedFile::WriteAt(std::uint64_t offset, const void* data, size_t size)
 {
     if (m_fd < 0)
         return Fail("the file is not open for writing");
@@ -103,14 +103,14 @@ Status BufferedFile::WriteAt(std::uint64_t offset, const void* data, size_t size
     }
     if (done < size)
         std::memcpy(m_buffer.data() + (offset + done - flushed), bytes + done, size - done);
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status BufferedFile::Close()
+sys::Status BufferedFile::Close()
 {
     if (m_fd < 0)
         return Fail("the file is not open for writing");
-    Status flushed = Flush();
+    sys::Status flushed = Flush();
     const int fd = m_fd;
     m_fd = -1;
     if (::close(fd) != 0 && flushed)

@@ -2,7 +2,7 @@
 // A new file written front to back through a buffer, where bytes written before can still be
 // replaced in place (sizes and counts known only at the end). The writers of zip packages and of
 // compound files build on it.
-#include "converter/Problem.h"
+#include "platform/system/Status.h"
 
 #include <cstdint>
 #include <string>
@@ -18,29 +18,29 @@ public:
     BufferedFile& operator=(const BufferedFile&) = delete;
 
     // Creates (or empties) `path`.
-    Status Open(const std::string& path);
+    sys::Status Open(const std::string& path);
     bool IsOpen() const { return m_fd >= 0; }
     const std::string& Path() const { return m_path; }
 
-    Status Write(const void* data, size_t size);
+    sys::Status Write(const void* data, size_t size);
     // Free room at the end of the buffer to write into directly (flushed first when full);
     // Used tells how much of it was filled.
-    Status Room(unsigned char*& at, size_t& size);
+    sys::Status Room(unsigned char*& at, size_t& size);
     void Used(size_t size);
     // Replaces bytes written before, in the file or still in the buffer.
-    Status WriteAt(std::uint64_t offset, const void* data, size_t size);
+    sys::Status WriteAt(std::uint64_t offset, const void* data, size_t size);
     // Bytes written so far, those in the buffer included: the offset of the next byte.
     std::uint64_t Size() const { return m_written; }
 
     // Writes what the buffer holds and closes the file.
-    Status Close();
+    sys::Status Close();
 
     // A failed Status naming the file.
-    Status Fail(const std::string& message) const { return Status::Fail(m_path, 0, message); }
+    sys::Status Fail(const std::string& message) const { return sys::Status::Fail(m_path, 0, message); }
 
 private:
-    Status Flush();
-    Status SystemError(const char* what) const;
+    sys::Status Flush();
+    sys::Status SystemError(const char* what) const;
 
     std::string m_path;
     int m_fd = -1;

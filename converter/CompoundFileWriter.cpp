@@ -93,28 +93,28 @@ std::string EntryBytes(const DirectoryEntry& entry)
 
 } // namespace
 
-Status CompoundFileWriter::Open(const std::string& path)
+sys::Status CompoundFileWriter::Open(const std::string& path)
 {
-    if (Status opened = m_file.Open(path); !opened)
+    if (sys::Status opened = m_file.Open(path); !opened)
         return opened;
     const std::string placeholder(kHeaderBytes, '\0'); // the header, once the layout is known
     return m_file.Write(placeholder.data(), placeholder.size());
 }
 
-Status CompoundFileWriter::Append(std::string_view bytes)
+sys::Status CompoundFileWriter::Append(std::string_view bytes)
 {
     if (StreamSize() + bytes.size() > kMaxStreamBytes)
         return m_file.Fail("the stream passes the 2 GiB a compound file's directory can describe");
     return m_file.Write(bytes.data(), bytes.size());
 }
 
-Status CompoundFileWriter::Patch(std::uint64_t offset, std::string_view bytes)
+sys::Status CompoundFileWriter::Patch(std::uint64_t offset, std::string_view bytes)
 {
     return m_file.WriteAt(kHeaderBytes + offset, bytes.data(), bytes.size());
 }
 
 // Fills the sectors of a stream that began at `start` (after the header) and holds `size` bytes.
-Status CompoundFileWriter::PadStream(std::uint64_t start, std::uint64_t size)
+sys::Status CompoundFileWriter::PadStream(std::uint64_t start, std::uint64_t size)
 {
     const std::uint64_t end = start + static_cast<std::uint64_t>(SectorsFor(StoredSize(size))) * kSectorBytes;
     const std::string zeros(static_cast<size_t>(end - (m_file.Size() - kHeaderBytes)), '\0');
@@ -146,34 +146,34 @@ CompoundFileWriter::Layout CompoundFileWriter::PlanLayout(const std::vector<std:
     return layout;
 }
 
-Status CompoundFileWriter::Close(const std::string& name, const std::vector<Stream>& others)
+sys::Status CompoundFileWriter::Close(const std::string& name, const std::vector<Stream>& others)
 {
     std::vector<std::string> names{name};
     std::vector<std::uint64_t> sizes{StreamSize()};
-    if (Status padded = PadStream(0, sizes[0]); !padded)
+    if (sys::Status padded = PadStream(0, sizes[0]); !padded)
         return padded;
     for (const Stream& stream : others) {
         const std::uint64_t start = m_file.Size() - kHeaderBytes;
         names.push_back(stream.name);
         sizes.push_back(stream.bytes.size());
-        if (Status written = m_file.Write(stream.bytes.data(), stream.bytes.size()); !written)
+        if (sys::Status written = m_file.Write(stream.bytes.data(), stream.bytes.size()); !written)
             return written;
-        if (Status padded = PadStream(start, stream.bytes.size()); !padded)
+        if (sys::Status padded = PadStream(start, stream.bytes.size()); !padded)
             return padded;
     }
     const Layout layout = PlanLayout(sizes, names.size() + 1);
-    if (Status directory = WriteDirectory(layout, names, sizes); !directory)
+    if (sys::Status directory = WriteDirectory(layout, names, sizes); !directory)
         return directory;
-    if (Status table = WriteAllocationTable(layout); !table)
+    if (sys::Status table = WriteAllocationTable(layout); !table)
         return table;
-    if (Status difat = WriteDifat(layout); !difat)
+    if (sys::Status difat = WriteDifat(layout); !difat)
         return difat;
-    if (Status header = WriteHeader(layout); !header)
+    if (sys::Status header = WriteHeader(layout); !header)
         return header;
     return m_file.Close();
 }
 
-Status CompoundFileWriter::WriteDirectory(const Layout& layout, const std::vector<std::string>& names,
+sys::Status CompoundFileWriter::WriteDirectory(const Layout& layout, const std::vector<std::string>& names,
                                           const std::vector<std::uint64_t>& sizes)
 {
     std::vector<DirectoryEntry> entries(1);
@@ -203,7 +203,7 @@ Status CompoundFileWriter::WriteDirectory(const Layout& layout, const std::vecto
 }
 
 // The table is written one sector at a time from the layout, so it is never held whole.
-Status CompoundFileWriter::WriteAllocationTable(const Layout& layout)
+sys::Status CompoundFileWriter::WriteAllocationTable(const Layout& layout)
 {
     std::vector<std::pair<std::uint32_t, std::uint32_t>> chains; // first sector, sector count
     for (size_t i = 0; i < layout.streamStarts.size(); ++i)
@@ -223,14 +223,14 @@ Status CompoundFileWriter::WriteAllocationTable(const Layout& layout)
     for (std::uint32_t t = 0; t < layout.tableSectors; ++t) {
         for (std::uint32_t k = 0; k < kEntriesPerTableSector; ++k)
             Store32(sector + 4 * k, entryOf(t * kEntriesPerTableSector + k));
-        if (Status written = m_file.Write(sector, sizeof sector); !written)
+        if (sys::Status written = m_file.Write(sector, sizeof sector); !written)
             return written;
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 // The table sectors past the header's 109, 127 to a DIFAT sector, each ending with the next.
-Status CompoundFileWriter::WriteDifat(const Layout& layout)
+sys::Status CompoundFileWriter::WriteDifat(const Layout& layout)
 {
     unsigned char sector[kSectorBytes];
     for (std::uint32_t d = 0; d < layout.difatSectors; ++d) {
@@ -240,13 +240,13 @@ Status CompoundFileWriter::WriteDifat(const Layout& layout)
         }
         Store32(sector + 4 * kTableSectorsPerDifat,
                 d + 1 < layout.difatSectors ? layout.difatStart + d + 1 : kEndOfChain);
-        if (Status written = m_file.Write(sector, sizeof sector); !written)
+        if (sys::Status written = m_file.Write(sector, sizeof sector); !written)
             return written;
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status CompoundFileWriter::WriteHeader(const Layout& layout)
+sys::Status CompoundFileWriter::WriteHeader(const Layout& layout)
 {
     unsigned char header[kHeaderBytes] = {0xD0, 0xCF, 0x11, 0xE0, 0xA1, 0xB1, 0x1A, 0xE1};
     Store16(header + 24, 0x003E); // minor version

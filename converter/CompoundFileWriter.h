@@ -17,12 +17,12 @@ namespace converter {
 
 class CompoundFileWriter {
 public:
-    Status Open(const std::string& path);
+    sys::Status Open(const std::string& path);
 
     // Appends to the streamed stream.
-    Status Append(std::string_view bytes);
+    sys::Status Append(std::string_view bytes);
     // Replaces bytes of the streamed stream written before, from `offset` in the stream.
-    Status Patch(std::uint64_t offset, std::string_view bytes);
+    sys::Status Patch(std::uint64_t offset, std::string_view bytes);
     std::uint64_t StreamSize() const { return m_file.Size() - kHeaderBytes; }
 
     struct Stream {
@@ -30,7 +30,7 @@ public:
         std::string bytes;
     };
     // Completes the file: the streamed stream under `name`, then `others`, each given whole.
-    Status Close(const std::string& name, const std::vector<Stream>& others = {});
+    sys::Status Close(const std::string& name, const std::vector<Stream>& others = {});
 
     static constexpr std::uint64_t kHeaderBytes = 512;
     static constexpr std::uint64_t kSectorBytes = 512;
@@ -47,12 +47,12 @@ private:
         std::uint32_t difatStart = 0, difatSectors = 0;
     };
     static Layout PlanLayout(const std::vector<std::uint64_t>& streamSizes, size_t directoryEntries);
-    Status PadStream(std::uint64_t start, std::uint64_t size);
-    Status WriteDirectory(const Layout& layout, const std::vector<std::string>& names,
+    sys::Status PadStream(std::uint64_t start, std::uint64_t size);
+    sys::Status WriteDirectory(const Layout& layout, const std::vector<std::string>& names,
                           const std::vector<std::uint64_t>& sizes);
-    Status WriteAllocationTable(const Layout& layout);
-    Status WriteDifat(const Layout& layout);
-    Status WriteHeader(const Layout& layout);
+    sys::Status WriteAllocationTable(const Layout& layout);
+    sys::Status WriteDifat(const Layout& layout);
+    sys::Status WriteHeader(const Layout& layout);
 
     BufferedFile m_file;
 };

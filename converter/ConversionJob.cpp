@@ -64,19 +64,17 @@ private:
 
 } // namespace
 
-bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
+sys::Status ReadJobSetup(const std::string& path, JobSetup& setup)
 {
     WPXHANDLE doc = nullptr;
-    CString readError;
-    if (!wpxRead(path, &doc, &readError)) {
-        error = readError.empty() ? path + ": cannot read the setup file" : readError;
-        return false;
-    }
+    CString readError; // "file:line: message", as the parameter-file library words it
+    if (!wpxRead(path, &doc, &readError))
+        return readError.empty() ? sys::Status::Fail(path, 0, "cannot read the setup file")
+                                 : sys::Status::Fail({}, 0, readError);
     WPXHANDLE target = wpxTargetByNum(doc, 1);
     if (!target || wpxGetName(target) != "VELMORA") {
-        error = path + ": the setup file has no target \"VELMORA\"";
         wpxClose(&doc);
-        return false;
+        return sys::Status::Fail(path, 0, "the setup file has no target \"VELMORA\"");
     }
     setup.setupFile = path;
     WPXHANDLE input = wpxSectionByNameNum(target, "INPUT", 1);
@@ -93,10 +91,10 @@ bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
     for (int n = 1; n <= wpxGetNoParams(items); ++n) {
         const int item = wpxGetInt(wpxParamByNum(items, n));
         if (item < 0) {
-            error = path + ": Items entry " + std::to_string(n) + " is " + std::to_string(item) +
-                    ", not an item position (numbered from 0)";
             wpxClose(&doc);
-            return false;
+            return sys::Status::Fail(path, 0,
+                                     "Items entry " + std::to_string(n) + " is " + std::to_string(item) +
+                                         ", not an item position (numbered from 0)");
         }
         setup.items.push_back(static_cast<unsigned>(item));
     }
@@ -108,14 +106,14 @@ bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error)
     wpxGetParam(output, "File_title", &setup.title, 1, 1);
     wpxGetParam(output, "Log_file", &setup.logFile, 1, 1);
     wpxClose(&doc);
-    return true;
+    return sys::Status::Ok();
 }
 
 std::string CheckJobSetup(const JobSetup& setup)
 {
-    if (!IsFormat(setup.inputFormat))
+    if (!(sys::FindFormat(setup.inputFormat) != nullptr))
         return "the input format " + std::to_string(setup.inputFormat) + " is not 1 (rbx0), 2 (ASCII) or 3 (Excel)";
-    if (!IsFormat(setup.outputFormat))
+    if (!(sys::FindFormat(setup.outputFormat) != nullptr))
         return "the output format " + std::to_string(setup.outputFormat) + " is not 1 (rbx0), 2 (ASCII) or 3 (Excel)";
     if (std::string problem = SelectionProblem(setup.items, std::numeric_limits<size_t>::max()); !problem.empty())
         return problem;
@@ -151,7 +149,7 @@ ConversionLog::ConversionLog(const std::string& path, std::FILE* echo) : m_echo(
         return;
     m_file = std::fopen(path.c_str(), "a");
     if (!m_file)
-        m_openError = path + ": cannot open the log file: " + std::strerror(errno);
+        m_status = sys::Status::Fail(path, 0, std::string("cannot open the log file: ") + std::strerror(errno));
 }
 
 ConversionLog::~ConversionLog()
@@ -206,11 +204,11 @@ bool InShare(const std::string& input, unsigned share, unsigned shares)
 int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
 {
     const std::string problem = CheckJobSetup(setup);
-    const Format in = static_cast<Format>(setup.inputFormat);
-    const Format out = static_cast<Format>(setup.outputFormat);
-    log.Write("run " + COleDateTime::GetCurrentTime().Format("%Y-%m-%d %H:%M:%S") + ": " + FormatName(in) + " " +
+    const sys::FileFormat in = static_cast<sys::FileFormat>(setup.inputFormat);
+    const sys::FileFormat out = static_cast<sys::FileFormat>(setup.outputFormat);
+    log.Write("run " + COleDateTime::GetCurrentTime().Format("%Y-%m-%d %H:%M:%S") + ": " + sys::FormatInfo(in).name + " " +
               Escaped(setup.inputType == 2 ? "folder " + setup.inputFolder : "file " + setup.inputFile) + " -> " +
-              FormatName(out) + " " +
+              sys::FormatInfo(out).name + " " +
               Escaped(setup.inputType == 2 ? "folder " + setup.outputFolder : "file " + setup.outputFile) + "; template " +
               (setup.templateName.empty() ? "(defaults)" : Escaped(setup.templateName)) + "; items " + Join(setup.items) +
               (options.shares ? "; share " + std::to_string(options.share) + " of " + std::to_string(options.shares) : ""));
@@ -219,7 +217,7 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
         return kExitSetup;
     }
 
-    Status loaded;
+    sys::Status loaded;
     std::unique_ptr<CSpecification> spec = LoadTemplate(in, setup.templateName, loaded);
     if (!loaded) {
         log.Write("setup error: " + Escaped(loaded.problem().Describe()) + "\nresult: nothing converted; exit status 3");
@@ -249,7 +247,7 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
             if (!file.refusal.empty()) {
                 report.input = file.input;
                 report.output = file.output;
-                report.problem = Problem{{}, 0, 0, file.refusal}; // the entry names the input already
+                report.problem = sys::Problem{{}, 0, 0, file.refusal}; // the entry names the input already
             } else {
                 FileJob job{in, file.input, spec.get(), setup.items, out, file.output, setup.title};
                 report = ConvertFile(job, [&](std::uint64_t rows, std::uint64_t bytes) {
@@ -292,7 +290,7 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
                           " skipped or failed";
     if (reports.empty())
         summary += options.shares ? "; this share holds none of the " + std::to_string(runPlan.Files().size()) + " files"
-                                  : "; the folder holds no " + std::string(FormatName(in)) + " file";
+                                  : "; the folder holds no " + std::string(sys::FormatInfo(in).name) + " file";
     if (setup.inputType == 2 && failed > 0)
         summary += "; " + res::LoadString(res::IDS_FOLDER_FILES_SKIPPED);
     log.Write(summary + "; exit status " + std::to_string(exitCode));

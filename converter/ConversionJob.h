@@ -35,7 +35,7 @@ struct JobSetup {
 };
 
 // Reads the setup file; false with `error` ("file:line: ...") when it cannot be read.
-bool ReadJobSetup(const std::string& path, JobSetup& setup, std::string& error);
+sys::Status ReadJobSetup(const std::string& path, JobSetup& setup);
 // Why the setup cannot run, or empty when it can. An output problem is not one: it refuses only the
 // files it concerns (see RunPlan).
 std::string CheckJobSetup(const JobSetup& setup);
@@ -53,14 +53,15 @@ public:
     ConversionLog& operator=(const ConversionLog&) = delete;
 
     bool IsOpen() const { return m_file != nullptr; }
-    const std::string& OpenError() const { return m_openError; }
+    // Why the log file could not be opened.
+    const sys::Status& status() const { return m_status; }
     void Write(const std::string& entry);
 
 private:
     std::mutex m_mutex;
     std::FILE* m_file = nullptr;
     std::FILE* m_echo = nullptr;
-    std::string m_openError;
+    sys::Status m_status;
 };
 
 struct JobOptions {

@@ -23,38 +23,8 @@ namespace converter {
 namespace {
 
 constexpr std::uint64_t kProgressEvery = 1u << 16;
-constexpr size_t kTextProbeBytes = 40960;
 
-std::string ExtensionOf(const std::string& path)
-{
-    const std::string name = sys::FileTitle(path);
-    const size_t dot = name.rfind('.');
-    return dot == std::string::npos ? std::string() : text::ToLower(name.substr(dot));
-}
-
-// A file without extension counts as text when its first bytes hold no zero byte.
-bool LooksLikeText(const std::string& path)
-{
-    std::FILE* file = std::fopen(path.c_str(), "rb");
-    if (!file)
-        return false;
-    char buffer[4096];
-    size_t total = 0;
-    bool text = true;
-    while (total < kTextProbeBytes && text) {
-        const size_t got = std::fread(buffer, 1, std::min(sizeof buffer, kTextProbeBytes - total), file);
-        if (got == 0)
-            break;
-        for (size_t i = 0; i < got; ++i)
-            if (buffer[i] == '\0')
-                text = false;
-        total += got;
-    }
-    std::fclose(file);
-    return text && total > 0;
-}
-
-FileReport Refuse(FileReport report, Status status, bool templateFits)
+FileReport Refuse(FileReport report, sys::Status status, bool templateFits)
 {
     report.converted = false;
     report.templateFits = templateFits;
@@ -64,77 +34,41 @@ FileReport Refuse(FileReport report, Status status, bool templateFits)
 
 } // namespace
 
-bool IsFormat(int number) { return number >= 1 && number <= 3; }
-
-const char* FormatName(Format format)
-{
-    switch (format) {
-    case Format::Rbx0: return "rbx0";
-    case Format::Ascii: return "ASCII";
-    case Format::Excel: return "Excel";
-    }
-    return "?";
-}
-
-const char* OutputExtension(Format format)
-{
-    switch (format) {
-    case Format::Rbx0: return ".rbx0";
-    case Format::Ascii: return ".txt";
-    case Format::Excel: return ".xlsx";
-    }
-    return "";
-}
-
-bool AcceptsExtension(Format format, const std::string& path)
-{
-    const std::string extension = ExtensionOf(path);
-    switch (format) {
-    case Format::Rbx0: return extension == ".rbx0";
-    case Format::Ascii:
-        if (extension == ".txt" || extension == ".tab" || extension == ".csv")
-            return true;
-        return extension.empty() && LooksLikeText(path);
-    case Format::Excel: return extension == ".xls" || extension == ".xlsx";
-    }
-    return false;
-}
-
-std::unique_ptr<CSpecification> LoadTemplate(Format format, const std::string& path, Status& status)
+std::unique_ptr<CSpecification> LoadTemplate(sys::FileFormat format, const std::string& path, sys::Status& status)
 {
     std::unique_ptr<CSpecification> spec;
-    if (format == Format::Ascii)
+    if (format == sys::FileFormat::Ascii)
         spec = std::make_unique<CAsciiSpecification>();
-    else if (format == Format::Excel)
+    else if (format == sys::FileFormat::Excel)
         spec = std::make_unique<CExcelSpecification>();
     else
         return nullptr;
     if (!path.empty() && !spec->Load(path)) {
         const std::string why = spec->LastError().empty() ? "it is not a template file" : spec->LastError();
-        status = Status::Fail(path, 0, "cannot load the template: " + why);
+        status = sys::Status::Fail(path, 0, "cannot load the template: " + why);
         return nullptr;
     }
-    status = Status::Ok();
+    status = sys::Status::Ok();
     return spec;
 }
 
-std::unique_ptr<SeriesReader> MakeReader(Format format, const CSpecification* spec)
+std::unique_ptr<SeriesReader> MakeReader(sys::FileFormat format, const CSpecification* spec)
 {
     switch (format) {
-    case Format::Rbx0: return std::make_unique<RbxSeriesReader>();
-    case Format::Ascii: return spec ? std::make_unique<AsciiSeriesReader>(*spec) : nullptr;
-    case Format::Excel: return spec ? std::make_unique<ExcelSeriesReader>(*spec) : nullptr;
+    case sys::FileFormat::Rbx0: return std::make_unique<RbxSeriesReader>();
+    case sys::FileFormat::Ascii: return spec ? std::make_unique<AsciiSeriesReader>(*spec) : nullptr;
+    case sys::FileFormat::Excel: return spec ? std::make_unique<ExcelSeriesReader>(*spec) : nullptr;
     }
     return nullptr;
 }
 
-std::unique_ptr<SeriesWriter> MakeWriter(Format format, const std::string& output)
+std::unique_ptr<SeriesWriter> MakeWriter(sys::FileFormat format, const std::string& output)
 {
     switch (format) {
-    case Format::Rbx0: return std::make_unique<RbxSeriesWriter>();
-    case Format::Ascii: return std::make_unique<AsciiSeriesWriter>();
-    case Format::Excel:
-        if (ExtensionOf(output) == ".xls")
+    case sys::FileFormat::Rbx0: return std::make_unique<RbxSeriesWriter>();
+    case sys::FileFormat::Ascii: return std::make_unique<AsciiSeriesWriter>();
+    case sys::FileFormat::Excel:
+        if (text::EqualsNoCase(sys::FileExtension(output), ".xls"))
             return std::make_unique<XlsSeriesWriter>();
         return std::make_unique<XlsxSeriesWriter>();
     }
@@ -156,33 +90,28 @@ std::string SelectionProblem(const CUIntArray& items, size_t count)
     return {};
 }
 
-bool CanConvert(Format format, const std::string& file, const std::string& templatePath, std::string* reason)
+sys::Status CanConvert(sys::FileFormat format, const std::string& file, const std::string& templatePath)
 {
-    auto refuse = [&](const std::string& why) {
-        if (reason)
-            *reason = why;
-        return false;
-    };
     try {
         if (!sys::IsRegularFile(file))
-            return refuse(file + ": no such file");
-        if (!AcceptsExtension(format, file))
-            return refuse(file + ": the extension does not suit " + FormatName(format) + " input");
-        Status status;
+            return sys::Status::Fail(file, 0, "no such file");
+        if (!sys::IsInputOf(format, file))
+            return sys::Status::Fail(file, 0, std::string("the extension does not suit ") + sys::FormatInfo(format).name + " input");
+        sys::Status status;
         std::unique_ptr<CSpecification> spec = LoadTemplate(format, templatePath, status);
         if (!status)
-            return refuse(status.problem().Describe());
+            return status;
         std::unique_ptr<SeriesReader> reader = MakeReader(format, spec.get());
         if (!reader)
-            return refuse(std::string(FormatName(format)) + " input cannot be read by this build");
-        if (Status opened = reader->Open(file); !opened)
-            return refuse(opened.problem().Describe());
+            return sys::Status::Fail({}, 0, std::string(sys::FormatInfo(format).name) + " input cannot be read by this build");
+        if (sys::Status opened = reader->Open(file); !opened)
+            return opened;
         Row row;
         if (!reader->Next(row) && !reader->status())
-            return refuse(reader->status().problem().Describe());
-        return true;
+            return reader->status();
+        return sys::Status::Ok();
     } catch (const std::exception& e) {
-        return refuse(file + ": " + e.what());
+        return sys::Status::Fail(file, 0, e.what());
     }
 }
 
@@ -211,18 +140,18 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     report.output = job.output;
     std::unique_ptr<SeriesReader> reader = MakeReader(job.inputFormat, job.spec);
     if (!reader)
-        return Refuse(report, Status::Fail(job.input, 0, std::string(FormatName(job.inputFormat)) + " input needs a template"), false);
+        return Refuse(report, sys::Status::Fail(job.input, 0, std::string(sys::FormatInfo(job.inputFormat).name) + " input needs a template"), false);
     // Only a template can fail to fit; an rbx0 file that cannot be opened is damaged.
-    const bool throughTemplate = job.inputFormat != Format::Rbx0;
-    if (Status opened = reader->Open(job.input); !opened)
+    const bool throughTemplate = job.inputFormat != sys::FileFormat::Rbx0;
+    if (sys::Status opened = reader->Open(job.input); !opened)
         return Refuse(report, opened, !throughTemplate);
     report.itemsInFile = reader->Header().items.size();
     std::string selectionProblem;
     const std::vector<size_t> selection = ResolveSelection(job.items, report.itemsInFile, selectionProblem);
     if (!selectionProblem.empty())
-        return Refuse(report, Status::Fail(job.input, 0, selectionProblem), true);
+        return Refuse(report, sys::Status::Fail(job.input, 0, selectionProblem), true);
     if (selection.empty())
-        return Refuse(report, Status::Fail(job.input, 0, "the file has no items"), false);
+        return Refuse(report, sys::Status::Fail(job.input, 0, "the file has no items"), false);
     reader->Select(selection);
     SeriesHeader header;
     header.timeTitle = reader->Header().timeTitle;
@@ -231,19 +160,19 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
     report.itemsWritten = header.items.size();
 
     OutputFile output(job.output);
-    if (Status created = output.Create(); !created)
+    if (sys::Status created = output.Create(); !created)
         return Refuse(report, created, true);
     std::unique_ptr<SeriesWriter> writer = MakeWriter(job.outputFormat, job.output);
-    if (Status begun = writer->Begin(output.WriterPath(), header, job.title); !begun)
-        return Refuse(report, Status::Fail(job.output, 0, begun.problem().message), true);
+    if (sys::Status begun = writer->Begin(output.WriterPath(), header, job.title); !begun)
+        return Refuse(report, sys::Status::Fail(job.output, 0, begun.problem().message), true);
 
     Row row;
     while (reader->Next(row)) {
         if (report.rows == 0)
             report.firstStamp = FormatStamp(row.stamp);
-        if (Status written = writer->Write(row); !written)
+        if (sys::Status written = writer->Write(row); !written)
             return Refuse(report,
-                          Status::Fail(job.input, reader->Location(), "cannot write " + job.output + ": " + written.problem().message),
+                          sys::Status::Fail(job.input, reader->Location(), "cannot write " + job.output + ": " + written.problem().message),
                           true);
         ++report.rows;
         if (progress && report.rows % kProgressEvery == 0)
@@ -254,10 +183,10 @@ FileReport Convert(const FileJob& job, const ProgressFn& progress)
         return Refuse(report, reader->status(), report.rows > 0 || !throughTemplate);
     if (report.rows > 0)
         report.lastStamp = FormatStamp(row.stamp);
-    if (Status finished = writer->Finish(); !finished)
-        return Refuse(report, Status::Fail(job.output, 0, finished.problem().message), true);
+    if (sys::Status finished = writer->Finish(); !finished)
+        return Refuse(report, sys::Status::Fail(job.output, 0, finished.problem().message), true);
     writer.reset();
-    if (Status committed = output.Commit(); !committed)
+    if (sys::Status committed = output.Commit(); !committed)
         return Refuse(report, committed, true);
     report.converted = true;
     return report;
@@ -273,7 +202,7 @@ FileReport ConvertFile(const FileJob& job, const ProgressFn& progress)
         FileReport report;
         report.input = job.input;
         report.output = job.output;
-        report.problem = Problem{job.input, 0, 0, std::string("conversion stopped: ") + e.what()};
+        report.problem = sys::Problem{job.input, 0, 0, std::string("conversion stopped: ") + e.what()};
         return report;
     }
 }

@@ -3,7 +3,10 @@
 #include "converter/ConversionJob.h"
 #include "converter/NumberText.h"
 #include "converter/RunPlan.h"
+#include "converter/SheetLayout.h"
 #include "converter/StampText.h"
+#include "converter/XlsSeriesWriter.h"
+#include "converter/XlsxSeriesWriter.h"
 #include "platform/system/Text.h"
 #include "templates/Specification.h"
 
@@ -17,8 +20,6 @@ namespace {
 
 constexpr size_t kKeptFindings = 1000; // of each kind, per file; the counts go on
 constexpr size_t kMostStepRuns = 10000; // a series with more changes of step has no one step
-constexpr std::uint64_t kXlsRows = 65534, kXlsxRows = 1048574;
-constexpr size_t kXlsItems = 255, kXlsxItems = 16383;
 
 std::string Escaped(std::string_view text) { return text::EscapeControls(text); }
 
@@ -149,25 +150,21 @@ FileCheck& Refuse(FileCheck& check, FileCheck::Verdict verdict, const std::strin
     return check;
 }
 
-// What the writer of the output would refuse of a file that reads.
+// What the writer of the output would refuse of a file that reads: its own limits.
 std::string WriterRefusal(const FileJob& job, const FileCheck& check)
 {
-    const bool xls = job.outputFormat == Format::Excel && text::EqualsNoCase(sys::FileExtension(job.output), ".xls");
-    switch (job.outputFormat) {
-    case Format::Rbx0:
-        if (check.repeatedStamps + check.decreasingStamps > 0)
-            return "an rbx0 file needs rising time stamps, and " +
-                   std::to_string(check.repeatedStamps + check.decreasingStamps) + " do not rise";
-        break;
-    case Format::Excel:
-        if (check.items > (xls ? kXlsItems : kXlsxItems))
-            return std::to_string(check.items) + " items do not fit the sheet's columns";
-        if (check.rows > (xls ? kXlsRows : kXlsxRows))
-            return std::to_string(check.rows) + " rows do not fit the sheet (at most " +
-                   std::to_string(xls ? kXlsRows : kXlsxRows) + ")";
-        break;
-    default: break;
-    }
+    if (job.outputFormat == sys::FileFormat::Rbx0 && check.repeatedStamps + check.decreasingStamps > 0)
+        return "an rbx0 file needs rising time stamps, and " +
+               std::to_string(check.repeatedStamps + check.decreasingStamps) + " do not rise";
+    if (job.outputFormat != sys::FileFormat::Excel)
+        return {};
+    const bool xls = text::EqualsNoCase(sys::FileExtension(job.output), ".xls");
+    const std::uint64_t columns = xls ? XlsSeriesWriter::kMaxColumns : XlsxSeriesWriter::kMaxColumns;
+    const std::uint64_t rows = (xls ? XlsSeriesWriter::kMaxRows : XlsxSeriesWriter::kMaxRows) - sheet_layout::kHeaderRows;
+    if (check.items + 1 > columns)
+        return std::to_string(check.items) + " items do not fit the sheet's " + std::to_string(columns - 1) + " value columns";
+    if (check.rows > rows)
+        return std::to_string(check.rows) + " rows do not fit the sheet (at most " + std::to_string(rows) + ")";
     return {};
 }
 
@@ -178,9 +175,9 @@ FileCheck Check(const FileJob& job)
     check.output = job.output;
     std::unique_ptr<SeriesReader> reader = MakeReader(job.inputFormat, job.spec);
     if (!reader)
-        return Refuse(check, FileCheck::Verdict::Skipped, std::string(FormatName(job.inputFormat)) + " input needs a template");
-    const bool throughTemplate = job.inputFormat != Format::Rbx0;
-    if (Status opened = reader->Open(job.input); !opened)
+        return Refuse(check, FileCheck::Verdict::Skipped, std::string(sys::FormatInfo(job.inputFormat).name) + " input needs a template");
+    const bool throughTemplate = job.inputFormat != sys::FileFormat::Rbx0;
+    if (sys::Status opened = reader->Open(job.input); !opened)
         return Refuse(check, throughTemplate ? FileCheck::Verdict::Skipped : FileCheck::Verdict::Fails,
                       opened.problem().Describe());
     const size_t count = reader->Header().items.size();
@@ -319,7 +316,7 @@ std::string FileJson(const FileCheck& check)
     out += ",\"step\":" + (check.step > 0 ? std::to_string(check.step) : std::string("null"));
     out += ",\"rejectedCount\":" + std::to_string(check.rejectedCount) + ",\"rejected\":[";
     for (size_t i = 0; i < check.rejected.size(); ++i) {
-        const Problem& problem = check.rejected[i];
+        const sys::Problem& problem = check.rejected[i];
         out += (i ? ",{" : "{") + text::Format("\"line\":%ld,\"column\":%d,", problem.line, problem.column);
         AppendField(out, "reason", problem.message);
         out += "}";
@@ -384,7 +381,7 @@ std::string DescribeCheck(const FileCheck& check)
         out += std::string(check.rows > 0 ? "; " : "") +
                (check.verdict == FileCheck::Verdict::Skipped ? "the template does not fit: " : "") + Escaped(check.reason);
     out += "\n";
-    for (const Problem& problem : check.rejected)
+    for (const sys::Problem& problem : check.rejected)
         out += "  " + Where(problem.file, problem.line) + (problem.column > 0 ? ":" + std::to_string(problem.column) : "") +
                ": rejected: " + Escaped(problem.message) + "\n";
     out += More(check.rejectedCount, check.rejected.size(), "rejected rows");
@@ -443,9 +440,9 @@ bool CheckJobFiles(const JobSetup& setup, unsigned threads, unsigned shard, unsi
     checks.clear();
     if (setupError = CheckJobSetup(setup); !setupError.empty())
         return false;
-    const Format in = static_cast<Format>(setup.inputFormat);
-    const Format outFormat = static_cast<Format>(setup.outputFormat);
-    Status loaded;
+    const sys::FileFormat in = static_cast<sys::FileFormat>(setup.inputFormat);
+    const sys::FileFormat outFormat = static_cast<sys::FileFormat>(setup.outputFormat);
+    sys::Status loaded;
     std::unique_ptr<CSpecification> spec = LoadTemplate(in, setup.templateName, loaded);
     if (!loaded) {
         setupError = loaded.problem().Describe();

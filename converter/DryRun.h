@@ -43,7 +43,7 @@ struct FileCheck {
     std::string firstStamp, lastStamp;
     Stamp step = 0; // the step of an equidistant series; 0 when the series has none
 
-    std::vector<Problem> rejected; // rows that do not read, the first few
+    std::vector<sys::Problem> rejected; // rows that do not read, the first few
     std::uint64_t rejectedCount = 0;
     std::vector<Gap> gaps;
     std::uint64_t missingSteps = 0;

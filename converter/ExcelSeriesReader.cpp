@@ -56,7 +56,7 @@ ExcelSeriesReader::~ExcelSeriesReader()
         m_producer.join();
 }
 
-Status ExcelSeriesReader::Open(const std::string& path)
+sys::Status ExcelSeriesReader::Open(const std::string& path)
 {
     m_path = path;
     m_header = SeriesHeader();
@@ -66,10 +66,10 @@ Status ExcelSeriesReader::Open(const std::string& path)
     m_stampColumn = m_spec.GetDateTimeColumn();
     m_deleteInUse = m_spec.m_DataDesc.m_nDeleteValueCheck != 0;
     if (m_spec.m_DataDesc.m_nStartRow < 1)
-        return m_status = Status::Fail(path, 0, "the data start row of the template must be 1 or more");
+        return m_status = sys::Status::Fail(path, 0, "the data start row of the template must be 1 or more");
     if (m_stampColumn < 1)
-        return m_status = Status::Fail(path, 0, "the template's date/time option must be 0, 1 or 2");
-    if (Status header = ReadHeader(); !header)
+        return m_status = sys::Status::Fail(path, 0, "the template's date/time option must be 0, 1 or 2");
+    if (sys::Status header = ReadHeader(); !header)
         return m_status = header;
     std::vector<size_t> all(m_itemCount);
     for (size_t i = 0; i < all.size(); ++i)
@@ -80,14 +80,14 @@ Status ExcelSeriesReader::Open(const std::string& path)
 }
 
 // One pass over the sheet for its used columns and the header rows.
-Status ExcelSeriesReader::ReadHeader()
+sys::Status ExcelSeriesReader::ReadHeader()
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     sheet::WorkbookReader workbook;
-    if (!workbook.Open(m_path))
-        return Status::Fail(m_path, 0, workbook.Error());
+    if (const sys::Status opened = workbook.Open(m_path); !opened)
+        return sys::Status::Fail(m_path, 0, opened.problem().message);
     if (m_sheet < 1 || m_sheet > workbook.SheetCount())
-        return Status::Fail(m_path, 0, res::LoadString(res::IDS_SHEET_INDEX_TOO_LARGE));
+        return sys::Status::Fail(m_path, 0, res::LoadString(res::IDS_SHEET_INDEX_TOO_LARGE));
 
     std::vector<int> wanted{data.m_nStartRow, 1};
     if (data.m_nItemTitleOption == 0)
@@ -102,7 +102,7 @@ Status ExcelSeriesReader::ReadHeader()
     // This pass goes over the whole sheet for its used columns; only the header rows need the
     // texts of their numbers.
     const std::vector<bool> noNumberTexts;
-    const bool read = workbook.ReadRows(m_sheet, [&](int row, const std::vector<sheet::RowCell>& cells) {
+    const sys::Status read = workbook.ReadRows(m_sheet, [&](int row, const std::vector<sheet::RowCell>& cells) {
         if (!cells.empty()) {
             first = first == 0 ? cells.front().column : std::min(first, cells.front().column);
             last = std::max(last, cells.back().column);
@@ -116,12 +116,12 @@ Status ExcelSeriesReader::ReadHeader()
         return true;
     }, &noNumberTexts);
     if (!read)
-        return Status::Fail(m_path, 0, workbook.Error());
+        return sys::Status::Fail(m_path, 0, read.problem().message);
     for (const auto& [row, header] : headerRows)
         if (row < data.m_nStartRow)
             NoteFormulasWithoutResult(header);
     if (last < 2 || last - first < 1)
-        return Status::Fail(m_path, 0, "the sheet has fewer than two used columns");
+        return sys::Status::Fail(m_path, 0, "the sheet has fewer than two used columns");
     m_firstColumn = first;
     m_lastColumn = last;
     m_firstValueColumn = m_stampColumn != first ? first : first + m_formatColumns;
@@ -132,7 +132,7 @@ Status ExcelSeriesReader::ReadHeader()
     return ReadItems(headerRows);
 }
 
-Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
+sys::Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
 {
     const CDataDescription& data = m_spec.m_DataDesc;
     std::vector<int> valueColumns;
@@ -141,7 +141,7 @@ Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
             valueColumns.push_back(x);
     m_itemCount = valueColumns.size();
     if (m_itemCount == 0)
-        return Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_NO_ITEM_COLUMN));
+        return sys::Status::Fail(m_path, data.m_nStartRow, res::LoadString(res::IDS_NO_ITEM_COLUMN));
     static const std::vector<sheet::RowCell> kNoCells;
     auto rowCells = [&](int row) -> const std::vector<sheet::RowCell>& {
         auto it = headerRows.find(row);
@@ -188,41 +188,41 @@ Status ExcelSeriesReader::ReadItems(const std::map<int, SheetRow>& headerRows)
             case 1:
                 part.target = part.cut(TextAt(rowCells(part.row), column));
                 if (part.target.empty())
-                    return Status::Fail(m_path, part.row, res::LoadString(part.emptyMessage));
+                    return sys::Status::Fail(m_path, part.row, res::LoadString(part.emptyMessage));
                 break;
             case 2: part.target = def ? def->*part.member : std::string(); break;
-            default: return Status::Fail(m_path, 0, "the template's item options must be 0, 1 or 2");
+            default: return sys::Status::Fail(m_path, 0, "the template's item options must be 0, 1 or 2");
             }
         }
         if (!IsValueTypeName(item.valueType))
-            return Status::Fail(m_path, data.m_nValueTypeRow,
+            return sys::Status::Fail(m_path, data.m_nValueTypeRow,
                                 res::LoadString(res::IDS_VALUE_TYPE_INVALID) + " '" + item.valueType + "'");
     }
 
     const CTimeDescription& time = m_spec.m_TimeDesc;
-    m_start = StampFields();
+    m_start = sys::DateTimeFields();
     switch (time.m_nDateTimeOption) {
     case 0:
         m_useFormat = time.m_bUseDTFormat != 0;
-        m_format = std::make_unique<DateFormat>(time.m_strDateTimeFormat);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strDateTimeFormat);
         break;
     case 1:
         m_useFormat = time.m_bUseTFormat != 0;
-        m_format = std::make_unique<DateFormat>(time.m_strTimeFormat, DateFormat::Reads::Time);
+        m_format = std::make_unique<sys::DateFormat>(time.m_strTimeFormat, sys::DateFormat::Reads::Time);
         m_start.year = 100;
-        if (!DateFormat("YYYY-MM-DD", DateFormat::Reads::Date).Read(time.m_strGlobalDate, m_start))
-            return Status::Fail(m_path, 0, "the template's global date '" + time.m_strGlobalDate + "' is not YYYY-MM-DD");
+        if (!sys::DateFormat("YYYY-MM-DD", sys::DateFormat::Reads::Date).Read(time.m_strGlobalDate, m_start))
+            return sys::Status::Fail(m_path, 0, "the template's global date '" + time.m_strGlobalDate + "' is not YYYY-MM-DD");
         break;
     case 2:
         m_useFormat = time.m_bUseDFormat != 0;
-        m_format = std::make_unique<DateFormat>(time.m_strDateFormat, DateFormat::Reads::Date);
-        if (!DateFormat("HH:mm:ss", DateFormat::Reads::Time).Read(time.m_strGlobalTime, m_start))
-            return Status::Fail(m_path, 0, "the template's global time '" + time.m_strGlobalTime + "' is not HH:mm:ss");
+        m_format = std::make_unique<sys::DateFormat>(time.m_strDateFormat, sys::DateFormat::Reads::Date);
+        if (!sys::DateFormat("HH:mm:ss", sys::DateFormat::Reads::Time).Read(time.m_strGlobalTime, m_start))
+            return sys::Status::Fail(m_path, 0, "the template's global time '" + time.m_strGlobalTime + "' is not HH:mm:ss");
         m_start.year = 100;
         break;
-    default: return Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
+    default: return sys::Status::Fail(m_path, 0, "the template's date/time option must be 0, 1 or 2");
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 void ExcelSeriesReader::Select(const std::vector<size_t>& items)
@@ -257,19 +257,19 @@ void ExcelSeriesReader::StartRows()
             m_changed.notify_all();
             return true;
         };
-        bool ok = workbook.Open(m_path);
-        if (ok)
-            ok = workbook.ReadRows(m_sheet, [&](int number, const std::vector<sheet::RowCell>& cells) {
+        sys::Status read = workbook.Open(m_path);
+        if (read)
+            read = workbook.ReadRows(m_sheet, [&](int number, const std::vector<sheet::RowCell>& cells) {
                 if (number < startRow)
                     return true;
                 batch.push_back(SheetRow{number, cells});
                 return batch.size() < kBatchRows || handOver();
             }, textColumns.empty() ? nullptr : &textColumns);
-        if (ok && !batch.empty())
+        if (read && !batch.empty())
             handOver();
         std::lock_guard<std::mutex> lock(m_mutex);
-        if (!ok && !m_stop)
-            m_producerError = workbook.Error();
+        if (!read && !m_stop)
+            m_producerError = read.problem().message;
         m_producerDone = true;
         m_changed.notify_all();
     });
@@ -405,7 +405,7 @@ ExcelSeriesReader::StampRead ExcelSeriesReader::ReadStamp(const SheetRow& sheetR
 {
     const CTimeDescription& time = m_spec.m_TimeDesc;
     const int option = time.m_nDateTimeOption;
-    StampFields fields = m_start;
+    sys::DateTimeFields fields = m_start;
     if (m_useFormat) {
         std::string joined;
         for (int w = 0; w < m_formatColumns; ++w)
@@ -435,7 +435,7 @@ ExcelSeriesReader::StampRead ExcelSeriesReader::ReadStamp(const SheetRow& sheetR
                 return StampRead::Unreadable;
             }
         } else {
-            StampFields parsed = option == 0 ? StampFields() : m_start;
+            sys::DateTimeFields parsed = option == 0 ? sys::DateTimeFields() : m_start;
             if (m_format->Read(cell->text, parsed))
                 value = StampFromFields(parsed);
         }
@@ -443,7 +443,7 @@ ExcelSeriesReader::StampRead ExcelSeriesReader::ReadStamp(const SheetRow& sheetR
             unreadable = cell->text;
             return StampRead::Unreadable;
         }
-        const StampFields cellFields = FieldsFromStamp(*value);
+        const sys::DateTimeFields cellFields = FieldsFromStamp(*value);
         if (option == 0)
             fields = cellFields;
         else if (option == 1)

@@ -28,7 +28,7 @@ public:
     explicit ExcelSeriesReader(const CSpecification& spec);
     ~ExcelSeriesReader() override;
 
-    Status Open(const std::string& path) override;
+    sys::Status Open(const std::string& path) override;
     bool Next(Row& row) override;
     void Select(const std::vector<size_t>& items) override;
     long Location() const override { return m_rowNumber; }
@@ -38,8 +38,8 @@ private:
         int number = 0;
         std::vector<sheet::RowCell> cells;
     };
-    Status ReadHeader();
-    Status ReadItems(const std::map<int, SheetRow>& headerRows);
+    sys::Status ReadHeader();
+    sys::Status ReadItems(const std::map<int, SheetRow>& headerRows);
     void StartRows();
     std::vector<bool> TextColumns() const;
     bool NextSheetRow(SheetRow& sheetRow);
@@ -68,9 +68,9 @@ private:
     std::string m_deleteValue;
     std::vector<int> m_slotOfColumn; // sheet column -> place in the row, -1 when not a selected value
     NumberReader m_numbers{"."};
-    std::unique_ptr<DateFormat> m_format;
+    std::unique_ptr<sys::DateFormat> m_format;
     bool m_useFormat = false;
-    StampFields m_start;
+    sys::DateTimeFields m_start;
     long m_rowNumber = 0; // the sheet row last read
     std::uint64_t m_rowsRead = 0;
     bool m_dataEnded = false;

@@ -1,5 +1,7 @@
 #include "converter/NumberText.h"
 
+#include "delimited/Dialect.h"
+
 #include <charconv>
 #include <cmath>
 #include <cstdint>
@@ -251,10 +253,6 @@ bool ReadPlainDecimal(std::string_view text, double& value)
 NumberReader::NumberReader(std::string_view decimalSeparator)
     : m_separator(decimalSeparator), m_pointSeparator(decimalSeparator == ".")
 {
-    if (m_separator == ".")
-        m_other = ',';
-    else if (m_separator == ",")
-        m_other = '.';
 }
 
 ValueText NumberReader::Read(std::string_view field, double& value) const
@@ -270,15 +268,10 @@ ValueText NumberReader::Read(std::string_view field, double& value) const
     if (b == e)
         return ValueText::Empty;
     std::string_view text = field.substr(b, e - b);
-    if (m_pointSeparator) {
-        if (ReadPlainDecimal(text, value))
-            return ValueText::Number;
-        if (text.find('.') == std::string_view::npos && text.find(',') != std::string_view::npos)
-            return ValueText::WrongSeparator;
-    } else if (m_other != 0 && text.find(m_separator) == std::string_view::npos &&
-               text.find(m_other) != std::string_view::npos) {
+    if (m_pointSeparator && ReadPlainDecimal(text, value))
+        return ValueText::Number;
+    if (delimited::UsesOtherDecimalSeparator(text, m_separator))
         return ValueText::WrongSeparator;
-    }
     if (text.front() == '+')
         text.remove_prefix(1);
 

@@ -18,7 +18,7 @@ inline constexpr unsigned long long kExactMantissa = 1ull << 53;
 enum class ValueText {
     Number,          // `value` holds it
     Empty,           // blank field: a missing value
-    WrongSeparator,  // uses the other of "." and "," than the template's separator
+    WrongSeparator,  // uses the other of "." and "," than the template's separator (delimited::Dialect)
     NotANumber,
 };
 
@@ -33,7 +33,6 @@ public:
 private:
     std::string m_separator;
     bool m_pointSeparator = false;
-    char m_other = 0; // the separator that must not appear when "." or "," is in force; 0 for none
 };
 
 // Reads "-12.345" (an optional minus, at most 15 digits, an optional point, no exponent) from the

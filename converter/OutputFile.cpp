@@ -103,12 +103,12 @@ OutputFile::~OutputFile()
         ::close(m_fd);
 }
 
-Status OutputFile::Create()
+sys::Status OutputFile::Create()
 {
     PartFiles& registry = Registry();
     std::lock_guard<std::mutex> lock(registry.mutex);
     if (registry.stopping)
-        return Status::Fail(m_final, 0, "the run is stopping");
+        return sys::Status::Fail(m_final, 0, "the run is stopping");
     const std::string folder = sys::FolderOf(m_final);
     const size_t maxName = sys::MaxNameLength(folder);
     for (int attempt = 0; attempt < kNameAttempts; ++attempt) {
@@ -121,37 +121,37 @@ Status OutputFile::Create()
             const std::string byDescriptor = "/proc/self/fd/" + std::to_string(fd);
             m_writerPath = ::access(byDescriptor.c_str(), W_OK) == 0 ? byDescriptor : path;
             registry.paths.insert(path);
-            return Status::Ok();
+            return sys::Status::Ok();
         }
         if (errno != EEXIST)
-            return Status::Fail(m_final, 0, "cannot create the file (" + name + " in " + (folder.empty() ? "." : folder) +
+            return sys::Status::Fail(m_final, 0, "cannot create the file (" + name + " in " + (folder.empty() ? "." : folder) +
                                                 "): " + std::strerror(errno));
     }
-    return Status::Fail(m_final, 0, "cannot create the file: every temporary name beside it is taken");
+    return sys::Status::Fail(m_final, 0, "cannot create the file: every temporary name beside it is taken");
 }
 
-Status OutputFile::Commit()
+sys::Status OutputFile::Commit()
 {
     PartFiles& registry = Registry();
     std::lock_guard<std::mutex> lock(registry.mutex);
     if (registry.stopping)
-        return Status::Fail(m_final, 0, "the run is stopping");
+        return sys::Status::Fail(m_final, 0, "the run is stopping");
     struct stat written {}, named {};
     if (::fstat(m_fd, &written) != 0 || ::lstat(m_temporary.c_str(), &named) != 0 || written.st_dev != named.st_dev ||
         written.st_ino != named.st_ino)
-        return Status::Fail(m_final, 0, "the part file " + m_temporary + " was replaced while the output was written");
+        return sys::Status::Fail(m_final, 0, "the part file " + m_temporary + " was replaced while the output was written");
     struct stat old {};
     if (::lstat(m_final.c_str(), &old) == 0) {
         if (!S_ISREG(old.st_mode))
-            return Status::Fail(m_final, 0, std::string("it is ") + sys::Describe(sys::KindOf(m_final)) +
+            return sys::Status::Fail(m_final, 0, std::string("it is ") + sys::Describe(sys::KindOf(m_final)) +
                                                 " now; only a regular file is replaced");
         ::fchmod(m_fd, old.st_mode & 0777);
     }
     if (std::rename(m_temporary.c_str(), m_final.c_str()) != 0)
-        return Status::Fail(m_final, 0, std::string("cannot move the finished output into place: ") + std::strerror(errno));
+        return sys::Status::Fail(m_final, 0, std::string("cannot move the finished output into place: ") + std::strerror(errno));
     m_committed = true;
     registry.paths.erase(m_temporary);
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 size_t OutputFile::RemoveAllTemporaries()

@@ -4,7 +4,7 @@
 // destroys an old one. The temporary ("part") file is hidden and names the system start and the
 // process writing it, ".<name>.part-<boot>-<pid>-<n>", so that a later run can tell the leftovers of
 // a killed process from the files of one still at work.
-#include "converter/Problem.h"
+#include "platform/system/Status.h"
 
 #include <string>
 #include <vector>
@@ -19,7 +19,7 @@ public:
     OutputFile& operator=(const OutputFile&) = delete;
 
     // Creates the part file in the final file's folder, exclusively and never through a link.
-    Status Create();
+    sys::Status Create();
     // The part file's name beside the final file; empty until Create succeeds.
     const std::string& TemporaryPath() const { return m_temporary; }
     // Where the writer opens the part file: the file this object created, through its open
@@ -30,7 +30,7 @@ public:
     // Renames the part file over the final path. Only a regular file is replaced (it keeps its
     // permission bits); anything else standing there by now is left alone and the commit fails, as
     // it does when the part file's name no longer names the file this object created.
-    Status Commit();
+    sys::Status Commit();
 
     // Removes every part file being written and refuses new ones and commits from then on: the
     // run is stopping. Returns how many were removed. It takes a lock, so it is for a thread that

@@ -17,12 +17,6 @@ namespace {
 constexpr size_t kValuesPerBlock = 64 * 1024;
 
 // The reader's messages may already name the file; the problem names it once.
-std::string WithoutPath(const std::string& message, const std::string& path)
-{
-    const std::string prefix = path + ": ";
-    return message.compare(0, prefix.size(), prefix) == 0 ? message.substr(prefix.size()) : message;
-}
-
 // std::llround without the library call where the fraction is exact (below 2^52 the integer part
 // of a double and what remains are exact); the same result everywhere.
 long long RoundHalfAway(double x)
@@ -49,33 +43,33 @@ bool ToSeconds(double time, double secondsPerUnit, Stamp& seconds)
 RbxSeriesReader::RbxSeriesReader() : m_reader(std::make_unique<rbx::CRbxReader>()) {}
 RbxSeriesReader::~RbxSeriesReader() = default;
 
-Status RbxSeriesReader::Open(const std::string& path)
+sys::Status RbxSeriesReader::Open(const std::string& path)
 {
     m_path = path;
-    if (!m_reader->Open(path))
-        return m_status = Status::Fail(path, 0, WithoutPath(m_reader->Error(), path));
+    if (const sys::Status opened = m_reader->Open(path); !opened)
+        return m_status = sys::Status::Fail(path, 0, opened.problem().message);
     const rbx::FileHeader& header = m_reader->Header();
     const rbx::TimeAxis& axis = header.axis;
     if (!rbx::IsCalendarAxis(axis.type))
-        return m_status = Status::Fail(path, 0, "the file has a relative time axis (type " + std::to_string(axis.type) +
+        return m_status = sys::Status::Fail(path, 0, "the file has a relative time axis (type " + std::to_string(axis.type) +
                                                     "); only calendar time axes give time stamps");
-    StampFields start;
+    sys::DateTimeFields start;
     start.year = 100;
-    DateFormat("YYYY-MM-DD", DateFormat::Reads::Date).Read(axis.startDate, start);
+    sys::DateFormat("YYYY-MM-DD", sys::DateFormat::Reads::Date).Read(axis.startDate, start);
     std::optional<Stamp> base;
-    if (DateFormat("HH:mm:ss", DateFormat::Reads::Time).Read(axis.startTime, start))
+    if (sys::DateFormat("HH:mm:ss", sys::DateFormat::Reads::Time).Read(axis.startTime, start))
         base = StampFromFields(start);
     if (!base)
-        return m_status = Status::Fail(path, 0, "the time axis starts at '" + axis.startDate + " " + axis.startTime +
+        return m_status = sys::Status::Fail(path, 0, "the time axis starts at '" + axis.startDate + " " + axis.startTime +
                                                     "', which is not a calendar date and time");
     m_start = *base;
     if (!units::Convert(axis.unitKey, 1.0, units::kUnitSecond, m_secondsPerUnit))
-        return m_status = Status::Fail(path, 0, "the time axis unit " + std::to_string(axis.unitKey) +
+        return m_status = sys::Status::Fail(path, 0, "the time axis unit " + std::to_string(axis.unitKey) +
                                                     " is not a unit of time in the unit catalogue");
     // The start offset counts in the axis unit from the start date and time.
     Stamp startOffset = 0;
     if (!ToSeconds(axis.startOffset, m_secondsPerUnit, startOffset))
-        return m_status = Status::Fail(path, 0, "the time axis start offset lies too far from its start date for a time stamp");
+        return m_status = sys::Status::Fail(path, 0, "the time axis start offset lies too far from its start date for a time stamp");
     m_start += startOffset;
 
     m_header = SeriesHeader();
@@ -83,7 +77,7 @@ Status RbxSeriesReader::Open(const std::string& path)
     size_t offset = 8; // after the step's time
     for (const rbx::ItemInfo& item : header.items) {
         if (item.axisType != rbx::kScalarItem || item.elementCount != 1)
-            return m_status = Status::Fail(path, 0, "item '" + item.name +
+            return m_status = sys::Status::Fail(path, 0, "item '" + item.name +
                                                         "' holds several values per time step; only scalar items convert");
         ItemInfo info;
         info.name = item.name;
@@ -124,7 +118,7 @@ bool RbxSeriesReader::FillBlock()
 {
     size_t got = 0;
     if (!m_reader->ReadRawSteps(m_blockSteps, m_records.data(), got)) {
-        m_status = Status::Fail(m_path, 0, WithoutPath(m_reader->Error(), m_path) + " (after " + std::to_string(m_stepIndex) + " time steps)");
+        m_status = sys::Status::Fail(m_path, 0, m_reader->status().problem().message + " (after " + std::to_string(m_stepIndex) + " time steps)");
         return false;
     }
     m_inBlock = got;

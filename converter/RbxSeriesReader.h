@@ -17,7 +17,7 @@ public:
     RbxSeriesReader();
     ~RbxSeriesReader() override;
 
-    Status Open(const std::string& path) override;
+    sys::Status Open(const std::string& path) override;
     bool Next(Row& row) override;
     void Select(const std::vector<size_t>& items) override;
     std::uint64_t BytesConsumed() const override;

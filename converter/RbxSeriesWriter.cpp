@@ -35,7 +35,7 @@ rbx::ItemInfo DescribeItem(const ItemInfo& item)
 RbxSeriesWriter::RbxSeriesWriter() : m_writer(std::make_unique<rbx::CRbxWriter>()) {}
 RbxSeriesWriter::~RbxSeriesWriter() = default;
 
-Status RbxSeriesWriter::Begin(const std::string& path, const SeriesHeader& header, const std::string& title)
+sys::Status RbxSeriesWriter::Begin(const std::string& path, const SeriesHeader& header, const std::string& title)
 {
     m_path = path;
     m_definition = std::make_unique<rbx::FileDefinition>();
@@ -49,44 +49,44 @@ Status RbxSeriesWriter::Begin(const std::string& path, const SeriesHeader& heade
     // every step time is a whole number of seconds.
     std::FILE* probe = std::fopen(path.c_str(), "wb");
     if (!probe)
-        return Status::Fail(path, 0, std::string("cannot create the file: ") + std::strerror(errno));
+        return sys::Status::Fail(path, 0, std::string("cannot create the file: ") + std::strerror(errno));
     std::fclose(probe);
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status RbxSeriesWriter::OpenWriter()
+sys::Status RbxSeriesWriter::OpenWriter()
 {
-    if (!m_writer->Open(m_path, *m_definition))
-        return Status::Fail(m_path, 0, m_writer->Error());
-    return Status::Ok();
+    if (const sys::Status opened = m_writer->Open(m_path, *m_definition); !opened)
+        return sys::Status::Fail(m_path, 0, opened.problem().Describe());
+    return sys::Status::Ok();
 }
 
-Status RbxSeriesWriter::Write(const Row& row)
+sys::Status RbxSeriesWriter::Write(const Row& row)
 {
     if (m_first) {
         m_start = row.stamp;
         m_definition->calendarStart = COleDateTime::FromUnixSeconds(row.stamp);
-        if (Status opened = OpenWriter(); !opened)
+        if (sys::Status opened = OpenWriter(); !opened)
             return opened;
         m_first = false;
     } else if (row.stamp <= m_previous) {
-        return Status::Fail(m_path, 0, "time stamps must increase: " + FormatStamp(row.stamp) + " follows " +
+        return sys::Status::Fail(m_path, 0, "time stamps must increase: " + FormatStamp(row.stamp) + " follows " +
                                            FormatStamp(m_previous));
     }
     m_previous = row.stamp;
     if (!m_writer->WriteStep(static_cast<double>(row.stamp - m_start), row.values.data()))
-        return Status::Fail(m_path, 0, m_writer->Error());
-    return Status::Ok();
+        return sys::Status::Fail(m_path, 0, m_writer->status().problem().Describe());
+    return sys::Status::Ok();
 }
 
-Status RbxSeriesWriter::Finish()
+sys::Status RbxSeriesWriter::Finish()
 {
     if (m_first)
-        if (Status opened = OpenWriter(); !opened)
+        if (sys::Status opened = OpenWriter(); !opened)
             return opened;
-    if (!m_writer->Close())
-        return Status::Fail(m_path, 0, m_writer->Error());
-    return Status::Ok();
+    if (const sys::Status closed = m_writer->Close(); !closed)
+        return sys::Status::Fail(m_path, 0, closed.problem().Describe());
+    return sys::Status::Ok();
 }
 
 } // namespace converter

@@ -17,12 +17,12 @@ class RbxSeriesWriter : public SeriesWriter {
 public:
     RbxSeriesWriter();
     ~RbxSeriesWriter() override;
-    Status Begin(const std::string& path, const SeriesHeader& header, const std::string& title) override;
-    Status Write(const Row& row) override;
-    Status Finish() override;
+    sys::Status Begin(const std::string& path, const SeriesHeader& header, const std::string& title) override;
+    sys::Status Write(const Row& row) override;
+    sys::Status Finish() override;
 
 private:
-    Status OpenWriter();
+    sys::Status OpenWriter();
 
     std::unique_ptr<rbx::CRbxWriter> m_writer;
     std::unique_ptr<rbx::FileDefinition> m_definition;

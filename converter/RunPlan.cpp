@@ -37,8 +37,8 @@ std::string RunPlan::FileTheRunReads(const JobSetup& setup, const std::string& p
 
 RunPlan::RunPlan(const JobSetup& setup, const std::string& logPath, bool judgeOutputs)
 {
-    const Format in = static_cast<Format>(setup.inputFormat);
-    const Format out = static_cast<Format>(setup.outputFormat);
+    const sys::FileFormat in = static_cast<sys::FileFormat>(setup.inputFormat);
+    const sys::FileFormat out = static_cast<sys::FileFormat>(setup.outputFormat);
     if (setup.inputType == 1)
         m_files.push_back({setup.inputFile, setup.outputFile, {}, false});
     else if (setup.inputType == 2 && !setup.inputFolder.empty())
@@ -53,7 +53,7 @@ RunPlan::RunPlan(const JobSetup& setup, const std::string& logPath, bool judgeOu
         JudgeOutputs();
 }
 
-void RunPlan::ListFolder(const JobSetup& setup, Format in, Format out)
+void RunPlan::ListFolder(const JobSetup& setup, sys::FileFormat in, sys::FileFormat out)
 {
     std::optional<std::vector<std::string>> names = sys::ListFolder(setup.inputFolder);
     if (!names)
@@ -66,10 +66,10 @@ void RunPlan::ListFolder(const JobSetup& setup, Format in, Format out)
             continue;
         PlannedFile file;
         file.input = path;
-        file.output = sys::JoinPath(setup.outputFolder, BaseName(path) + OutputExtension(out));
+        file.output = sys::JoinPath(setup.outputFolder, BaseName(path) + sys::FormatInfo(out).outputExtension);
         if (!attributes->readable)
             file.refusal = "the file cannot be read (permission)";
-        else if (!AcceptsExtension(in, path))
+        else if (!sys::IsInputOf(in, path))
             continue; // not a file of the input format: not part of the conversion
         m_files.push_back(file);
     }

@@ -51,7 +51,7 @@ private:
     };
 
     RunPlan(const JobSetup& setup, const std::string& logPath, bool judgeOutputs);
-    void ListFolder(const JobSetup& setup, Format in, Format out);
+    void ListFolder(const JobSetup& setup, sys::FileFormat in, sys::FileFormat out);
     void Protect(const std::string& path, const std::string& what, bool isLog = false);
     void JudgeOutputs();
     const OutputFolder& FolderOf(const std::string& output);

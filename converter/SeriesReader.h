@@ -1,7 +1,7 @@
 #pragma once
 // A reader gives the header of a time-series file and then its rows one at a time, so that a
 // conversion never holds more than one row.
-#include "converter/Problem.h"
+#include "platform/system/Status.h"
 #include "converter/TimeSeries.h"
 
 #include <cstdint>
@@ -15,7 +15,7 @@ public:
     virtual ~SeriesReader() = default;
 
     // Opens the file and reads what describes its items. Rows then come from Next.
-    virtual Status Open(const std::string& path) = 0;
+    virtual sys::Status Open(const std::string& path) = 0;
     // The next row, with one value per selected item; false at the end or on a problem (status()).
     virtual bool Next(Row& row) = 0;
     // How far the reader has come, for progress reports.
@@ -31,14 +31,14 @@ public:
     // Restricts the rows to these item positions (from 0, in this order). Call after Open.
     virtual void Select(const std::vector<size_t>& items) { m_selection = items; }
     const std::vector<size_t>& Selection() const { return m_selection; }
-    const Status& status() const { return m_status; }
+    const sys::Status& status() const { return m_status; }
 
     // Lets Next pass over a data row that does not read (a value that is no number, a line of
     // another shape) instead of stopping there: the row's problem is kept in Rejected() and the
     // reading goes on. Dry runs report every such row of a file; a conversion keeps this off.
     void PassOverFaultyRows(bool on) { m_passOverFaults = on; }
     // The rows passed over, the first kKeptRejections of them; RejectedCount() counts all.
-    const std::vector<Problem>& Rejected() const { return m_rejected; }
+    const std::vector<sys::Problem>& Rejected() const { return m_rejected; }
     std::uint64_t RejectedCount() const { return m_rejectedCount; }
     static constexpr size_t kKeptRejections = 1000;
 
@@ -52,24 +52,24 @@ protected:
         if (m_rejected.size() < kKeptRejections)
             m_rejected.push_back(m_status.problem());
         ++m_rejectedCount;
-        m_status = Status::Ok();
+        m_status = sys::Status::Ok();
         return true;
     }
 
     bool Fail(const std::string& file, long line, const std::string& message, int column = 0)
     {
-        m_status = Status::Fail(file, line, message, column);
+        m_status = sys::Status::Fail(file, line, message, column);
         return false;
     }
 
     SeriesHeader m_header;
     std::vector<size_t> m_selection;
-    Status m_status;
+    sys::Status m_status;
     std::vector<std::string> m_notes;
 
 private:
     bool m_passOverFaults = false;
-    std::vector<Problem> m_rejected;
+    std::vector<sys::Problem> m_rejected;
     std::uint64_t m_rejectedCount = 0;
 };
 

@@ -27,7 +27,7 @@ constexpr ClockPairs kClockPairs;
 
 char* FormatStamp(Stamp stamp, char* out)
 {
-    const StampFields f = FieldsFromStamp(stamp);
+    const sys::DateTimeFields f = FieldsFromStamp(stamp);
     const int year = f.year < 0 ? 0 : (f.year > 9999 ? 9999 : f.year);
     out = TwoDigits(year / 100, out);
     out = TwoDigits(year % 100, out);

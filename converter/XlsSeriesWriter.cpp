@@ -308,15 +308,15 @@ std::string SummaryInformation(const std::string& title)
 
 } // namespace
 
-Status XlsSeriesWriter::Begin(const std::string& path, const SeriesHeader& header, const std::string& title)
+sys::Status XlsSeriesWriter::Begin(const std::string& path, const SeriesHeader& header, const std::string& title)
 {
     m_path = path;
     m_title = title;
     m_columns = static_cast<unsigned>(header.items.size() + 1);
     if (header.items.size() + 1 > kMaxColumns)
-        return Status::Fail(path, 0, std::to_string(header.items.size()) + " items do not fit the " +
+        return sys::Status::Fail(path, 0, std::to_string(header.items.size()) + " items do not fit the " +
                                          std::to_string(kMaxColumns - 1) + " value columns of an .xls sheet (.xlsx holds 16,383)");
-    if (Status opened = m_file.Open(path); !opened)
+    if (sys::Status opened = m_file.Open(path); !opened)
         return opened;
     m_records = Globals();
     AppendRecord(m_records, kBof, Bof(0x0010));
@@ -326,7 +326,7 @@ Status XlsSeriesWriter::Begin(const std::string& path, const SeriesHeader& heade
     return WriteHeaderRows(header);
 }
 
-Status XlsSeriesWriter::WriteHeaderRows(const SeriesHeader& header)
+sys::Status XlsSeriesWriter::WriteHeaderRows(const SeriesHeader& header)
 {
     for (size_t item = 0; item < header.items.size(); ++item)
         AppendLabel(m_records, 0, static_cast<unsigned>(item + 1), sheet_layout::MetadataText(header.items[item]));
@@ -338,19 +338,19 @@ Status XlsSeriesWriter::WriteHeaderRows(const SeriesHeader& header)
     return Flush(false);
 }
 
-Status XlsSeriesWriter::Flush(bool always)
+sys::Status XlsSeriesWriter::Flush(bool always)
 {
     if (!always && m_records.size() < kFlushBytes)
-        return Status::Ok();
-    Status appended = m_file.Append(m_records);
+        return sys::Status::Ok();
+    sys::Status appended = m_file.Append(m_records);
     m_records.clear();
     return appended;
 }
 
-Status XlsSeriesWriter::Write(const Row& row)
+sys::Status XlsSeriesWriter::Write(const Row& row)
 {
     if (m_rows >= kMaxRows)
-        return Status::Fail(m_path, 0, "more rows than an .xls sheet holds (" + std::to_string(kMaxRows) +
+        return sys::Status::Fail(m_path, 0, "more rows than an .xls sheet holds (" + std::to_string(kMaxRows) +
                                            " with the two header rows); .xlsx holds 1,048,576");
     if (const std::optional<double> serial = SheetSerialFromStamp(row.stamp))
         AppendNumber(m_records, m_rows, 0, kDateCell, *serial);
@@ -364,13 +364,13 @@ Status XlsSeriesWriter::Write(const Row& row)
     return Flush(false);
 }
 
-Status XlsSeriesWriter::Finish()
+sys::Status XlsSeriesWriter::Finish()
 {
     m_records += Window2();
     AppendRecord(m_records, kEof, "");
-    if (Status flushed = Flush(true); !flushed)
+    if (sys::Status flushed = Flush(true); !flushed)
         return flushed;
-    if (Status dimensions = m_file.Patch(m_dimensionsAt, Dimensions(m_rows, m_columns)); !dimensions)
+    if (sys::Status dimensions = m_file.Patch(m_dimensionsAt, Dimensions(m_rows, m_columns)); !dimensions)
         return dimensions;
     std::vector<CompoundFileWriter::Stream> others;
     if (!m_title.empty())

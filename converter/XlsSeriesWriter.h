@@ -16,16 +16,16 @@ namespace converter {
 
 class XlsSeriesWriter : public SeriesWriter {
 public:
-    Status Begin(const std::string& path, const SeriesHeader& header, const std::string& title) override;
-    Status Write(const Row& row) override;
-    Status Finish() override;
+    sys::Status Begin(const std::string& path, const SeriesHeader& header, const std::string& title) override;
+    sys::Status Write(const Row& row) override;
+    sys::Status Finish() override;
 
     static constexpr unsigned kMaxRows = 65536;
     static constexpr unsigned kMaxColumns = 256;
 
 private:
-    Status WriteHeaderRows(const SeriesHeader& header);
-    Status Flush(bool always);
+    sys::Status WriteHeaderRows(const SeriesHeader& header);
+    sys::Status Flush(bool always);
 
     CompoundFileWriter m_file;
     std::string m_path;

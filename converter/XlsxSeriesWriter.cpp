@@ -62,13 +62,13 @@ private:
     std::unordered_map<std::string, int> m_index;
 };
 
-Status XlsxSeriesWriter::Begin(const std::string& path, const SeriesHeader& header, const std::string& title)
+sys::Status XlsxSeriesWriter::Begin(const std::string& path, const SeriesHeader& header, const std::string& title)
 {
     m_path = path;
     if (header.items.size() + 1 > kMaxColumns)
-        return Status::Fail(path, 0, std::to_string(header.items.size()) + " items do not fit the " +
+        return sys::Status::Fail(path, 0, std::to_string(header.items.size()) + " items do not fit the " +
                                          std::to_string(kMaxColumns - 1) + " value columns of a worksheet");
-    if (Status opened = m_zip.Open(path); !opened)
+    if (sys::Status opened = m_zip.Open(path); !opened)
         return opened;
     m_sheet.resize(kSheetBufferBytes);
     m_cellOpenings.clear();
@@ -80,12 +80,12 @@ Status XlsxSeriesWriter::Begin(const std::string& path, const SeriesHeader& head
         m_cellOpenings.push_back(slot);
     }
     const HeaderCells cells(header);
-    if (Status parts = WritePackageParts(cells, title); !parts)
+    if (sys::Status parts = WritePackageParts(cells, title); !parts)
         return parts;
     return WriteHeaderRows(cells);
 }
 
-Status XlsxSeriesWriter::WritePackageParts(const HeaderCells& cells, const std::string& title)
+sys::Status XlsxSeriesWriter::WritePackageParts(const HeaderCells& cells, const std::string& title)
 {
     const std::pair<const char*, std::string> parts[] = {
         {"[Content_Types].xml", xlsx::ContentTypes()},
@@ -98,13 +98,13 @@ Status XlsxSeriesWriter::WritePackageParts(const HeaderCells& cells, const std::
         {"xl/sharedStrings.xml", xlsx::SharedStrings(cells.strings, cells.references)},
     };
     for (const auto& [name, text] : parts)
-        if (Status added = m_zip.AddEntry(name, text); !added)
+        if (sys::Status added = m_zip.AddEntry(name, text); !added)
             return added;
     // The used range is not known before the last row: a placeholder of the same length for now.
     return m_zip.BeginEntry("xl/worksheets/sheet1.xml", xlsx::SheetHead(LastCell()));
 }
 
-Status XlsxSeriesWriter::WriteHeaderRows(const HeaderCells& cells)
+sys::Status XlsxSeriesWriter::WriteHeaderRows(const HeaderCells& cells)
 {
     auto textCell = [this](unsigned column, const char* row, int index) {
         if (index == kNoString)
@@ -116,7 +116,7 @@ Status XlsxSeriesWriter::WriteHeaderRows(const HeaderCells& cells)
         m_used += cell.size();
     };
     for (unsigned row = 1; row <= 2; ++row) {
-        if (Status room = Reserve(kRowBytes + m_cellOpenings.size() * kCellBytes); !room)
+        if (sys::Status room = Reserve(kRowBytes + m_cellOpenings.size() * kCellBytes); !room)
             return room;
         const char* number = row == 1 ? "1" : "2";
         const std::string open = std::string("<row r=\"") + number + "\">";
@@ -128,32 +128,32 @@ Status XlsxSeriesWriter::WriteHeaderRows(const HeaderCells& cells)
             textCell(static_cast<unsigned>(item + 1), number, row == 1 ? cells.metadata[item] : cells.names[item]);
         m_used = static_cast<size_t>(Copy(m_sheet.data() + m_used, "</row>") - m_sheet.data());
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status XlsxSeriesWriter::Reserve(size_t bytes)
+sys::Status XlsxSeriesWriter::Reserve(size_t bytes)
 {
     if (m_used + bytes + kSlack <= m_sheet.size())
-        return Status::Ok();
-    if (Status flushed = FlushSheet(); !flushed)
+        return sys::Status::Ok();
+    if (sys::Status flushed = FlushSheet(); !flushed)
         return flushed;
     if (bytes + kSlack > m_sheet.size())
         m_sheet.resize(bytes + kSlack);
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status XlsxSeriesWriter::FlushSheet()
+sys::Status XlsxSeriesWriter::FlushSheet()
 {
     const std::string_view pending(m_sheet.data(), m_used);
     m_used = 0;
     return m_zip.Append(pending);
 }
 
-Status XlsxSeriesWriter::Write(const Row& row)
+sys::Status XlsxSeriesWriter::Write(const Row& row)
 {
     if (m_row >= kMaxRows)
-        return Status::Fail(m_path, 0, "more rows than a worksheet holds (" + std::to_string(kMaxRows) + ")");
-    if (Status room = Reserve(kRowBytes + m_cellOpenings.size() * kCellBytes); !room)
+        return sys::Status::Fail(m_path, 0, "more rows than a worksheet holds (" + std::to_string(kMaxRows) + ")");
+    if (sys::Status room = Reserve(kRowBytes + m_cellOpenings.size() * kCellBytes); !room)
         return room;
     char number[16] = {};
     const size_t digits = static_cast<size_t>(std::to_chars(number, number + sizeof number, m_row + 1).ptr - number);
@@ -193,7 +193,7 @@ Status XlsxSeriesWriter::Write(const Row& row)
     out = Copy(out, "</row>");
     m_used = static_cast<size_t>(out - m_sheet.data());
     ++m_row;
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
 std::string XlsxSeriesWriter::LastCell() const
@@ -201,13 +201,13 @@ std::string XlsxSeriesWriter::LastCell() const
     return xlsx::ColumnName(static_cast<unsigned>(m_cellOpenings.size())) + std::to_string(m_row);
 }
 
-Status XlsxSeriesWriter::Finish()
+sys::Status XlsxSeriesWriter::Finish()
 {
-    if (Status flushed = FlushSheet(); !flushed)
+    if (sys::Status flushed = FlushSheet(); !flushed)
         return flushed;
-    if (Status tail = m_zip.Append(xlsx::SheetTail()); !tail)
+    if (sys::Status tail = m_zip.Append(xlsx::SheetTail()); !tail)
         return tail;
-    if (Status ended = m_zip.EndEntry(xlsx::SheetHead(LastCell())); !ended)
+    if (sys::Status ended = m_zip.EndEntry(xlsx::SheetHead(LastCell())); !ended)
         return ended;
     return m_zip.Close();
 }

@@ -12,20 +12,20 @@ namespace converter {
 
 class XlsxSeriesWriter : public SeriesWriter {
 public:
-    Status Begin(const std::string& path, const SeriesHeader& header, const std::string& title) override;
-    Status Write(const Row& row) override;
-    Status Finish() override;
+    sys::Status Begin(const std::string& path, const SeriesHeader& header, const std::string& title) override;
+    sys::Status Write(const Row& row) override;
+    sys::Status Finish() override;
 
     static constexpr unsigned kMaxRows = 1048576;
     static constexpr unsigned kMaxColumns = 16384;
 
 private:
     struct HeaderCells;
-    Status WritePackageParts(const HeaderCells& cells, const std::string& title);
-    Status WriteHeaderRows(const HeaderCells& cells);
+    sys::Status WritePackageParts(const HeaderCells& cells, const std::string& title);
+    sys::Status WriteHeaderRows(const HeaderCells& cells);
     // Makes room for `bytes` more in the sheet buffer, handing what it holds to the package.
-    Status Reserve(size_t bytes);
-    Status FlushSheet();
+    sys::Status Reserve(size_t bytes);
+    sys::Status FlushSheet();
     std::string LastCell() const;
 
     ZipWriter m_zip;

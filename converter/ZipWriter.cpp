@@ -42,31 +42,31 @@ ZipWriter::~ZipWriter()
         deflateEnd(m_zip.get());
 }
 
-Status ZipWriter::Failed(Status status)
+sys::Status ZipWriter::Failed(sys::Status status)
 {
     if (!status)
         m_failed = true;
     return status;
 }
 
-Status ZipWriter::Fail(const std::string& message)
+sys::Status ZipWriter::Fail(const std::string& message)
 {
     return Failed(m_file.Fail(message));
 }
 
-Status ZipWriter::Output(const void* data, size_t size)
+sys::Status ZipWriter::Output(const void* data, size_t size)
 {
     return Failed(m_file.Write(data, size));
 }
 
-Status ZipWriter::WriteAt(std::uint64_t offset, const void* data, size_t size)
+sys::Status ZipWriter::WriteAt(std::uint64_t offset, const void* data, size_t size)
 {
     return Failed(m_file.WriteAt(offset, data, size));
 }
 
-Status ZipWriter::Open(const std::string& path)
+sys::Status ZipWriter::Open(const std::string& path)
 {
-    if (Status opened = Failed(m_file.Open(path)); !opened)
+    if (sys::Status opened = Failed(m_file.Open(path)); !opened)
         return opened;
     *m_zip = z_stream{};
     // Negative window bits: raw deflate, the zip entry carries its own CRC and sizes.
@@ -74,19 +74,19 @@ Status ZipWriter::Open(const std::string& path)
         return Fail("cannot start the compressor");
     m_zipReady = true;
     DosNow(m_dosTime, m_dosDate);
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status ZipWriter::AddEntry(const std::string& name, std::string_view data)
+sys::Status ZipWriter::AddEntry(const std::string& name, std::string_view data)
 {
-    if (Status begun = BeginEntry(name); !begun)
+    if (sys::Status begun = BeginEntry(name); !begun)
         return begun;
-    if (Status appended = Append(data); !appended)
+    if (sys::Status appended = Append(data); !appended)
         return appended;
     return EndEntry();
 }
 
-Status ZipWriter::BeginEntry(const std::string& name, std::string_view head)
+sys::Status ZipWriter::BeginEntry(const std::string& name, std::string_view head)
 {
     if (m_failed || !m_file.IsOpen())
         return Fail("the package is not open for writing");
@@ -100,7 +100,7 @@ Status ZipWriter::BeginEntry(const std::string& name, std::string_view head)
     m_restCrc = 0;
     if (deflateReset(m_zip.get()) != Z_OK)
         return Fail("cannot restart the compressor");
-    if (Status header = WriteLocalHeader(m_current); !header)
+    if (sys::Status header = WriteLocalHeader(m_current); !header)
         return header;
     if (!head.empty()) {
         // A stored block that is not the last: its bytes appear in the file as they are.
@@ -108,16 +108,16 @@ Status ZipWriter::BeginEntry(const std::string& name, std::string_view head)
         block += '\0';
         Append16(block, static_cast<std::uint32_t>(head.size()));
         Append16(block, static_cast<std::uint32_t>(~head.size() & 0xFFFF));
-        if (Status out = Output(block.data(), block.size()); !out)
+        if (sys::Status out = Output(block.data(), block.size()); !out)
             return out;
         m_headOffset = m_file.Size();
-        if (Status out = Output(head.data(), head.size()); !out)
+        if (sys::Status out = Output(head.data(), head.size()); !out)
             return out;
     }
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status ZipWriter::Append(std::string_view data)
+sys::Status ZipWriter::Append(std::string_view data)
 {
     if (m_failed || !m_streaming)
         return Fail("no part is open for writing");
@@ -128,7 +128,7 @@ Status ZipWriter::Append(std::string_view data)
     return Deflate(data, Z_NO_FLUSH);
 }
 
-Status ZipWriter::Deflate(std::string_view data, int flush)
+sys::Status ZipWriter::Deflate(std::string_view data, int flush)
 {
     // zlib counts input in 32-bit lengths.
     constexpr size_t kPiece = 1u << 30;
@@ -143,7 +143,7 @@ Status ZipWriter::Deflate(std::string_view data, int flush)
         do {
             unsigned char* room = nullptr;
             size_t roomSize = 0;
-            if (Status free = Failed(m_file.Room(room, roomSize)); !free)
+            if (sys::Status free = Failed(m_file.Room(room, roomSize)); !free)
                 return free;
             m_zip->next_out = room;
             m_zip->avail_out = static_cast<uInt>(roomSize);
@@ -155,20 +155,20 @@ Status ZipWriter::Deflate(std::string_view data, int flush)
         } while (m_zip->avail_in > 0 || m_zip->avail_out == 0 || (mode == Z_FINISH && result != Z_STREAM_END));
         done += piece;
         if (last)
-            return Status::Ok();
+            return sys::Status::Ok();
     }
 }
 
-Status ZipWriter::EndEntry(std::string_view finalHead)
+sys::Status ZipWriter::EndEntry(std::string_view finalHead)
 {
     if (m_failed || !m_streaming)
         return Fail("no part is open for writing");
     if (!finalHead.empty() && finalHead.size() != m_head.size())
         return Fail("the head of the part " + m_current.name + " changed its length");
-    if (Status finished = Deflate({}, Z_FINISH); !finished)
+    if (sys::Status finished = Deflate({}, Z_FINISH); !finished)
         return finished;
     if (!finalHead.empty()) {
-        if (Status patched = WriteAt(m_headOffset, finalHead.data(), finalHead.size()); !patched)
+        if (sys::Status patched = WriteAt(m_headOffset, finalHead.data(), finalHead.size()); !patched)
             return patched;
         m_head = finalHead;
     }
@@ -180,13 +180,13 @@ Status ZipWriter::EndEntry(std::string_view finalHead)
     if (m_current.packedSize > kZipLimit || m_current.headerOffset > kZipLimit)
         return Fail("the package passes 4 GiB at the part " + m_current.name +
                     ", more than a zip package without 64-bit sizes holds");
-    if (Status patched = PatchLocalHeader(m_current); !patched)
+    if (sys::Status patched = PatchLocalHeader(m_current); !patched)
         return patched;
     m_entries.push_back(m_current);
-    return Status::Ok();
+    return sys::Status::Ok();
 }
 
-Status ZipWriter::WriteLocalHeader(const Entry& entry)
+sys::Status ZipWriter::WriteLocalHeader(const Entry& entry)
 {
     std::string header;
     Append32(header, 0x04034b50);
@@ -204,7 +204,7 @@ Status ZipWriter::WriteLocalHeader(const Entry& entry)
     return Output(header.data(), header.size());
 }
 
-Status ZipWriter::PatchLocalHeader(const Entry& entry)
+sys::Status ZipWriter::PatchLocalHeader(const Entry& entry)
 {
     unsigned char fields[12];
     sheet::Store32(fields, entry.crc);
@@ -213,7 +213,7 @@ Status ZipWriter::PatchLocalHeader(const Entry& entry)
     return WriteAt(entry.headerOffset + 14, fields, sizeof fields);
 }
 
-Status ZipWriter::Close()
+sys::Status ZipWriter::Close()
 {
     if (m_failed || !m_file.IsOpen())
         return Fail("the package is not open for writing");
@@ -253,7 +253,7 @@ Status ZipWriter::Close()
     Append32(end, static_cast<std::uint32_t>(directoryOffset));
     Append16(end, 0);
     directory += end;
-    if (Status out = Output(directory.data(), directory.size()); !out)
+    if (sys::Status out = Output(directory.data(), directory.size()); !out)
         return out;
     return Failed(m_file.Close());
 }

@@ -6,7 +6,7 @@
 // No 64-bit extensions: an entry or the package that would pass 4 GiB fails with a message
 // instead (the workbook reader does not take 64-bit packages either).
 #include "converter/BufferedFile.h"
-#include "converter/Problem.h"
+#include "platform/system/Status.h"
 
 #include <cstdint>
 #include <memory>
@@ -26,22 +26,22 @@ public:
     ZipWriter(const ZipWriter&) = delete;
     ZipWriter& operator=(const ZipWriter&) = delete;
 
-    Status Open(const std::string& path);
+    sys::Status Open(const std::string& path);
 
     // One entry with all of its data.
-    Status AddEntry(const std::string& name, std::string_view data);
+    sys::Status AddEntry(const std::string& name, std::string_view data);
 
     // Starts a streamed entry. `head` opens its data and is kept uncompressed in the package (a
     // stored block ahead of the deflated rest), so EndEntry can still replace it by a text of the
     // same length once the rest is known. At most 65,535 bytes.
-    Status BeginEntry(const std::string& name, std::string_view head = {});
+    sys::Status BeginEntry(const std::string& name, std::string_view head = {});
     // Appends to the streamed entry; give large pieces, each is deflated as it comes.
-    Status Append(std::string_view data);
+    sys::Status Append(std::string_view data);
     // Completes the streamed entry. `finalHead`, when given, replaces the head of BeginEntry.
-    Status EndEntry(std::string_view finalHead = {});
+    sys::Status EndEntry(std::string_view finalHead = {});
 
     // Writes the central directory and closes the file.
-    Status Close();
+    sys::Status Close();
 
     // The deflate level: 1 packs a worksheet to about a tenth for a small part of the CPU time
     // that higher levels take.
@@ -56,14 +56,14 @@ private:
         std::uint64_t size = 0;
     };
 
-    Status WriteLocalHeader(const Entry& entry);
-    Status Deflate(std::string_view data, int flush);
-    Status PatchLocalHeader(const Entry& entry);
+    sys::Status WriteLocalHeader(const Entry& entry);
+    sys::Status Deflate(std::string_view data, int flush);
+    sys::Status PatchLocalHeader(const Entry& entry);
     // Each marks the package failed when the file refuses the bytes.
-    Status Output(const void* data, size_t size);
-    Status WriteAt(std::uint64_t offset, const void* data, size_t size);
-    Status Failed(Status status);
-    Status Fail(const std::string& message);
+    sys::Status Output(const void* data, size_t size);
+    sys::Status WriteAt(std::uint64_t offset, const void* data, size_t size);
+    sys::Status Failed(sys::Status status);
+    sys::Status Fail(const std::string& message);
 
     BufferedFile m_file;
     std::unique_ptr<z_stream> m_zip;

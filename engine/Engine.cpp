@@ -1,5 +1,6 @@
 #include "engine/Engine.h"
 
+#include "platform/system/FileFormat.h"
 #include "platform/system/Text.h"
 
 namespace {
@@ -18,13 +19,8 @@ CEngine::~CEngine()
 
 void CEngine::GetBridgeName(int format, CString& name)
 {
-    name.clear();
-    switch (format) {
-    case 1: name = "rbx Timeseries Bridge"; break;
-    case 2: name = "ASCII Timeseries Bridge (General)"; break;
-    case 3: name = "Excel Timeseries Bridge"; break;
-    default: break;
-    }
+    const sys::FileFormatInfo* info = sys::FindFormat(format);
+    name = info ? info->bridgeName : "";
 }
 
 CString CEngine::StoredTemplateName() const

@@ -65,7 +65,7 @@ public:
 
     int m_bConstraintsApplied = 0;
     int m_nInputType = 1;   // 1 single file, 2 every file of a folder
-    int m_nInputFormat = 1; // 1 rbx0, 2 ASCII, 3 Excel
+    int m_nInputFormat = 1; // sys::FileFormat: 1 rbx0, 2 ASCII, 3 Excel
     CString m_strInputFile;
     CString m_strInputBridge;
     CString m_strInputFolder;

@@ -6,34 +6,16 @@
 #include "parsers/ExcelFilePreviewParser.h"
 #include "parsers/ParserFactory.h"
 #include "platform/bridge/BridgeComponent.h"
+#include "platform/system/FileFormat.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
 #include "resources/StringTable.h"
 
 #include <filesystem>
-#include <fstream>
 
 namespace {
 
 constexpr size_t kMaxPath = 260;
-constexpr std::int64_t kTextProbeBytes = 40960;
-
-// From the last dot of the last path element, dot included; empty when that element has none.
-CString ExtensionOf(const CString& path)
-{
-    const size_t slash = path.find_last_of('/');
-    const size_t elementStart = slash == CString::npos ? 0 : slash + 1;
-    const size_t dot = path.find_last_of('.');
-    if (dot == CString::npos || dot < elementStart)
-        return CString();
-    return path.substr(dot);
-}
-
-bool IsAsciiExtension(const CString& extension)
-{
-    return text::EqualsNoCase(extension, ".txt") || text::EqualsNoCase(extension, ".tab") ||
-           text::EqualsNoCase(extension, ".csv");
-}
 
 // False for the entries a folder scan passes over: folders, and files that are hidden, temporary or
 // unreadable.
@@ -70,46 +52,25 @@ int CEngine::FolderExists(const CString& path)
 
 int CEngine::CheckFileExtension(const CString& path, int format, CString& message)
 {
-    const CString extension = ExtensionOf(path);
-    switch (format) {
-    case 1:
-        return text::EqualsNoCase(extension, ".rbx0") ? 1 : 0;
-    case 2:
-        if (IsAsciiExtension(extension))
-            return 1;
-        return extension.empty() ? IsTextFile(path) : 0;
-    case 3: {
-        // Excel may have been installed or removed since the last test.
+    switch (static_cast<sys::FileFormat>(format)) {
+    case sys::FileFormat::Rbx0:
+    case sys::FileFormat::Ascii:
+        return sys::IsInputOf(static_cast<sys::FileFormat>(format), path) ? 1 : 0;
+    case sys::FileFormat::Excel: {
+        // Excel may have been installed or removed since the last test; .xlsx needs Excel 2007.
+        const CString extension = sys::FileExtension(path);
         const int version = GetExcelVersion();
-        if ((text::EqualsNoCase(extension, ".xls") && version >= 11) ||
-            (text::EqualsNoCase(extension, ".xlsx") && version >= 12))
+        if (sys::HasInputExtension(sys::FileFormat::Excel, path) &&
+            version >= (text::EqualsNoCase(extension, ".xlsx") ? 12 : 11))
             return 1;
         message = res::LoadString(res::IDS_EXCEL_MISSING);
         return 0;
     }
-    default:
-        return 0;
     }
+    return 0;
 }
 
-int CEngine::IsTextFile(const CString& path)
-{
-    if (path.empty() || !sys::IsRegularFile(path))
-        return 0;
-    const auto size = sys::FileSize(path);
-    if (!size || *size < 1)
-        return 0;
-    std::ifstream in(path, std::ios::binary);
-    if (!in)
-        return 0;
-    const std::int64_t probe = std::min(*size, kTextProbeBytes);
-    for (std::int64_t i = 0; i < probe; ++i) {
-        const int c = in.get();
-        if (c == 0 || c == std::char_traits<char>::eof())
-            return 0;
-    }
-    return 1;
-}
+int CEngine::IsTextFile(const CString& path) { return sys::LooksLikeText(path) ? 1 : 0; }
 
 int CEngine::BridgeAccepts(const CString& file, const CString& templatePath, int format, short folderScan)
 {
@@ -246,7 +207,7 @@ int CEngine::ReadItemNames(const CString& path, CStringList& names)
         return 0;
     m_pParser->SetFile(path);
     CExcelFilePreviewParser* excel = nullptr;
-    if (m_nInputFormat == 3) {
+    if (m_nInputFormat == sys::Number(sys::FileFormat::Excel)) {
         excel = dynamic_cast<CExcelFilePreviewParser*>(m_pParser.get());
         CString message;
         if (!excel || !excel->OpenWorkbook(path, message))

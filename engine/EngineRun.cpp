@@ -61,7 +61,7 @@ int CEngine::LaunchEngine(const std::vector<CString>& options)
     const TemporarySetupFile file(TemporaryFolder(), EngineFileName(), content);
     if (!file.Created()) {
         // Never start the engine on a file this run did not write.
-        std::fprintf(stderr, "Velmora: %s\n", text::EscapeControls(file.Error()).c_str());
+        std::fprintf(stderr, "Velmora: %s\n", text::EscapeControls(file.status().problem().message).c_str());
         return kNoSetupFile;
     }
     return RunEngine(kEngineProgram, file.Path(), 1, options);

@@ -138,7 +138,8 @@ TemporarySetupFile::TemporarySetupFile(const std::string& folder, const std::str
         if (made != 0)
             return;
     }
-    m_error = "cannot create the temporary setup file " + folder + name + ": every numbered name is taken";
+    m_status = sys::Status::Fail(folder + name, 0,
+                                 "cannot create the temporary setup file " + folder + name + ": every numbered name is taken");
 }
 
 int TemporarySetupFile::TryCreate(const std::string& path, const std::string& content)
@@ -147,7 +148,7 @@ int TemporarySetupFile::TryCreate(const std::string& path, const std::string& co
     if (fd < 0) {
         if (errno == EEXIST)
             return 0;
-        m_error = "cannot create the temporary setup file " + path + ": " + std::strerror(errno);
+        m_status = sys::Status::Fail(path, 0, "cannot create the temporary setup file " + path + ": " + std::strerror(errno));
         return -1;
     }
     struct stat st {};
@@ -159,7 +160,8 @@ int TemporarySetupFile::TryCreate(const std::string& path, const std::string& co
     const bool written = WriteAll(fd, content);
     const int writeErrno = errno;
     if (::close(fd) != 0 || !written) {
-        m_error = "cannot write the temporary setup file " + path + ": " + std::strerror(written ? errno : writeErrno);
+        m_status = sys::Status::Fail(path, 0, "cannot write the temporary setup file " + path + ": " +
+                                                  std::strerror(written ? errno : writeErrno));
         ReleaseSlot(m_slot);
         ::unlink(path.c_str());
         m_path.clear();

@@ -1,15 +1,16 @@
 // The engine's ASCII reader on arbitrary bytes, through a new template's defaults and through a
 // comma template that ignores consecutive and leading delimiters; the fast splitter must also give
-// NextField's calls for every line.
+// NextField's calls for every line, and the date/time reader's shortcut its token-by-token reading.
 #include "converter/AsciiSeriesReader.h"
-#include "converter/FieldSplitter.h"
 #include "converter/StampText.h"
-#include "parsers/DateTimeText.h"
+#include "delimited/FieldSplitter.h"
+#include "platform/system/OleDateTime.h"
 #include "platform/ui/UserInterface.h"
 #include "templates/AsciiSpecification.h"
 
 #include <cstdint>
 #include <cstdio>
+#include <cstring>
 #include <string>
 #include <unistd.h>
 
@@ -27,7 +28,7 @@ void ReadWhole(const CSpecification& spec, const std::string& path)
 
 void CompareSplits(const CSpecification& spec, const std::string& line)
 {
-    converter::FieldSplitter splitter(spec);
+    delimited::FieldSplitter splitter(spec.GetDialect());
     splitter.Split(line);
     CString copy = line;
     int pos = 0;
@@ -42,16 +43,23 @@ void CompareSplits(const CSpecification& spec, const std::string& line)
         __builtin_trap();
 }
 
-// The compiled date format reads a text as the reference reader does.
+// The date/time reader's compact shortcut reads a text as its token-by-token reading does, and the
+// stamp of the fields exists when the automation date of the same fields does.
 void CompareStamps(const std::string& text)
 {
-    for (const char* format : {"YYYY/MM/DD HH:mm:ss", "DD.MM.YYYY hh:mm", "y-M-d"}) {
-        COleDateTime reference;
-        const bool referenceOk = ParseDateTimeText(text, format, reference);
-        converter::StampFields fields;
-        if (converter::DateFormat(format).Read(text, fields) != referenceOk)
+    for (const char* format : {"YYYY/MM/DD HH:mm:ss", "DD.MM.YYYY hh:mm", "y-M-d", "YYYY-MM-DDTHH:mm:ss"}) {
+        const sys::DateFormat dateFormat(format);
+        sys::DateTimeFields reference, fields;
+        const bool referenceOk = dateFormat.ReadTokens(text, reference);
+        if (dateFormat.Read(text, fields) != referenceOk)
             __builtin_trap();
-        if (referenceOk && converter::StampFromFields(fields).has_value() != reference.IsValid())
+        if (!referenceOk)
+            continue;
+        if (std::memcmp(&fields, &reference, sizeof fields) != 0)
+            __builtin_trap();
+        COleDateTime automation;
+        automation.SetDateTime(fields.year, fields.month, fields.day, fields.hour, fields.minute, fields.second);
+        if (converter::StampFromFields(fields).has_value() != automation.IsValid())
             __builtin_trap();
     }
 }

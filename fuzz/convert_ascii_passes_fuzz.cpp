@@ -62,7 +62,7 @@ void ApplySettings(const uint8_t* s, CAsciiSpecification& spec)
 
 struct Reading {
     std::vector<converter::Row> rows;
-    converter::Status status;
+    sys::Status status;
     bool opened = false;
 };
 
@@ -99,8 +99,8 @@ bool SameReading(const Reading& a, const Reading& b)
     for (size_t i = 0; i < a.rows.size(); ++i)
         if (!SameRow(a.rows[i], b.rows[i]))
             return false;
-    const converter::Problem& p = a.status.problem();
-    const converter::Problem& q = b.status.problem();
+    const sys::Problem& p = a.status.problem();
+    const sys::Problem& q = b.status.problem();
     return p.line == q.line && p.column == q.column && p.message == q.message;
 }
 

@@ -29,14 +29,14 @@ bool ReadSheetSample(const std::string& path, size_t maxRows, Sample& sample, st
     sample = Sample();
     sample.excel = true;
     sheet::WorkbookReader workbook;
-    if (!workbook.Open(path)) {
-        error = workbook.Error();
+    if (const sys::Status opened = workbook.Open(path); !opened) {
+        error = opened.problem().Describe();
         return false;
     }
     for (int number = 1; number <= workbook.SheetCount() && sample.rows.empty(); ++number) {
         sample.sheet = number;
         bool stopped = false;
-        const bool read = workbook.ReadRows(number, [&](int row, const std::vector<sheet::RowCell>& cells) {
+        const sys::Status read = workbook.ReadRows(number, [&](int row, const std::vector<sheet::RowCell>& cells) {
             if (sample.rows.size() == maxRows) {
                 stopped = true;
                 return false;
@@ -54,7 +54,7 @@ bool ReadSheetSample(const std::string& path, size_t maxRows, Sample& sample, st
             return true;
         });
         if (!read && !stopped) {
-            error = workbook.Error();
+            error = read.problem().Describe();
             return false;
         }
         sample.wholeFile = !stopped;

@@ -70,16 +70,16 @@ void SetItems(CSpecification& spec, const ItemLayout& items, long startRow)
 std::optional<Refusal> Prove(const std::string& path, InputKind kind, const CSpecification& spec, size_t rows)
 {
     try {
-        const converter::Format format = kind == InputKind::Excel ? converter::Format::Excel : converter::Format::Ascii;
+        const sys::FileFormat format = kind == InputKind::Excel ? sys::FileFormat::Excel : sys::FileFormat::Ascii;
         std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(format, &spec);
-        converter::Status opened = reader->Open(path);
+        sys::Status opened = reader->Open(path);
         // Items that hold no numbers are left out of the selection, and so are not read.
         if (opened && !spec.m_arrSelItems.empty())
             reader->Select(std::vector<size_t>(spec.m_arrSelItems.begin(), spec.m_arrSelItems.end()));
         converter::Row row;
         for (size_t i = 0; opened && i < rows && reader->Next(row); ++i) {
         }
-        const converter::Status& status = opened ? reader->status() : opened;
+        const sys::Status& status = opened ? reader->status() : opened;
         if (status)
             return std::nullopt;
         return Refusal{status.problem().line,

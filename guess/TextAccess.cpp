@@ -1,7 +1,7 @@
 #include "guess/TextAccess.h"
 
-#include "converter/FieldSplitter.h"
-#include "converter/LineSource.h"
+#include "delimited/FieldSplitter.h"
+#include "platform/system/TextLineReader.h"
 #include "templates/AsciiSpecification.h"
 
 namespace guess {
@@ -9,8 +9,8 @@ namespace guess {
 bool ReadTextHead(const std::string& path, size_t maxLines, size_t maxBytes, TextHead& head, std::string& error)
 {
     head = TextHead();
-    converter::LineSource source;
-    if (converter::Status opened = source.Open(path); !opened) {
+    sys::TextLineReader source;
+    if (sys::Status opened = source.Open(path); !opened) {
         error = opened.problem().Describe();
         return false;
     }
@@ -30,21 +30,20 @@ bool ReadTextHead(const std::string& path, size_t maxLines, size_t maxBytes, Tex
     return true;
 }
 
-std::string Dialect::Text() const
+std::string Dialect::Text() const { return Rules().delimiter; }
+
+delimited::Dialect Dialect::Rules() const
 {
     CAsciiSpecification spec;
     spec.m_strDelimiter = delimiterName;
     spec.m_strDefDelimiter = userDelimiter;
-    return spec.GetDelimiterString();
+    spec.m_bIgnoreConsecutiveDelimiters = consecutive ? 1 : 0;
+    spec.m_bIgnoreBegginingOfLineDelimiters = leading ? 1 : 0;
+    return spec.GetDialect();
 }
 
-LineSplitter::LineSplitter(const Dialect& dialect) : m_spec(std::make_unique<CAsciiSpecification>())
+LineSplitter::LineSplitter(const Dialect& dialect) : m_splitter(std::make_unique<delimited::FieldSplitter>(dialect.Rules()))
 {
-    m_spec->m_strDelimiter = dialect.delimiterName;
-    m_spec->m_strDefDelimiter = dialect.userDelimiter;
-    m_spec->m_bIgnoreConsecutiveDelimiters = dialect.consecutive ? 1 : 0;
-    m_spec->m_bIgnoreBegginingOfLineDelimiters = dialect.leading ? 1 : 0;
-    m_splitter = std::make_unique<converter::FieldSplitter>(*m_spec);
 }
 
 LineSplitter::~LineSplitter() = default;
@@ -54,7 +53,7 @@ std::vector<std::string> LineSplitter::Split(std::string_view line, bool* quoteE
     m_splitter->Split(line);
     std::vector<std::string> fields;
     // Every call but the one that reports the end of the line gives a field.
-    for (const converter::FieldSplitter::Call& call : m_splitter->Calls())
+    for (const delimited::FieldSplitter::Call& call : m_splitter->Calls())
         if (call.end != -1)
             fields.emplace_back(call.text);
     if (quoteError)
@@ -65,9 +64,9 @@ std::vector<std::string> LineSplitter::Split(std::string_view line, bool* quoteE
 bool ReadStampText(std::string_view text, std::string_view format, StampPart part, StampFields& fields,
                    std::string_view extraSeparators)
 {
-    using Reads = converter::DateFormat::Reads;
+    using Reads = sys::DateFormat::Reads;
     const Reads reads = part == StampPart::Date ? Reads::Date : part == StampPart::Time ? Reads::Time : Reads::DateTime;
-    const converter::DateFormat compiled(format, reads, extraSeparators);
+    const sys::DateFormat compiled(format, reads, extraSeparators);
     return compiled.Read(text, fields);
 }
 

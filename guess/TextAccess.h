@@ -1,9 +1,13 @@
 #pragma once
-// The guesser's one door to the text readers: the head of a text file read line by line, lines
-// split into fields, date/time texts and numbers read exactly as the conversion engine reads them.
-// Everything the guesser decides is tried through these calls, so a guess holds for the engine.
+// The guesser's one door to the text readers: the head of a text file read by the line reader,
+// lines split by the delimited-text field rule, date/time texts read by the date/time reader and
+// numbers as the conversion engine reads them. Everything the guesser decides is tried through
+// these calls, so a guess holds for the engine.
 #include "converter/NumberText.h"
 #include "converter/StampText.h"
+#include "platform/system/DateFormat.h"
+
+#include "delimited/Dialect.h"
 
 #include <cstdint>
 #include <memory>
@@ -11,15 +15,14 @@
 #include <string_view>
 #include <vector>
 
-class CAsciiSpecification;
-namespace converter {
+namespace delimited {
 class FieldSplitter;
 }
 
 namespace guess {
 
 using converter::Stamp;
-using converter::StampFields;
+using StampFields = sys::DateTimeFields;
 using converter::ValueText;
 
 // One line of a text file, numbered from 1 as a template counts rows.
@@ -41,7 +44,8 @@ struct TextHead {
 // ("file:line: reason") when the file cannot be read as text.
 bool ReadTextHead(const std::string& path, size_t maxLines, size_t maxBytes, TextHead& head, std::string& error);
 
-// How a template splits lines: its delimiter values.
+// A template's delimiter values, by the names the template stores; Rules() gives what they mean
+// to the field rule.
 struct Dialect {
     std::string delimiterName = "Tab"; // "Tab", "Comma", "Semi Colon", "Space" or "User Defined"
     std::string userDelimiter;         // the text of "User Defined"
@@ -50,6 +54,8 @@ struct Dialect {
 
     // The delimiter's text.
     std::string Text() const;
+    // The dialect the delimited-text reader takes.
+    delimited::Dialect Rules() const;
     bool operator==(const Dialect&) const = default;
 };
 
@@ -65,8 +71,7 @@ public:
     std::vector<std::string> Split(std::string_view line, bool* quoteError = nullptr);
 
 private:
-    std::unique_ptr<CAsciiSpecification> m_spec;
-    std::unique_ptr<converter::FieldSplitter> m_splitter;
+    std::unique_ptr<delimited::FieldSplitter> m_splitter;
 };
 
 // What part of a stamp a format reads.

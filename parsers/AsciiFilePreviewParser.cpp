@@ -2,9 +2,10 @@
 
 #include "parsers/FieldCursor.h"
 #include "parsers/HeaderCells.h"
-#include "parsers/TextLineReader.h"
+#include "parsers/FileException.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
+#include "platform/system/TextLineReader.h"
 #include "platform/units/Units.h"
 #include "resources/StringTable.h"
 #include "templates/Specification.h"
@@ -12,6 +13,32 @@
 #include <algorithm>
 
 namespace {
+
+// The lines of the bound file for the parser's operations, which let a file that cannot be read
+// through as CFileException. A preview reads at most what it shows: the start of a long line is
+// kept, the rest read past.
+class PreviewLines {
+public:
+    explicit PreviewLines(const CString& path)
+    {
+        if (const sys::Status opened = m_reader.Open(path); !opened)
+            throw CFileException(opened.problem());
+    }
+    // The next line, at most `keep` bytes of it; false at the end of the file.
+    bool Read(CString& line, size_t keep = sys::kLongestTextLine) { return Went(m_reader.Read(line, keep)); }
+    bool Skip() { return Went(m_reader.Skip()); }
+    long LineNumber() const { return m_reader.LineNumber(); }
+
+private:
+    bool Went(bool read) const
+    {
+        if (!read && !m_reader.status())
+            throw CFileException(m_reader.status().problem());
+        return read;
+    }
+
+    sys::TextLineReader m_reader{sys::TextLineReader::OverlongLine::NoLineBreak, 64 * 1024};
+};
 
 // Raw lines are shown with tabs opened up, as a list control cannot show them, and at most their
 // first kShownLineBytes bytes.
@@ -29,8 +56,6 @@ ui::Row RawRow(const CString& line)
         text::DropPartialCharacter(shown);
     return ui::Row{std::move(shown)};
 }
-
-bool Contains(const CString& line, const CString& part) { return line.find(part) != CString::npos; }
 
 bool IsKnownValueType(const CString& name)
 {
@@ -74,12 +99,12 @@ int CAsciiFilePreviewParser::ReadLine(int n, CString& text)
         return 0;
     if (!sys::FileExists(m_strFile))
         return Fail(m_strFile, 0, "the file does not exist");
-    CTextLineReader reader(m_strFile);
+    PreviewLines reader(m_strFile);
     text.clear();
     int passed = 0;
-    while (passed + 1 < n && reader.SkipLine())
+    while (passed + 1 < n && reader.Skip())
         ++passed;
-    if (passed + 1 == n && !reader.ReadLine(text))
+    if (passed + 1 == n && !reader.Read(text))
         text.clear();
     return 1;
 }
@@ -389,19 +414,19 @@ bool CAsciiFilePreviewParser::ReadColumnCountAndNames(const DeleteValue& deleteV
         return true;
 
     // Lines beyond the end of the file read as empty, so the reading stops there.
-    CTextLineReader reader(m_strFile);
+    PreviewLines reader(m_strFile);
     CString nameLine, startLine;
     for (long long n = 1; n <= data.m_nStartRow; ++n) {
         const bool wanted = n == data.m_nItemDescriptionRow || n == data.m_nStartRow;
         CString line;
-        if (!(wanted ? reader.ReadLine(line) : reader.SkipLine()))
+        if (!(wanted ? reader.Read(line) : reader.Skip()))
             break;
         if (n == data.m_nItemDescriptionRow)
             nameLine = line;
         if (n == data.m_nStartRow)
             startLine = std::move(line);
     }
-    if (!Contains(startLine, m_pSpecification->GetDelimiterString()))
+    if (!delimited::Delimiter(m_pSpecification->GetDelimiterString()).FoundIn(startLine))
         return Refuse(res::IDS_NO_DELIMITERS, data.m_nStartRow);
     columns = CountFieldCalls(*m_pSpecification, startLine) - m_pSpecification->CountFormatColumns(1);
     if (columns < 1)
@@ -454,17 +479,18 @@ bool CAsciiFilePreviewParser::ReadNamesFromLine(const CString& nameLine, int col
 bool CAsciiFilePreviewParser::ReadHeaderAndDataLines(int columns, const DeleteValue& deleteValue)
 {
     const int startRow = m_pSpecification->m_DataDesc.m_nStartRow;
-    const CString delimiter = m_pSpecification->GetDelimiterString();
-    CTextLineReader reader(m_strFile);
+    const CString delimiterText = m_pSpecification->GetDelimiterString();
+    const delimited::Delimiter delimiter(delimiterText);
+    PreviewLines reader(m_strFile);
     CString line;
-    for (long long n = 1; n < startRow && reader.ReadLine(line, kShownLineBytes); ++n)
+    for (long long n = 1; n < startRow && reader.Read(line, kShownLineBytes); ++n)
         m_vecRawLines.push_back(RawRow(line));
     size_t cells = 0;
-    for (int i = 0; i < kPreviewLines && cells < kPreviewCells && reader.ReadLine(line); ++i) {
+    for (int i = 0; i < kPreviewLines && cells < kPreviewCells && reader.Read(line); ++i) {
         m_vecRawLines.push_back(RawRow(line));
         if (line.empty())
             continue;
-        if (!Contains(line, delimiter))
+        if (!delimiter.FoundIn(line))
             return Refuse(res::IDS_NO_DELIMITERS, reader.LineNumber());
         if (!ParseDataLine(line, reader.LineNumber(), columns, deleteValue))
             return false;
@@ -477,7 +503,7 @@ bool CAsciiFilePreviewParser::ParseDataLine(const CString& line, long number, in
 {
     const int firstDateTimeField = m_pSpecification->GetDateTimeColumn();
     const int dateTimeFields = m_pSpecification->CountFormatColumns(1);
-    const CString decimalSeparator = m_pSpecification->GetDecimalSeparatorString();
+    const delimited::Dialect dialect = m_pSpecification->GetDialect();
     CFieldCursor cursor(*m_pSpecification, line);
     ui::Row row;
     bool hasDateTime = false;
@@ -490,7 +516,7 @@ bool CAsciiFilePreviewParser::ParseDataLine(const CString& line, long number, in
         } else {
             CString field = cursor.Next();
             if (!cursor.AtEnd()) {
-                if (!UsesDecimalSeparator(field, decimalSeparator))
+                if (dialect.UsesOtherDecimalSeparator(field))
                     return Refuse(res::IDS_DECIMAL_SEPARATOR_MISMATCH, number);
                 row.push_back(deleteValue.Matches(field) ? CString() : std::move(field));
             }
@@ -536,24 +562,17 @@ bool CAsciiFilePreviewParser::TakeDateTime(CFieldCursor& cursor, long number, ui
     return true;
 }
 
-bool CAsciiFilePreviewParser::UsesDecimalSeparator(const CString& field, const CString& separator)
-{
-    if (field.empty() || Contains(field, separator) || (separator != "." && separator != ","))
-        return true;
-    return !Contains(field, separator == "." ? "," : ".");
-}
-
 int CAsciiFilePreviewParser::ReadRawLines(const CString& path)
 {
     const CString file = path.empty() ? m_strFile : path;
     if (!sys::FileExists(file))
         return Fail(file, 0, "the file does not exist");
-    CTextLineReader reader(file);
+    PreviewLines reader(file);
     m_vecItemNames.clear();
     m_vecRows.clear();
     m_vecRawLines.clear();
     CString line;
-    for (int i = 0; i < kPreviewLines && reader.ReadLine(line, kShownLineBytes); ++i)
+    for (int i = 0; i < kPreviewLines && reader.Read(line, kShownLineBytes); ++i)
         m_vecRawLines.push_back(RawRow(line));
     return 1;
 }

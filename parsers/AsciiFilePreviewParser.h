@@ -64,6 +64,4 @@ private:
     // Data line `number` of the file into a row of m_vecRows; false after a message.
     bool ParseDataLine(const CString& line, long number, int columns, const DeleteValue& deleteValue);
     bool TakeDateTime(CFieldCursor& cursor, long number, ui::Row& row, int& column);
-    // False when `field` uses the other of "." and "," where `separator` is one of them.
-    static bool UsesDecimalSeparator(const CString& field, const CString& separator);
 };

@@ -1,7 +1,7 @@
 #include "parsers/ExcelFilePreviewParser.h"
 
-#include "parsers/DateTimeText.h"
 #include "parsers/HeaderCells.h"
+#include "platform/system/DateFormat.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
 #include "platform/ui/UserInterface.h"
@@ -303,19 +303,22 @@ int CExcelFilePreviewParser::ReadDateTimeCells(int row, int column, int n, std::
 
 namespace {
 
-bool TakeTimeOfDay(const COleDateTime& value, CTimeFields& time)
+using sys::DateFormat;
+using sys::DateTimeFields;
+
+bool TakeTimeOfDay(const COleDateTime& value, DateTimeFields& time)
 {
     int year, month, day;
     return value.GetFields(year, month, day, time.hour, time.minute, time.second);
 }
 
-bool TakeDate(const COleDateTime& value, CDateFields& date)
+bool TakeDate(const COleDateTime& value, DateTimeFields& date)
 {
     int hour, minute, second;
     return value.GetFields(date.year, date.month, date.day, hour, minute, second);
 }
 
-COleDateTime Combine(const CDateFields& date, const CTimeFields& time)
+COleDateTime Combine(const DateTimeFields& date, const DateTimeFields& time)
 {
     return COleDateTime(date.year, date.month, date.day, time.hour, time.minute, time.second);
 }
@@ -343,22 +346,39 @@ struct RowTimeParts {
     bool useFormat;
 };
 
+// `text` read by `format` from the fields `start` into `fields`, which stay as they were when the
+// text does not read.
+bool ReadFields(const CString& text, const CString& format, DateFormat::Reads reads, DateTimeFields start,
+                DateTimeFields& fields)
+{
+    if (!DateFormat(format, reads).Read(text, start))
+        return false;
+    fields = start;
+    return true;
+}
+
 // The two halves of a stamp: each is read from a text by its format, or taken from a date-time.
 struct DateHalf {
-    using Fields = CDateFields;
     static constexpr DateReading kGlobalReading = DateReading::DateOnly;
-    static bool Parse(const CString& text, const CString& format, Fields& date) { return ParseDateText(text, format, date); }
-    static bool Take(const COleDateTime& value, Fields& date) { return TakeDate(value, date); }
+    // Year, month and day from the text, starting at 1 January of the year 100.
+    static bool Parse(const CString& text, const CString& format, DateTimeFields& date)
+    {
+        return ReadFields(text, format, DateFormat::Reads::Date, {100, 1, 1, 0, 0, 0}, date);
+    }
+    static bool Take(const COleDateTime& value, DateTimeFields& date) { return TakeDate(value, date); }
+    static COleDateTime With(const DateTimeFields& date, const DateTimeFields& time) { return Combine(date, time); }
 };
 
 struct TimeHalf {
-    using Fields = CTimeFields;
     static constexpr DateReading kGlobalReading = DateReading::TimeOnly;
-    static bool Parse(const CString& text, const CString& format, Fields& time) { return ParseTimeText(text, format, time); }
-    static bool Take(const COleDateTime& value, Fields& time) { return TakeTimeOfDay(value, time); }
+    // Hour, minute and second from the text; those it does not reach keep the values passed in.
+    static bool Parse(const CString& text, const CString& format, DateTimeFields& time)
+    {
+        return ReadFields(text, format, DateFormat::Reads::Time, time, time);
+    }
+    static bool Take(const COleDateTime& value, DateTimeFields& time) { return TakeTimeOfDay(value, time); }
+    static COleDateTime With(const DateTimeFields& time, const DateTimeFields& date) { return Combine(date, time); }
 };
-
-COleDateTime Combine(const CTimeFields& time, const CDateFields& date) { return Combine(date, time); }
 
 // `GlobalHalf` is one text for all rows (`globalText`); `RowHalf` comes from the row's cells, read by
 // `rowFormat` when the row is taken as text. False when the row holds no stamp; an unreadable global
@@ -369,20 +389,21 @@ bool GlobalWithRowHalf(const RowTimeParts& row, const CString& globalText, const
 {
     COleDateTime global;
     const bool globalRead = ReadDateText(globalText, GlobalHalf::kGlobalReading, global);
-    typename GlobalHalf::Fields globalFields;
-    typename RowHalf::Fields rowFields;
+    DateTimeFields globalFields;
+    DateTimeFields rowFields;
     if (row.useFormat) {
         if (!RowHalf::Parse(row.joined, rowFormat, rowFields))
             return false;
-        stamp = globalRead && GlobalHalf::Take(global, globalFields) ? Combine(globalFields, rowFields)
+        stamp = globalRead && GlobalHalf::Take(global, globalFields) ? GlobalHalf::With(globalFields, rowFields)
                                                                      : InvalidDateTime();
         return true;
     }
     if (row.cells.empty() || row.cells.front().IsEmpty() || !globalRead || !GlobalHalf::Take(global, globalFields))
         return false;
     COleDateTime cell;
-    stamp = VariantToDate(row.cells.front(), cell) && RowHalf::Take(cell, rowFields) ? Combine(globalFields, rowFields)
-                                                                                     : InvalidDateTime();
+    stamp = VariantToDate(row.cells.front(), cell) && RowHalf::Take(cell, rowFields)
+                ? GlobalHalf::With(globalFields, rowFields)
+                : InvalidDateTime();
     return true;
 }
 
@@ -411,8 +432,10 @@ int CExcelFilePreviewParser::ReadRowDateTime(int row, CString& stamp)
     switch (td.m_nDateTimeOption) {
     case 0:
         if (td.m_bUseDTFormat == 1) {
-            if (!ParseDateTimeText(joined, td.m_strDateTimeFormat, value))
+            DateTimeFields fields;
+            if (!DateFormat(td.m_strDateTimeFormat).Read(joined, fields))
                 return 0;
+            value.SetDateTime(fields.year, fields.month, fields.day, fields.hour, fields.minute, fields.second);
         } else if (cells.empty() || cells.front().IsEmpty() || !VariantToDate(cells.front(), value)) {
             return 0;
         }
@@ -749,7 +772,7 @@ int WidenYear(int year, size_t digits)
     return year < 30 ? 2000 + year : 1900 + year;
 }
 
-bool ReadDatePart(const CString& piece, CDateFields& date)
+bool ReadDatePart(const CString& piece, sys::DateTimeFields& date)
 {
     const size_t separatorAt = piece.find_first_of("-/.");
     if (separatorAt == CString::npos)
@@ -773,7 +796,7 @@ bool ReadDatePart(const CString& piece, CDateFields& date)
 }
 
 // "10:00", "10:00:00" or "10:00:00.25" (the fraction is dropped), 12-hour when `meridiem` is 'A' or 'P'.
-bool ReadTimePart(const CString& piece, char meridiem, CTimeFields& time)
+bool ReadTimePart(const CString& piece, char meridiem, sys::DateTimeFields& time)
 {
     CString clock = piece;
     const size_t fractionAt = clock.find('.');
@@ -790,7 +813,7 @@ bool ReadTimePart(const CString& piece, char meridiem, CTimeFields& time)
         return false;
     if (fractionAt != CString::npos && parts.size() != 3)
         return false;
-    time = CTimeFields();
+    time = sys::DateTimeFields();
     if (!ReadNumber(parts[0], time.hour) || !ReadNumber(parts[1], time.minute))
         return false;
     if (parts.size() == 3 && !ReadNumber(parts[2], time.second))
@@ -845,14 +868,14 @@ bool ReadDateText(const CString& input, DateReading reading, COleDateTime& value
     if (meridiem != 0 && timePart.empty())
         return false;
     // A text without a date lies on day 0 of the automation calendar.
-    CDateFields date {1899, 12, 30};
-    CTimeFields time;
+    sys::DateTimeFields date{1899, 12, 30, 0, 0, 0};
+    sys::DateTimeFields time{1899, 12, 30, 0, 0, 0};
     if (!datePart.empty() && !ReadDatePart(datePart, date))
         return false;
     if (!timePart.empty() && !ReadTimePart(timePart, meridiem, time))
         return false;
     if (reading == DateReading::DateOnly)
-        time = CTimeFields();
+        time.hour = time.minute = time.second = 0;
     if (reading == DateReading::TimeOnly)
         date = {1899, 12, 30};
     value = COleDateTime(date.year, date.month, date.day, time.hour, time.minute, time.second);

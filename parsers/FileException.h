@@ -1,6 +1,8 @@
 #pragma once
 // Raised when a data file exists but cannot be opened or read (no permission, held by another
 // program, a folder in its place). Parsers let it through; whoever runs a parse catches it.
+#include "platform/system/Status.h"
+
 #include <stdexcept>
 #include <string>
 
@@ -12,6 +14,8 @@ public:
           m_strPath(path)
     {
     }
+    // The exception a reader's problem becomes at a parser's operation.
+    explicit CFileException(const sys::Problem& problem) : CFileException(problem.file, problem.message, problem.line) {}
     const std::string& Path() const { return m_strPath; }
 
 private:

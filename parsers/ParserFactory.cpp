@@ -3,29 +3,18 @@
 #include "parsers/AsciiFilePreviewParser.h"
 #include "parsers/ExcelFilePreviewParser.h"
 #include "parsers/RbxPreviewFileParser.h"
-#include "platform/system/Text.h"
+#include "platform/system/FileFormat.h"
 #include "templates/AsciiSpecification.h"
 #include "templates/ExcelSpecification.h"
 
 #include <exception>
 
-int FormatFromName(const CString& name)
-{
-    if (text::EqualsNoCase(name, "rbx0"))
-        return kFormatRbx0;
-    if (text::EqualsNoCase(name, "ascii"))
-        return kFormatAscii;
-    if (text::EqualsNoCase(name, "excel"))
-        return kFormatExcel;
-    return 0;
-}
-
 std::unique_ptr<CSpecification> MakeSpecification(int format)
 {
-    switch (format) {
-    case kFormatAscii:
+    switch (static_cast<sys::FileFormat>(format)) {
+    case sys::FileFormat::Ascii:
         return std::make_unique<CAsciiSpecification>();
-    case kFormatExcel:
+    case sys::FileFormat::Excel:
         return std::make_unique<CExcelSpecification>();
     default:
         return nullptr;
@@ -34,12 +23,12 @@ std::unique_ptr<CSpecification> MakeSpecification(int format)
 
 std::unique_ptr<CFilePreviewParser> MakeParser(int format)
 {
-    switch (format) {
-    case kFormatRbx0:
+    switch (static_cast<sys::FileFormat>(format)) {
+    case sys::FileFormat::Rbx0:
         return std::make_unique<CRbxPreviewFileParser>();
-    case kFormatAscii:
+    case sys::FileFormat::Ascii:
         return std::make_unique<CAsciiFilePreviewParser>();
-    case kFormatExcel:
+    case sys::FileFormat::Excel:
         return std::make_unique<CExcelFilePreviewParser>();
     default:
         return nullptr;
@@ -48,12 +37,12 @@ std::unique_ptr<CFilePreviewParser> MakeParser(int format)
 
 bool IsParserOfFormat(const CFilePreviewParser* parser, int format)
 {
-    switch (format) {
-    case kFormatRbx0:
+    switch (static_cast<sys::FileFormat>(format)) {
+    case sys::FileFormat::Rbx0:
         return dynamic_cast<const CRbxPreviewFileParser*>(parser) != nullptr;
-    case kFormatAscii:
+    case sys::FileFormat::Ascii:
         return dynamic_cast<const CAsciiFilePreviewParser*>(parser) != nullptr;
-    case kFormatExcel:
+    case sys::FileFormat::Excel:
         return dynamic_cast<const CExcelFilePreviewParser*>(parser) != nullptr;
     default:
         return false;

@@ -1,16 +1,11 @@
 #pragma once
 // The working objects of an input format: the template object (none for rbx0, whose files describe
-// themselves) and the preview parser. Format numbers as the setup stores them: 1 rbx0, 2 ASCII,
-// 3 Excel. A reader for a new format is added here and nowhere else.
+// themselves) and the preview parser. Formats by the setup's numbers (sys::FileFormat); a preview
+// reader for a new format is added here and nowhere else.
 #include "parsers/FilePreviewParser.h"
 #include "templates/Specification.h"
 
 #include <memory>
-
-enum InputFormat : int { kFormatRbx0 = 1, kFormatAscii = 2, kFormatExcel = 3 };
-
-// The format named on a command line ("rbx0", "ascii", "excel", any letter case); 0 for another name.
-int FormatFromName(const CString& name);
 
 // A template object with the defaults; null for rbx0 and for formats without a reader here.
 std::unique_ptr<CSpecification> MakeSpecification(int format);

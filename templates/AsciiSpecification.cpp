@@ -58,20 +58,23 @@ const FileLayout& AsciiFileLayout() { return kAsciiLayout; }
 int CAsciiSpecification::Save(const CString& path)
 {
     const CString& target = path.empty() ? m_strSaveFile : path;
-    return tmplfile::WriteTemplate(*this, tmplfile::AsciiFileLayout(), target, m_strLastError) ? 1 : 0;
+    m_lastStatus = tmplfile::WriteTemplate(*this, tmplfile::AsciiFileLayout(), target);
+    return m_lastStatus ? 1 : 0;
 }
 
 int CAsciiSpecification::Load(const CString& path)
 {
     std::string bytes;
-    if (!tmplfile::ReadFileBytes(path, bytes, m_strLastError))
+    m_lastStatus = tmplfile::ReadFileBytes(path, bytes);
+    if (!m_lastStatus)
         return 0;
     return LoadFromMemory(bytes, path);
 }
 
 int CAsciiSpecification::LoadFromMemory(std::string_view bytes, const CString& path)
 {
-    if (!tmplfile::LoadInto(*this, tmplfile::AsciiFileLayout(), bytes, path, m_strLastError))
+    m_lastStatus = tmplfile::LoadInto(*this, tmplfile::AsciiFileLayout(), bytes, path);
+    if (!m_lastStatus)
         return 0;
     return CSpecification::Load(path);
 }

@@ -63,20 +63,23 @@ const FileLayout& ExcelFileLayout() { return kExcelLayout; }
 int CExcelSpecification::Save(const CString& path)
 {
     const CString& target = path.empty() ? m_strSaveFile : path;
-    return tmplfile::WriteTemplate(*this, tmplfile::ExcelFileLayout(), target, m_strLastError) ? 1 : 0;
+    m_lastStatus = tmplfile::WriteTemplate(*this, tmplfile::ExcelFileLayout(), target);
+    return m_lastStatus ? 1 : 0;
 }
 
 int CExcelSpecification::Load(const CString& path)
 {
     std::string bytes;
-    if (!tmplfile::ReadFileBytes(path, bytes, m_strLastError))
+    m_lastStatus = tmplfile::ReadFileBytes(path, bytes);
+    if (!m_lastStatus)
         return 0;
     return LoadFromMemory(bytes, path);
 }
 
 int CExcelSpecification::LoadFromMemory(std::string_view bytes, const CString& path)
 {
-    if (!tmplfile::LoadInto(*this, tmplfile::ExcelFileLayout(), bytes, path, m_strLastError))
+    m_lastStatus = tmplfile::LoadInto(*this, tmplfile::ExcelFileLayout(), bytes, path);
+    if (!m_lastStatus)
         return 0;
     return CSpecification::Load(path);
 }

@@ -1,5 +1,6 @@
 #include "templates/Specification.h"
 
+#include "delimited/FieldSplitter.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
 #include "platform/ui/UserInterface.h"
@@ -31,121 +32,6 @@ CString FirstCharacters(const CString& text, size_t count)
             ++end;
     }
     return text.substr(0, end);
-}
-
-// A delimiter is one separator text. A single character is the usual case; a longer user delimiter
-// separates only where the whole text occurs, so "||" never splits at a lone "|".
-class Delimiter {
-public:
-    explicit Delimiter(std::string_view text) : m_text(text) {}
-
-    bool MatchesAt(const CString& line, size_t pos) const
-    {
-        if (m_text.empty() || pos >= line.size())
-            return false;
-        if (m_text.size() == 1)
-            return line[pos] == m_text[0];
-        return line.compare(pos, m_text.size(), m_text) == 0;
-    }
-    bool EndsLine(const CString& line) const
-    {
-        return !m_text.empty() && line.size() >= m_text.size() && MatchesAt(line, line.size() - m_text.size());
-    }
-    size_t FindFrom(const CString& line, size_t pos) const
-    {
-        if (m_text.empty())
-            return CString::npos;
-        return m_text.size() == 1 ? line.find(m_text[0], pos) : line.find(m_text, pos);
-    }
-    size_t Length() const { return m_text.size(); }
-    // Removes every delimiter at the start of `line`.
-    void TrimLeading(CString& line) const
-    {
-        size_t start = 0;
-        while (MatchesAt(line, start))
-            start += m_text.size();
-        if (start)
-            line.erase(0, start);
-    }
-
-private:
-    std::string_view m_text;
-};
-
-// How a field was taken; only plain fields and accepted quoted fields let a run of delimiters follow.
-enum class FieldEnd { LineEndsInDelimiter, NoField, Plain, QuotedAccepted, QuotedRejected, OnlyQuotes };
-
-FieldEnd TakeField(CString& line, int& pos, const Delimiter& delimiter, CString& field)
-{
-    field.clear();
-    const size_t length = line.size();
-    const size_t at = static_cast<size_t>(pos);
-    if (at == length && delimiter.EndsLine(line)) {
-        pos = static_cast<int>(length) + 1;
-        return FieldEnd::LineEndsInDelimiter;
-    }
-    if (at >= length) {
-        pos = -1;
-        return FieldEnd::NoField;
-    }
-    if (line[at] != '"') {
-        size_t found = delimiter.FindFrom(line, at);
-        if (found == CString::npos) {
-            field.assign(line, at, length - at);
-            pos = static_cast<int>(length);
-        } else {
-            field.assign(line, at, found - at);
-            pos = static_cast<int>(found + delimiter.Length());
-        }
-        return FieldEnd::Plain;
-    }
-    size_t start = at;
-    while (start < length && line[start] == '"')
-        ++start;
-    if (start == length) {
-        pos = -1;
-        return FieldEnd::OnlyQuotes;
-    }
-    size_t closing = line.find('"', start);
-    if (closing == CString::npos)
-        closing = length;
-    size_t behind = closing + 1;
-    if (delimiter.MatchesAt(line, behind)) {
-        field.assign(line, start, closing - start);
-        pos = static_cast<int>(behind + delimiter.Length());
-        return FieldEnd::QuotedAccepted;
-    }
-    if (closing + 1 == length) {
-        field.assign(line, start, closing - start);
-        pos = static_cast<int>(behind);
-        return FieldEnd::QuotedAccepted;
-    }
-    pos = static_cast<int>(behind);
-    ui::MessageBox(res::LoadString(res::IDS_QUOTE_OR_DELIMITER_MISSING), CString(), ui::MB_OK);
-    return FieldEnd::QuotedRejected;
-}
-
-void SkipDelimiters(const CString& line, int& pos, const Delimiter& delimiter)
-{
-    while (pos >= 0 && static_cast<size_t>(pos) < line.size() && delimiter.MatchesAt(line, static_cast<size_t>(pos)))
-        pos += static_cast<int>(delimiter.Length());
-}
-
-// The number of non-empty pieces of `format` between separators.
-int CountTokens(const CString& format, const Delimiter& separator)
-{
-    int tokens = 0;
-    size_t pos = 0;
-    while (pos < format.size()) {
-        if (separator.MatchesAt(format, pos)) {
-            pos += separator.Length();
-            continue;
-        }
-        ++tokens;
-        size_t next = separator.FindFrom(format, pos);
-        pos = next == CString::npos ? format.size() : next;
-    }
-    return tokens;
 }
 
 bool IsFormatSeparator(char c)
@@ -222,31 +108,28 @@ CString CSpecification::GetDecimalSeparatorString() const
     return separator;
 }
 
+delimited::Dialect CSpecification::GetDialect() const
+{
+    delimited::Dialect dialect;
+    dialect.delimiter = GetDelimiterString();
+    dialect.ignoreConsecutive = m_bIgnoreConsecutiveDelimiters != 0;
+    dialect.ignoreLeading = m_bIgnoreBegginingOfLineDelimiters != 0;
+    dialect.decimalSeparator = GetDecimalSeparatorString();
+    return dialect;
+}
+
 CString CSpecification::NextField(CString& line, int& pos) const
 {
-    CString field;
-    if (line.empty() || pos < 0) {
-        pos = -1;
-        return field;
-    }
-    const CString delimiterText = GetDelimiterString();
-    const Delimiter delimiter(delimiterText);
-
-    if (!m_bIgnoreConsecutiveDelimiters) {
-        if (m_bIgnoreBegginingOfLineDelimiters && pos == 0)
-            delimiter.TrimLeading(line);
-        TakeField(line, pos, delimiter, field);
-        return field;
-    }
-    if (!m_bIgnoreBegginingOfLineDelimiters && pos == 0 && delimiter.MatchesAt(line, 0)) {
-        // The leading run stands for one empty first field; the next call starts at the first value.
-        delimiter.TrimLeading(line);
-        return field;
-    }
-    SkipDelimiters(line, pos, delimiter);
-    FieldEnd end = TakeField(line, pos, delimiter, field);
-    if (end == FieldEnd::Plain || end == FieldEnd::QuotedAccepted)
-        SkipDelimiters(line, pos, delimiter);
+    const CString delimiter = GetDelimiterString();
+    const delimited::FieldRule rule(delimiter, m_bIgnoreConsecutiveDelimiters != 0, m_bIgnoreBegginingOfLineDelimiters != 0);
+    std::string_view rest = line;
+    bool quoteError = false;
+    CString field(rule.Next(rest, pos, quoteError));
+    // The rule may have removed delimiters from the line's start; the caller's line loses them too.
+    if (rest.size() != line.size())
+        line.erase(0, line.size() - rest.size());
+    if (quoteError)
+        ui::MessageBox(res::LoadString(res::IDS_QUOTE_OR_DELIMITER_MISSING), CString(), ui::MB_OK);
     return field;
 }
 
@@ -266,7 +149,7 @@ int CSpecification::CountFormatColumns(int byOption) const
 
 int CSpecification::CountFormatTokens(const CString& format, const CString& separator)
 {
-    return CountTokens(format, Delimiter(separator));
+    return delimited::Delimiter(separator).CountPieces(format);
 }
 
 int CSpecification::GetDateTimeColumn() const

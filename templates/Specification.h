@@ -1,5 +1,7 @@
 #pragma once
 // The template: how the values of a delimited ASCII file or an Excel sheet are laid out.
+#include "delimited/Dialect.h"
+#include "platform/system/Status.h"
 #include "platform/system/Types.h"
 
 #include <array>
@@ -70,8 +72,10 @@ public:
     // The first column of the current date/time option; -1 for an unknown option.
     virtual int GetDateTimeColumn() const;
 
-    // Why the last Save or Load failed, for callers that can show more than a 0.
-    const CString& LastError() const { return m_strLastError; }
+    // Why the last Save or Load failed, for callers that can show more than a 0: the problem, and
+    // its text ("file: reason").
+    const sys::Status& LastStatus() const { return m_lastStatus; }
+    CString LastError() const { return m_lastStatus.problem().Describe(); }
 
     void SetTemplateFile(const CString& path);
     CString GetDelimiterString() const;
@@ -80,9 +84,13 @@ public:
     // (sys::LocaleDecimalSeparator).
     // 0 (and a blank) for an unknown name.
     static int MapSeparatorName(const CString& name, CString& text);
+    // The delimiter, the two delimiter flags and the decimal separator as one value, for the readers
+    // of delimited text (delimited/Dialect.h).
+    delimited::Dialect GetDialect() const;
     // The next field of `line` from `pos` (0 for the first call); `pos` becomes -1 after the last
-    // field. A user delimiter of several characters separates only where its whole text stands. A
-    // malformed quoted field shows message 2305 and gives an empty field.
+    // field: delimited::FieldRule, which may also cut delimiters off the line's start. A user delimiter
+    // of several characters separates only where its whole text stands. A malformed quoted field shows
+    // message 2305 and gives an empty field.
     CString NextField(CString& line, int& pos) const;
 
     static int GetValueTypeCode(const CString& name, int& code);
@@ -109,5 +117,5 @@ protected:
     CSpecification(const CSpecification&) = default;
     CSpecification& operator=(const CSpecification&) = default;
 
-    mutable CString m_strLastError;
+    sys::Status m_lastStatus;
 };

@@ -73,13 +73,11 @@ OpenedTemplate Make(const FileLayout& layout)
 }
 
 template <class Spec>
-bool LoadKind(OpenedTemplate& opened, std::string_view bytes, const CString& path, CString& error)
+sys::Status LoadKind(OpenedTemplate& opened, std::string_view bytes, const CString& path)
 {
     auto& spec = static_cast<Spec&>(*opened.spec);
-    if (spec.LoadFromMemory(bytes, path))
-        return true;
-    error = spec.LastError();
-    return false;
+    spec.LoadFromMemory(bytes, path);
+    return spec.LastStatus();
 }
 
 } // namespace
@@ -93,32 +91,32 @@ OpenedTemplate NewTemplate(const CString& kind)
     return {};
 }
 
-OpenedTemplate OpenTemplateFile(const CString& path, CString& error)
+sys::Status OpenTemplateFile(const CString& path, OpenedTemplate& opened)
 {
+    opened = {};
     try {
         std::string bytes;
-        if (!ReadFileBytes(path, bytes, error))
-            return {};
+        if (sys::Status read = ReadFileBytes(path, bytes); !read)
+            return read;
         pugi::xml_document document;
-        if (!ParseDocument(bytes, path, document, error))
-            return {};
+        if (sys::Status parsed = ParseDocument(bytes, path, document); !parsed)
+            return parsed;
         CString query = CString("//") + AsciiFileLayout().root + " | //" + ExcelFileLayout().root;
         pugi::xml_node root = document.select_node(query.c_str()).node();
-        if (!root) {
-            error = path + ": not a template file: no element " + AsciiFileLayout().root + " or " +
-                    ExcelFileLayout().root;
-            return {};
-        }
-        bool ascii = std::strcmp(root.name(), AsciiFileLayout().root) == 0;
-        OpenedTemplate opened = NewTemplate(ascii ? AsciiFileLayout().kind : ExcelFileLayout().kind);
-        bool loaded = ascii ? LoadKind<CAsciiSpecification>(opened, bytes, path, error)
-                            : LoadKind<CExcelSpecification>(opened, bytes, path, error);
-        if (!loaded)
-            return {};
-        return opened;
+        if (!root)
+            return sys::Status::Fail(path, 0,
+                                     std::string("not a template file: no element ") + AsciiFileLayout().root + " or " +
+                                         ExcelFileLayout().root);
+        const bool ascii = std::strcmp(root.name(), AsciiFileLayout().root) == 0;
+        OpenedTemplate made = NewTemplate(ascii ? AsciiFileLayout().kind : ExcelFileLayout().kind);
+        sys::Status loaded = ascii ? LoadKind<CAsciiSpecification>(made, bytes, path)
+                                   : LoadKind<CExcelSpecification>(made, bytes, path);
+        if (loaded)
+            opened = std::move(made);
+        return loaded;
     } catch (const std::exception& e) {
-        error = path + ": cannot be read: " + e.what();
-        return {};
+        opened = {};
+        return sys::Status::Fail(path, 0, std::string("cannot be read: ") + e.what());
     }
 }
 

@@ -14,9 +14,9 @@ struct OpenedTemplate {
     const FileLayout* layout = nullptr; // the kind's file layout; its `kind` is "ascii" or "excel"
 };
 
-// Loads `path` into a template of the kind its root element names. On failure the template is null and
-// `error` says why.
-OpenedTemplate OpenTemplateFile(const CString& path, CString& error);
+// Loads `path` into `opened`, a template of the kind its root element names; on failure `opened`
+// holds no template.
+sys::Status OpenTemplateFile(const CString& path, OpenedTemplate& opened);
 
 // A new template with the defaults; `kind` is "ascii" or "excel", anything else gives null.
 OpenedTemplate NewTemplate(const CString& kind);

@@ -20,22 +20,19 @@ struct FileCloser {
 };
 using File = std::unique_ptr<std::FILE, FileCloser>;
 
-bool DecodeUtf16(std::string_view bytes, bool bigEndian, std::string& utf8, CString& error)
+sys::Status DecodeUtf16(std::string_view bytes, bool bigEndian, std::string& utf8)
 {
-    if (bytes.size() % 2 != 0) {
-        error = "the UTF-16 text has an odd number of bytes";
-        return false;
-    }
+    if (bytes.size() % 2 != 0)
+        return sys::Status::Fail({}, 0, "the UTF-16 text has an odd number of bytes");
     utf8.clear();
     utf8.reserve(bytes.size());
     size_t unpairedAt = 0;
     const size_t used = text::AppendUtf16AsUtf8(bytes, bigEndian, utf8, unpairedAt);
-    if (used < bytes.size()) {
-        error = text::Format("the UTF-16 text has an unpaired surrogate at byte %zu",
-                             unpairedAt == std::string_view::npos ? used : unpairedAt);
-        return false;
-    }
-    return true;
+    if (used < bytes.size())
+        return sys::Status::Fail({}, 0,
+                                 text::Format("the UTF-16 text has an unpaired surrogate at byte %zu",
+                                              unpairedAt == std::string_view::npos ? used : unpairedAt));
+    return sys::Status::Ok();
 }
 
 bool StartsWith(std::string_view bytes, std::string_view prefix)
@@ -113,35 +110,32 @@ bool IsTrue(std::string_view value, bool ignoreCase)
     return ignoreCase ? text::EqualsNoCase(value, "true") : value == "true";
 }
 
-bool ReadAttribute(const pugi::xml_attribute& attribute, const AttributeRule& rule, bool flagIgnoresCase,
-                   const CString& name, CSpecification& model, CString& error)
+sys::Status ReadAttribute(const pugi::xml_attribute& attribute, const AttributeRule& rule, bool flagIgnoresCase,
+                          const CString& name, CSpecification& model)
 {
     std::string_view value = attribute.value();
-    if (value.size() > kMaxValueBytes) {
-        error = text::Format("%s: the attribute %s is longer than %zu bytes", name.c_str(), rule.name, kMaxValueBytes);
-        return false;
-    }
+    if (value.size() > kMaxValueBytes)
+        return sys::Status::Fail(name, 0, text::Format("the attribute %s is longer than %zu bytes", rule.name, kMaxValueBytes));
     switch (rule.form) {
     case ValueForm::Number:
     case ValueForm::NumberLine:
-        if (!ParseWholeNumber(value, *rule.number(model))) {
-            error = text::Format("%s: the attribute %s must be a whole number from %d to %d, not \"%.40s\"",
-                                 name.c_str(), rule.name, INT_MIN, INT_MAX, attribute.value());
-            return false;
-        }
-        return true;
+        if (!ParseWholeNumber(value, *rule.number(model)))
+            return sys::Status::Fail(name, 0,
+                                     text::Format("the attribute %s must be a whole number from %d to %d, not \"%.40s\"",
+                                                  rule.name, INT_MIN, INT_MAX, attribute.value()));
+        return sys::Status::Ok();
     case ValueForm::Flag:
     case ValueForm::FlagWhenOne:
         *rule.number(model) = IsTrue(value, flagIgnoresCase) ? 1 : 0;
-        return true;
+        return sys::Status::Ok();
     case ValueForm::Text:
         rule.text(model)->assign(value);
-        return true;
+        return sys::Status::Ok();
     case ValueForm::SelItems:
         CSpecification::ParseSelItems(CString(value), model.m_arrSelItems);
-        return true;
+        return sys::Status::Ok();
     }
-    return true;
+    return sys::Status::Ok();
 }
 
 // The text of a node and everything below it, as a DOM's text property gives it.
@@ -175,8 +169,8 @@ std::vector<pugi::xml_node> Children(const pugi::xml_node& list)
     return children;
 }
 
-bool ReadItemDefinitions(const pugi::xml_document& document, const FileLayout& layout, const CString& name,
-                         std::vector<CItemDefinition>& items, CString& error)
+sys::Status ReadItemDefinitions(const pugi::xml_document& document, const FileLayout& layout, const CString& name,
+                                std::vector<CItemDefinition>& items)
 {
     static const char* const kLists[] = {"ItemTitles", "ItemTypes", "ItemUnits", "ValueTypes"};
     std::vector<pugi::xml_node> lists[4];
@@ -187,10 +181,8 @@ bool ReadItemDefinitions(const pugi::xml_document& document, const FileLayout& l
         lists[i] = Children(list);
         count = std::max(count, lists[i].size());
     }
-    if (count > kMaxItemDefinitions) {
-        error = text::Format("%s: more than %zu item definitions", name.c_str(), kMaxItemDefinitions);
-        return false;
-    }
+    if (count > kMaxItemDefinitions)
+        return sys::Status::Fail(name, 0, text::Format("more than %zu item definitions", kMaxItemDefinitions));
     items.clear();
     items.reserve(count);
     for (size_t index = 0; index < count; ++index) {
@@ -198,15 +190,13 @@ bool ReadItemDefinitions(const pugi::xml_document& document, const FileLayout& l
         for (int i = 0; i < 4; ++i) {
             if (index < lists[i].size() && lists[i][index].type() == pugi::node_element)
                 fields[i] = NodeText(lists[i][index]);
-            if (fields[i].size() > kMaxValueBytes) {
-                error = text::Format("%s: an entry of %s is longer than %zu bytes", name.c_str(), kLists[i],
-                                     kMaxValueBytes);
-                return false;
-            }
+            if (fields[i].size() > kMaxValueBytes)
+                return sys::Status::Fail(name, 0,
+                                         text::Format("an entry of %s is longer than %zu bytes", kLists[i], kMaxValueBytes));
         }
         items.push_back({fields[0], fields[1], fields[2], fields[3]});
     }
-    return true;
+    return sys::Status::Ok();
 }
 
 CString AttributeText(const AttributeRule& rule, CSpecification& spec)
@@ -257,13 +247,13 @@ char32_t CharacterXmlCannotCarry(std::string_view utf8)
     return 0;
 }
 
-// False, with `error` naming the value, when a text of the template could not be written as XML.
-bool CheckWritable(CSpecification& spec, const FileLayout& layout, CString& error)
+// Fails, naming the value of `path`, when a text of the template could not be written as XML.
+sys::Status CheckWritable(CSpecification& spec, const FileLayout& layout, const CString& path)
 {
-    auto refuse = [&error](const CString& what, char32_t c) {
-        error = text::Format("%s holds the character U+%04X, which an XML file cannot carry", what.c_str(),
-                             static_cast<unsigned>(c));
-        return false;
+    auto refuse = [&path](const CString& what, char32_t c) {
+        return sys::Status::Fail(path, 0,
+                                 text::Format("%s holds the character U+%04X, which an XML file cannot carry",
+                                              what.c_str(), static_cast<unsigned>(c)));
     };
     for (const AttributeRule& rule : layout.attributes)
         if (char32_t c = CharacterXmlCannotCarry(text::ToUtf8(AttributeText(rule, spec))))
@@ -275,7 +265,7 @@ bool CheckWritable(CSpecification& spec, const FileLayout& layout, CString& erro
             if (char32_t c = CharacterXmlCannotCarry(text::ToUtf8(*field)))
                 return refuse(text::Format("item definition %zu", i + 1), c);
     }
-    return true;
+    return sys::Status::Ok();
 }
 
 bool BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_document& document)
@@ -303,84 +293,67 @@ bool BuildDocument(CSpecification& spec, const FileLayout& layout, pugi::xml_doc
 
 } // namespace
 
-bool ReadFileBytes(const CString& path, std::string& bytes, CString& error)
+sys::Status ReadFileBytes(const CString& path, std::string& bytes)
 {
     std::string problem;
     File file(sys::OpenRegularFile(path, problem));
-    if (!file) {
-        error = path + ": " + problem;
-        return false;
-    }
+    if (!file)
+        return sys::Status::Fail(path, 0, problem);
     try {
         bytes.clear();
         char buffer[65536];
         size_t got = 0;
         while ((got = std::fread(buffer, 1, sizeof(buffer), file.get())) > 0) {
-            if (bytes.size() + got > kMaxFileBytes) {
-                error = text::Format("%s: larger than %zu bytes, which no template file is", path.c_str(),
-                                     kMaxFileBytes);
-                return false;
-            }
+            if (bytes.size() + got > kMaxFileBytes)
+                return sys::Status::Fail(path, 0, text::Format("larger than %zu bytes, which no template file is", kMaxFileBytes));
             bytes.append(buffer, got);
         }
     } catch (const std::exception& e) {
-        error = path + ": cannot be read: " + e.what();
-        return false;
+        return sys::Status::Fail(path, 0, std::string("cannot be read: ") + e.what());
     }
-    if (std::ferror(file.get())) {
-        error = path + ": cannot be read: " + std::strerror(errno);
-        return false;
-    }
-    return true;
+    if (std::ferror(file.get()))
+        return sys::Status::Fail(path, 0, std::string("cannot be read: ") + std::strerror(errno));
+    return sys::Status::Ok();
 }
 
-bool DecodeToUtf8(std::string_view bytes, std::string& utf8, CString& error)
+sys::Status DecodeToUtf8(std::string_view bytes, std::string& utf8)
 {
     using namespace std::string_view_literals;
-    if (StartsWith(bytes, "\xFF\xFE\0\0"sv) || StartsWith(bytes, "\0\0\xFE\xFF"sv)) {
-        error = "UTF-32 text is not accepted; save the file as UTF-16 or UTF-8";
-        return false;
-    }
+    if (StartsWith(bytes, "\xFF\xFE\0\0"sv) || StartsWith(bytes, "\0\0\xFE\xFF"sv))
+        return sys::Status::Fail({}, 0, "UTF-32 text is not accepted; save the file as UTF-16 or UTF-8");
     if (StartsWith(bytes, "\xFF\xFE"sv))
-        return DecodeUtf16(bytes.substr(2), false, utf8, error);
+        return DecodeUtf16(bytes.substr(2), false, utf8);
     if (StartsWith(bytes, "\xFE\xFF"sv))
-        return DecodeUtf16(bytes.substr(2), true, utf8, error);
+        return DecodeUtf16(bytes.substr(2), true, utf8);
     if (StartsWith(bytes, "<\0"sv))
-        return DecodeUtf16(bytes, false, utf8, error);
+        return DecodeUtf16(bytes, false, utf8);
     if (StartsWith(bytes, "\0<"sv))
-        return DecodeUtf16(bytes, true, utf8, error);
+        return DecodeUtf16(bytes, true, utf8);
     if (StartsWith(bytes, "\xEF\xBB\xBF"sv))
         bytes.remove_prefix(3);
     utf8 = text::ToUtf8(bytes);
-    return true;
+    return sys::Status::Ok();
 }
 
-bool ParseDocument(std::string_view bytes, const CString& name, pugi::xml_document& document, CString& error)
+sys::Status ParseDocument(std::string_view bytes, const CString& name, pugi::xml_document& document)
 {
     std::string utf8;
-    if (!DecodeToUtf8(bytes, utf8, error)) {
-        error = name + ": " + error;
-        return false;
-    }
-    if (!IsWellFormedXml(utf8, error)) {
-        error = name + ": " + error;
-        return false;
-    }
+    if (const sys::Status decoded = DecodeToUtf8(bytes, utf8); !decoded)
+        return sys::Status::Fail(name, 0, decoded.problem().message);
+    if (const sys::Status wellFormed = CheckWellFormedXml(utf8); !wellFormed)
+        return sys::Status::Fail(name, 0, wellFormed.problem().message);
     // Comments and processing instructions are kept because they count as entries of the item
     // lists; literal tabs and line feeds in attribute values are kept as written.
     const unsigned flags = (pugi::parse_default & ~pugi::parse_wconv_attribute) | pugi::parse_comments |
                            pugi::parse_pi | pugi::parse_declaration;
     pugi::xml_parse_result result = document.load_buffer(utf8.data(), utf8.size(), flags, pugi::encoding_utf8);
-    if (!result) {
-        error = name + ": the XML document cannot be stored (" + result.description() + " at " +
-                Position(utf8, static_cast<size_t>(result.offset)) + ")";
-        return false;
-    }
-    if (ElementDepth(document, kMaxElementDepth) > kMaxElementDepth) {
-        error = text::Format("%s: elements nested deeper than %d levels", name.c_str(), kMaxElementDepth);
-        return false;
-    }
-    return true;
+    if (!result)
+        return sys::Status::Fail(name, 0,
+                                 std::string("the XML document cannot be stored (") + result.description() + " at " +
+                                     Position(utf8, static_cast<size_t>(result.offset)) + ")");
+    if (ElementDepth(document, kMaxElementDepth) > kMaxElementDepth)
+        return sys::Status::Fail(name, 0, text::Format("elements nested deeper than %d levels", kMaxElementDepth));
+    return sys::Status::Ok();
 }
 
 pugi::xml_node FindElement(const pugi::xml_document& document, const char* name)
@@ -389,24 +362,24 @@ pugi::xml_node FindElement(const pugi::xml_document& document, const char* name)
     return document.select_node(query.c_str()).node();
 }
 
-bool ReadTemplate(const pugi::xml_document& document, const FileLayout& layout, const CString& name,
-                  CSpecification& spec, CString& error)
+sys::Status ReadTemplate(const pugi::xml_document& document, const FileLayout& layout, const CString& name,
+                         CSpecification& spec)
 {
     pugi::xml_node root = FindElement(document, layout.root);
-    if (!root) {
-        error = name + ": no element " + layout.root + " in the document";
-        return false;
-    }
+    if (!root)
+        return sys::Status::Fail(name, 0, std::string("no element ") + layout.root + " in the document");
     for (bool overridesPass : {false, true}) {
         for (const AttributeRule& rule : layout.attributes) {
             if (rule.overrides != overridesPass)
                 continue;
             pugi::xml_attribute attribute = root.attribute(rule.name);
-            if (attribute && !ReadAttribute(attribute, rule, layout.flagTrueIgnoresCase, name, spec, error))
-                return false;
+            if (!attribute)
+                continue;
+            if (sys::Status read = ReadAttribute(attribute, rule, layout.flagTrueIgnoresCase, name, spec); !read)
+                return read;
         }
     }
-    return ReadItemDefinitions(document, layout, name, spec.m_DataDesc.m_vecItemDefs, error);
+    return ReadItemDefinitions(document, layout, name, spec.m_DataDesc.m_vecItemDefs);
 }
 
 std::string RenderTemplate(CSpecification& spec, const FileLayout& layout)
@@ -420,36 +393,27 @@ std::string RenderTemplate(CSpecification& spec, const FileLayout& layout)
     return out.str();
 }
 
-bool WriteTemplate(CSpecification& spec, const FileLayout& layout, const CString& path, CString& error)
+sys::Status WriteTemplate(CSpecification& spec, const FileLayout& layout, const CString& path)
 {
-    if (path.empty()) {
-        error = "no file name to save the template to";
-        return false;
-    }
-    if (!CheckWritable(spec, layout, error)) {
-        error = path + ": " + error;
-        return false;
-    }
+    if (path.empty())
+        return sys::Status::Fail({}, 0, "no file name to save the template to");
+    if (sys::Status writable = CheckWritable(spec, layout, path); !writable)
+        return writable;
     std::string contents;
     try {
         contents = RenderTemplate(spec, layout);
     } catch (const std::exception& e) {
-        error = path + ": the template cannot be built: " + e.what();
-        return false;
+        return sys::Status::Fail(path, 0, std::string("the template cannot be built: ") + e.what());
     }
     File file(std::fopen(path.c_str(), "wb"));
-    if (!file) {
-        error = path + ": cannot be written: " + std::strerror(errno);
-        return false;
-    }
+    if (!file)
+        return sys::Status::Fail(path, 0, std::string("cannot be written: ") + std::strerror(errno));
     bool written = std::fwrite(contents.data(), 1, contents.size(), file.get()) == contents.size();
     written = std::fflush(file.get()) == 0 && written;
     int closed = std::fclose(file.release());
-    if (!written || closed != 0) {
-        error = path + ": cannot be written: " + std::strerror(errno);
-        return false;
-    }
-    return true;
+    if (!written || closed != 0)
+        return sys::Status::Fail(path, 0, std::string("cannot be written: ") + std::strerror(errno));
+    return sys::Status::Ok();
 }
 
 } // namespace tmplfile

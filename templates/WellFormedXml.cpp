@@ -29,7 +29,7 @@ void XMLCALL RefuseDoctype(void* data, const XML_Char*, const XML_Char*, const X
 
 } // namespace
 
-bool IsWellFormedXml(std::string_view utf8, CString& fault)
+sys::Status CheckWellFormedXml(std::string_view utf8)
 {
     // Naming the encoding here overrides the declaration's: the bytes are UTF-8 by now.
     std::unique_ptr<XML_ParserStruct, ParserFree> parser(XML_ParserCreate("UTF-8"));
@@ -40,16 +40,14 @@ bool IsWellFormedXml(std::string_view utf8, CString& fault)
     XML_SetStartDoctypeDeclHandler(parser.get(), &RefuseDoctype);
     XML_SetParamEntityParsing(parser.get(), XML_PARAM_ENTITY_PARSING_NEVER);
     if (XML_Parse(parser.get(), utf8.data(), static_cast<int>(utf8.size()), XML_TRUE) == XML_STATUS_OK)
-        return true;
-    if (check.sawDoctype) {
-        fault = "a document type declaration is not accepted in a template file";
-        return false;
-    }
-    fault = text::Format("not a well-formed XML document (%s at line %lu, column %lu)",
-                         XML_ErrorString(XML_GetErrorCode(parser.get())),
-                         static_cast<unsigned long>(XML_GetCurrentLineNumber(parser.get())),
-                         static_cast<unsigned long>(XML_GetCurrentColumnNumber(parser.get()) + 1));
-    return false;
+        return sys::Status::Ok();
+    if (check.sawDoctype)
+        return sys::Status::Fail({}, 0, "a document type declaration is not accepted in a template file");
+    return sys::Status::Fail({}, 0,
+                             text::Format("not a well-formed XML document (%s at line %lu, column %lu)",
+                                          XML_ErrorString(XML_GetErrorCode(parser.get())),
+                                          static_cast<unsigned long>(XML_GetCurrentLineNumber(parser.get())),
+                                          static_cast<unsigned long>(XML_GetCurrentColumnNumber(parser.get()) + 1)));
 }
 
 } // namespace tmplfile

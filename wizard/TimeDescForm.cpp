@@ -1,7 +1,7 @@
 #include "wizard/TimeDescForm.h"
 
 #include "engine/Engine.h"
-#include "parsers/DateTimeText.h"
+#include "platform/system/DateFormat.h"
 #include "platform/ui/UserInterface.h"
 #include "resources/StringTable.h"
 #include "wizard/PreviewChain.h"
@@ -12,10 +12,10 @@ namespace {
 bool NumberTokens(const CString& text, size_t least, size_t most, std::vector<int>& numbers)
 {
     numbers.clear();
-    for (const CString& token : SplitDateTimeTokens(text)) {
-        if (token.find_first_not_of("0123456789") != CString::npos || token.size() > 4)
+    for (std::string_view token : sys::DateTimeTokens(text)) {
+        if (token.find_first_not_of("0123456789") != std::string_view::npos || token.size() > 4)
             return false;
-        numbers.push_back(std::stoi(token));
+        numbers.push_back(std::stoi(std::string(token)));
     }
     return numbers.size() >= least && numbers.size() <= most;
 }

@@ -148,7 +148,7 @@ std::unique_ptr<converter::ConversionLog> OpenLog(const converter::JobSetup& set
     auto log = std::make_unique<converter::ConversionLog>(path, nullptr);
     if (log->IsOpen())
         return log;
-    std::fprintf(stderr, "Velmora: %s; logging to standard error\n", text::EscapeControls(log->OpenError()).c_str());
+    std::fprintf(stderr, "Velmora: %s; logging to standard error\n", text::EscapeControls(log->status().problem().Describe()).c_str());
     return std::make_unique<converter::ConversionLog>(std::string(), stderr);
 }
 
@@ -186,6 +186,15 @@ int RunUntilStopped(const converter::JobSetup& setup, converter::ConversionLog& 
     return status;
 }
 
+// False, with the reason on standard error, when the setup file cannot be read.
+bool ReadSetup(const std::string& file, converter::JobSetup& setup)
+{
+    const sys::Status read = converter::ReadJobSetup(file, setup);
+    if (!read)
+        std::fprintf(stderr, "Velmora: %s\n", text::EscapeControls(read.problem().Describe()).c_str());
+    return read.ok();
+}
+
 // A dry run writes nothing, so it needs neither the log nor the watch over part files.
 int DryRun(const Arguments& arguments)
 {
@@ -193,11 +202,8 @@ int DryRun(const Arguments& arguments)
     ui::SetProcessUserInterface(&silent);
     try {
         converter::JobSetup setup;
-        std::string error;
-        if (!converter::ReadJobSetup(arguments.setupFile, setup, error)) {
-            std::fprintf(stderr, "Velmora: %s\n", text::EscapeControls(error).c_str());
+        if (!ReadSetup(arguments.setupFile, setup))
             return converter::kExitSetup;
-        }
         return converter::DryRunJob(setup, stdout, arguments.json, arguments.threads, arguments.share, arguments.shares);
     } catch (const std::exception& e) {
         std::fprintf(stderr, "Velmora: stopped: %s\n", text::EscapeControls(e.what()).c_str());
@@ -231,11 +237,8 @@ int main(int argc, char** argv)
     ui::SetProcessUserInterface(&silent);
     try {
         converter::JobSetup setup;
-        std::string error;
-        if (!converter::ReadJobSetup(arguments.setupFile, setup, error)) {
-            std::fprintf(stderr, "Velmora: %s\n", text::EscapeControls(error).c_str());
+        if (!ReadSetup(arguments.setupFile, setup))
             return converter::kExitSetup;
-        }
         std::unique_ptr<converter::ConversionLog> log = OpenLog(setup);
         return RunUntilStopped(setup, *log,
                                {arguments.threads, arguments.quiet ? nullptr : stderr, arguments.share, arguments.shares},

@@ -1,8 +1,10 @@
 #include "apps/velmora/CommandLineSetup.h"
 
-#include "converter/Converter.h"
+#include "converter/ConversionJob.h"
+#include "converter/RunPlan.h"
 #include "guess/GuessReport.h"
 #include "platform/bridge/BridgeVerdict.h"
+#include "platform/system/FileFormat.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
 #include "platform/ui/UserInterface.h"
@@ -31,17 +33,18 @@ bool Misused(SetupOutcome& outcome, const std::string& failure)
     return Refused(outcome, failure);
 }
 
-// The files of `folder` a run would take, by name.
+// The files of `folder` a run would take, by name: the engine's own listing.
 std::vector<std::string> FolderFiles(const std::string& folder, int format)
 {
+    converter::JobSetup setup;
+    setup.inputType = 2;
+    setup.inputFormat = format;
+    setup.inputFolder = folder;
+    setup.outputFormat = format;
+    const converter::RunPlan plan(setup, {});
     std::vector<std::string> files;
-    if (const auto names = sys::ListFolder(folder))
-        for (const std::string& name : *names) {
-            const std::string path = sys::JoinPath(folder, name);
-            if (name[0] != '.' && sys::IsRegularFile(path) && converter::AcceptsExtension(static_cast<converter::Format>(format), path))
-                files.push_back(path);
-        }
-    std::sort(files.begin(), files.end());
+    for (const converter::PlannedFile& file : plan.Files())
+        files.push_back(file.input);
     return files;
 }
 
@@ -53,7 +56,7 @@ int FormatOfFolder(const std::string& folder, std::string& formats)
         if (!FolderFiles(folder, format).empty()) {
             found = format;
             ++kinds;
-            formats += std::string(formats.empty() ? "" : ", ") + converter::FormatName(static_cast<converter::Format>(format));
+            formats += std::string(formats.empty() ? "" : ", ") + sys::FindFormat(format)->name;
         }
     return kinds == 1 ? found : 0;
 }
@@ -147,7 +150,7 @@ std::string OutputInFolder(const std::string& folder, const std::string& input, 
     std::string name = sys::FileTitle(input);
     if (const size_t dot = name.rfind('.'); dot != std::string::npos && dot > 0)
         name.erase(dot);
-    return sys::JoinPath(folder, name + converter::OutputExtension(static_cast<converter::Format>(format)));
+    return sys::JoinPath(folder, name + sys::FindFormat(format)->outputExtension);
 }
 
 // The input format: named, or told by the extension of the file (of the folder's files).
@@ -224,20 +227,18 @@ bool ReadItemList(const std::string& text, CUIntArray& items)
 
 int FormatOfExtension(const std::string& path)
 {
-    const std::string extension = text::ToLower(sys::FileExtension(path));
-    if (extension == ".rbx0")
-        return 1;
-    if (extension.empty() || extension == ".txt" || extension == ".csv" || extension == ".tab")
-        return 2;
-    if (extension == ".xls" || extension == ".xlsx")
-        return 3;
+    if (sys::FileExtension(path).empty())
+        return sys::Number(sys::FileFormat::Ascii);
+    for (const sys::FileFormatInfo& info : sys::kFileFormats)
+        if (sys::HasInputExtension(info.format, path))
+            return sys::Number(info.format);
     return 0;
 }
 
 int FormatOfName(const std::string& name)
 {
-    const std::string lower = text::ToLower(name);
-    return lower == "rbx0" ? 1 : lower == "ascii" ? 2 : lower == "excel" ? 3 : 0;
+    const sys::FileFormatInfo* info = sys::FindFormatNamed(name);
+    return info ? sys::Number(info->format) : 0;
 }
 
 std::string BridgeRefusal(const CEngine& engine, const CString& templatePath)

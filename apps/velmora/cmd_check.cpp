@@ -7,6 +7,7 @@
 #include "converter/DryRun.h"
 #include "converter/RunPlan.h"
 #include "engine/Engine.h"
+#include "platform/system/FileFormat.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
 #include "platform/ui/UserInterface.h"
@@ -200,7 +201,7 @@ std::vector<CheckResult> RunChecks(CEngine& engine, const std::string& document)
     std::vector<CheckResult> results;
     const CheckResult input = CheckInput(engine);
     results.push_back(input);
-    const bool usesTemplate = engine.m_nInputFormat == 2 || engine.m_nInputFormat == 3;
+    const bool usesTemplate = engine.m_nInputFormat != sys::Number(sys::FileFormat::Rbx0) && sys::FindFormat(engine.m_nInputFormat);
     if (input.passed) {
         engine.SetInput(engine.m_nInputType, engine.m_nInputFormat, engine.m_strInputFile, engine.m_strInputFolder);
         BindPreviewFile(engine);

@@ -2,6 +2,7 @@
 // file the way the wizard's preview does and prints what the parser made of it.
 #include "apps/velmora/Commands.h"
 #include "parsers/ParserFactory.h"
+#include "platform/system/FileFormat.h"
 #include "platform/system/Text.h"
 #include "platform/ui/UserInterface.h"
 
@@ -88,7 +89,8 @@ int ReadOptions(int argc, char** argv, Options& options)
         return host::UsageError("preview", "needs a data file");
     if (formatName.empty())
         return host::UsageError("preview", "needs --format ascii, --format excel or --format rbx0");
-    options.format = FormatFromName(formatName);
+    const sys::FileFormatInfo* named = sys::FindFormatNamed(formatName);
+    options.format = named ? sys::Number(named->format) : 0;
     if (!MakeParser(options.format))
         return host::UsageError("preview", "cannot preview the format '" + formatName + "' (ascii, excel or rbx0)");
     if (!options.templatePath.empty() && !MakeSpecification(options.format))

@@ -44,10 +44,9 @@ int Show(const std::vector<std::string>& args)
     if (file.empty())
         return host::UsageError("template", "show needs a template file");
 
-    CString error;
-    tmplfile::OpenedTemplate opened = tmplfile::OpenTemplateFile(file, error);
-    if (!opened.spec) {
-        std::fprintf(stderr, "velmora template: %s\n", error.c_str());
+    tmplfile::OpenedTemplate opened;
+    if (const sys::Status status = tmplfile::OpenTemplateFile(file, opened); !status) {
+        std::fprintf(stderr, "velmora template: %s\n", status.problem().Describe().c_str());
         return host::kFailed;
     }
     if (json)

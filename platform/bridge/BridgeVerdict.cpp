@@ -35,14 +35,15 @@ CString Quoted(const CString& path) { return "\"" + path + "\""; }
 
 Verdict JudgeSilently(const Request& request, const RecordingSilence& silence)
 {
-    const int format = FormatOfBridge(request.bridgeName);
-    if (format == 0)
+    const sys::FileFormatInfo* reader = sys::FindFormatOfBridge(request.bridgeName);
+    if (!reader)
         return Refuse("unknown bridge name " + Quoted(request.bridgeName));
+    const sys::FileFormat format = reader->format;
     if (request.dataFile.empty())
         return Refuse("no data file given");
     const CString templatePath = TemplatePathOf(request.parameters);
     // rbx0 files describe themselves; the other formats are read only through the given template.
-    if (format != 1 && templatePath.empty())
+    if (format != sys::FileFormat::Rbx0 && templatePath.empty())
         return Refuse("no template given; expected the parameter \"TemplateFilePath=<template file>\"");
     if (request.folderScan) {
         // A folder run passes over hidden entries, so none of them is a file it would convert.
@@ -50,26 +51,16 @@ Verdict JudgeSilently(const Request& request, const RecordingSilence& silence)
         if (attributes && attributes->hidden)
             return Refuse(Quoted(request.dataFile) + " is hidden; a folder run passes over it");
     }
-    std::string reason;
-    if (converter::CanConvert(static_cast<converter::Format>(format), request.dataFile, templatePath, &reason))
+    const sys::Status verdict = converter::CanConvert(format, request.dataFile, templatePath);
+    if (verdict)
         return Accept();
+    std::string reason = verdict.problem().Describe();
     if (reason.empty())
         reason = silence.FirstMessage();
     return Refuse(reason.empty() ? Quoted(request.dataFile) + ": the engine would not convert it" : reason);
 }
 
 } // namespace
-
-int FormatOfBridge(const CString& bridgeName)
-{
-    if (bridgeName == "rbx Timeseries Bridge")
-        return 1;
-    if (bridgeName == "ASCII Timeseries Bridge (General)")
-        return 2;
-    if (bridgeName == "Excel Timeseries Bridge")
-        return 3;
-    return 0;
-}
 
 CString TemplatePathOf(const CString& parameters)
 {

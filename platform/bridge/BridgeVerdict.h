@@ -17,8 +17,6 @@ struct Verdict {
     CString reason; // empty when accepted
 };
 
-// The input format a bridge name selects (1 rbx0, 2 ASCII, 3 Excel), 0 for an unknown name.
-int FormatOfBridge(const CString& bridgeName);
 // The template path of a parameter string, empty when it names none.
 CString TemplatePathOf(const CString& parameters);
 

@@ -86,7 +86,7 @@ bool NextRecord(rbxFile& file, std::uint32_t recordSize)
     file.block.resize(static_cast<std::size_t>(std::min<std::uint64_t>(want, left)) * recordSize);
     std::size_t got = 0;
     if (!file.reader.ReadRawSteps(want, file.block.data(), got)) {
-        t_lastError = file.reader.Error();
+        t_lastError = file.reader.status().problem().Describe();
         return false;
     }
     if (got == 0) {
@@ -113,8 +113,8 @@ int rbxFileRead(const char* path, rbxHeader** header, rbxFile** file)
     if (!path || !header || !file)
         return Failure("rbxFileRead needs a path and two outputs");
     auto opened = std::make_unique<rbxFile>();
-    if (!opened->reader.Open(path, rbx::VerifyChecksum::AtOpen))
-        return Failure(opened->reader.Error());
+    if (const sys::Status status = opened->reader.Open(path, rbx::VerifyChecksum::AtOpen); !status)
+        return Failure(status.problem().Describe());
     if (opened->reader.Header().axis.steps > static_cast<std::uint64_t>(INT_MAX))
         return Failure(CString(path) + ": more time steps than this call can count");
     *header = MakeHeader(opened->reader.Header()).release();

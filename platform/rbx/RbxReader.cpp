@@ -75,17 +75,23 @@ void CRbxReader::Close() { m_state.reset(); }
 
 bool CRbxReader::Fail(const CString& what)
 {
-    m_strError = (m_state ? m_state->path : CString()) + ": " + what;
+    m_status = sys::Status::Fail(m_state ? m_state->path : CString(), 0, what);
     if (m_state)
         m_state->file.reset();
     return false;
 }
 
-bool CRbxReader::Open(const CString& path, VerifyChecksum verify)
+sys::Status CRbxReader::Open(const CString& path, VerifyChecksum verify)
+{
+    m_status = sys::Status::Ok();
+    OpenFile(path, verify);
+    return m_status;
+}
+
+bool CRbxReader::OpenFile(const CString& path, VerifyChecksum verify)
 {
     m_state = std::make_unique<State>();
     m_state->path = path;
-    m_strError.clear();
     State& s = *m_state;
     std::string problem;
     s.file.reset(sys::OpenRegularFile(path, problem));

@@ -5,6 +5,7 @@
 // step has been read for large ones (or as the caller asks).
 #include "platform/rbx/RbxFormat.h"
 #include "platform/rbx/RbxValueCodec.h"
+#include "platform/system/Status.h"
 
 #include <cstdio>
 #include <memory>
@@ -26,8 +27,8 @@ public:
     CRbxReader(const CRbxReader&) = delete;
     CRbxReader& operator=(const CRbxReader&) = delete;
 
-    // False with Error() naming the file and what is wrong.
-    bool Open(const CString& path, VerifyChecksum verify = VerifyChecksum::Auto);
+    // Fails naming the file and what is wrong.
+    sys::Status Open(const CString& path, VerifyChecksum verify = VerifyChecksum::Auto);
     void Close();
     bool IsOpen() const;
 
@@ -36,15 +37,17 @@ public:
     bool AtEnd() const;
 
     // Reads up to `maxSteps` steps: times[s] in axis units, values[s * ValueCount() + v] converted to
-    // double. `stepsRead` is 0 at the end of the data. False on a damaged file.
+    // double. `stepsRead` is 0 at the end of the data. False on a damaged file (status() says why).
     bool ReadSteps(std::size_t maxSteps, double* times, double* values, std::size_t& stepsRead);
     // The same, the records as stored: RecordSize() bytes each, an 8-byte time and packed values.
     bool ReadRawSteps(std::size_t maxSteps, unsigned char* records, std::size_t& stepsRead);
 
-    const CString& Error() const { return m_strError; }
+    // How the last Open or read ended.
+    const sys::Status& status() const { return m_status; }
 
 private:
     bool Fail(const CString& what);
+    bool OpenFile(const CString& path, VerifyChecksum verify);
     bool ReadHeader(VerifyChecksum verify);
     bool VerifyDataChecksum();
     bool ReadRecords(std::size_t count, unsigned char* records);
@@ -52,7 +55,7 @@ private:
 
     struct State;
     std::unique_ptr<State> m_state;
-    CString m_strError;
+    sys::Status m_status;
 };
 
 } // namespace rbx

@@ -96,19 +96,25 @@ std::uint64_t CRbxWriter::StepCount() const { return m_state ? m_state->steps : 
 
 bool CRbxWriter::Fail(const CString& what)
 {
-    m_strError = (m_state ? m_state->path : CString()) + ": " + what;
+    m_status = sys::Status::Fail(m_state ? m_state->path : CString(), 0, what);
     if (m_state)
         m_state->failed = true;
     return false;
 }
 
-bool CRbxWriter::Open(const CString& path, const FileDefinition& definition)
+sys::Status CRbxWriter::Open(const CString& path, const FileDefinition& definition)
 {
     if (IsOpen())
         Close();
+    m_status = sys::Status::Ok();
+    OpenFile(path, definition);
+    return m_status;
+}
+
+bool CRbxWriter::OpenFile(const CString& path, const FileDefinition& definition)
+{
     m_state = std::make_unique<State>();
     m_state->path = path;
-    m_strError.clear();
     State& s = *m_state;
 
     for (std::size_t i = 0; i < definition.items.size(); ++i) {
@@ -304,10 +310,16 @@ bool CRbxWriter::PatchHeader()
     return true;
 }
 
-bool CRbxWriter::Close()
+sys::Status CRbxWriter::Close()
 {
     if (!IsOpen())
-        return false;
+        return sys::Status::Fail(CString(), 0, "no file is open");
+    CloseFile();
+    return m_status;
+}
+
+bool CRbxWriter::CloseFile()
+{
     State& s = *m_state;
     bool ok = !s.failed && FlushBuffer() && PatchHeader();
     if (std::fclose(s.file.release()) != 0 && ok)

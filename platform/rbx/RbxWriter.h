@@ -4,6 +4,7 @@
 // (equidistant when every step is equal), the step or span and the checksums.
 #include "platform/rbx/RbxFormat.h"
 #include "platform/system/OleDateTime.h"
+#include "platform/system/Status.h"
 
 #include <cstdio>
 #include <memory>
@@ -34,8 +35,8 @@ public:
     CRbxWriter(const CRbxWriter&) = delete;
     CRbxWriter& operator=(const CRbxWriter&) = delete;
 
-    // Creates `path` (replacing it) and writes the header. False with Error() on failure.
-    bool Open(const CString& path, const FileDefinition& definition);
+    // Creates `path` (replacing it) and writes the header; fails naming the file and the cause.
+    sys::Status Open(const CString& path, const FileDefinition& definition);
 
     // One step: `time` in axis units from the axis start, strictly greater than the previous step's;
     // `values` holds ValueCount() doubles in item order, each converted to its item's data type
@@ -48,17 +49,20 @@ public:
     // (RecordSize() - 8 bytes).
     bool WriteRawStep(double time, const void* packedValues);
 
-    // Patches the header and closes the file. False with Error() when any write failed.
-    bool Close();
+    // Patches the header and closes the file; fails when any write failed.
+    sys::Status Close();
     bool IsOpen() const;
 
     std::size_t ValueCount() const;
     std::uint32_t RecordSize() const;
     std::uint64_t StepCount() const;
-    const CString& Error() const { return m_strError; }
+    // How the last call ended; a failed step leaves the file failed.
+    const sys::Status& status() const { return m_status; }
 
 private:
     bool Fail(const CString& what);
+    bool OpenFile(const CString& path, const FileDefinition& definition);
+    bool CloseFile();
     bool CheckTime(double time);
     bool PackValues(const double* values);
     bool AppendRecord(double time);
@@ -69,7 +73,7 @@ private:
 
     struct State;
     std::unique_ptr<State> m_state;
-    CString m_strError;
+    sys::Status m_status;
 };
 
 } // namespace rbx

@@ -15,6 +15,13 @@ namespace sheet {
 
 namespace {
 
+// Automation reports what a workbook reader found wrong as its error.
+void ThrowOnFailure(const sys::Status& status)
+{
+    if (!status)
+        throw AutomationError(status.problem().message);
+}
+
 class AppState {
 public:
     explicit AppState(ApplicationSettings settings) : settings(std::move(settings)) {}
@@ -52,7 +59,8 @@ public:
             return;
         LoadOptions options = app->settings.load;
         options.retainedRows = std::max(lastRow, Sheet(sheet).HeldRows() * 2);
-        std::unique_ptr<WorkbookModel> wider = LoadWorkbook(model->path, options);
+        std::unique_ptr<WorkbookModel> wider;
+        ThrowOnFailure(LoadWorkbook(model->path, options, wider));
         if (wider->sheets.size() != model->sheets.size() || !wider->sheets[static_cast<size_t>(sheet)].Holds(lastRow))
             throw AutomationError("Not enough storage is available to complete this operation: rows up to " +
                                   std::to_string(lastRow) + " of sheet " + Sheet(sheet).Name() + " do not fit.");
@@ -145,7 +153,9 @@ public:
         m_book->CheckOpen();
         if (std::optional<long long> held = m_book->Sheet(m_sheet).CountValues(m_rect))
             return *held;
-        return CountValuesInFile(m_book->model->path, m_sheet, m_rect, m_book->app->settings.load.limits);
+        long long count = 0;
+        ThrowOnFailure(CountValuesInFile(m_book->model->path, m_sheet, m_rect, m_book->app->settings.load.limits, count));
+        return count;
     }
 
 private:
@@ -275,7 +285,9 @@ public:
         m_app->CheckRunning();
         if (!sys::FileExists(path))
             throw AutomationError("'" + path + "' could not be found. Check the spelling of the file name, and verify that the file location is correct.");
-        auto book = std::make_shared<BookState>(m_app, LoadWorkbook(path, m_app->settings.load));
+        std::unique_ptr<WorkbookModel> model;
+        ThrowOnFailure(LoadWorkbook(path, m_app->settings.load, model));
+        auto book = std::make_shared<BookState>(m_app, std::move(model));
         return std::make_shared<WorkbookImpl>(book);
     }
 

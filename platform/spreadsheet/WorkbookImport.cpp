@@ -65,15 +65,20 @@ WorkbookKind DetectWorkbookKind(const std::string& path)
     throw OpenError(path, "the file is not a workbook (neither an .xlsx zip package nor an .xls compound file).");
 }
 
-void ImportWorkbook(const std::string& path, ImportSink& sink, StyleTable& styles, const ImportLimits& limits)
+sys::Status ImportWorkbook(const std::string& path, ImportSink& sink, StyleTable& styles, const ImportLimits& limits)
 {
-    if (!sys::IsRegularFile(path))
-        throw OpenError(path, "the file does not exist.");
-    styles.Clear();
-    if (DetectWorkbookKind(path) == WorkbookKind::Xlsx)
-        ImportXlsx(path, sink, styles, limits);
-    else
-        ImportXls(path, sink, styles, limits);
+    try {
+        if (!sys::IsRegularFile(path))
+            throw OpenError(path, "the file does not exist.");
+        styles.Clear();
+        if (DetectWorkbookKind(path) == WorkbookKind::Xlsx)
+            ImportXlsx(path, sink, styles, limits);
+        else
+            ImportXls(path, sink, styles, limits);
+    } catch (const AutomationError& e) {
+        return sys::Status::Fail(path, 0, e.what());
+    }
+    return sys::Status::Ok();
 }
 
 } // namespace sheet

@@ -1,8 +1,11 @@
 #pragma once
 // Reading workbook files into a stream of cells: .xlsx and .xls by our own readers, chosen by the
-// file's content. Every failure is an AutomationError naming the file and why.
+// file's content. A failure is a Status whose message reads as automation words it ("Cannot open
+// <path>: <why>"). Inside, the two readers give up by throwing OpenError's AutomationError, which
+// ImportWorkbook turns into the Status; it never leaves the reading.
 #include "platform/spreadsheet/NumberFormat.h"
 #include "platform/spreadsheet/Spreadsheet.h"
+#include "platform/system/Status.h"
 
 #include <cstdint>
 #include <string>
@@ -47,14 +50,16 @@ private:
     std::vector<NumberFormat> m_formats; // style 0 is always General
 };
 
+// Receives a workbook as it is read. Each call returns false to stop the reading there: a reader
+// that has what it wants leaves the rest of the file unread.
 class ImportSink {
 public:
     virtual ~ImportSink() = default;
-    virtual void AddSheet(const std::string& name) = 0;
+    virtual bool AddSheet(const std::string& name) = 0;
     // Cells of one sheet arrive in file order (rows ascending in well-formed files).
-    virtual void AddCell(int sheet, const ImportedCell& cell) = 0; // sheet from 0
+    virtual bool AddCell(int sheet, const ImportedCell& cell) = 0; // sheet from 0
     // No more cells of `sheet` follow.
-    virtual void EndSheet(int sheet) = 0;
+    virtual bool EndSheet(int sheet) = 0;
 };
 
 enum class WorkbookKind { Xlsx, Xls };
@@ -62,13 +67,10 @@ enum class WorkbookKind { Xlsx, Xls };
 // Tells the format by the first bytes; throws AutomationError when it is neither.
 WorkbookKind DetectWorkbookKind(const std::string& path);
 
-// Reads the whole workbook into `sink` and its cell styles into `styles`, which are complete
-// before the first cell arrives.
-// A sink may stop the reading early by throwing StopImport.
-void ImportWorkbook(const std::string& path, ImportSink& sink, StyleTable& styles,
-                    const ImportLimits& limits = ImportLimits());
-
-struct StopImport {};
+// Reads the whole workbook into `sink`, or as far as the sink wants it, and its cell styles into
+// `styles`, which are complete before the first cell arrives.
+sys::Status ImportWorkbook(const std::string& path, ImportSink& sink, StyleTable& styles,
+                           const ImportLimits& limits = ImportLimits());
 
 // Internal entry points of ImportWorkbook, one per format.
 void ImportXlsx(const std::string& path, ImportSink& sink, StyleTable& styles, const ImportLimits& limits);

@@ -91,9 +91,13 @@ class ModelBuilder : public ImportSink {
 public:
     ModelBuilder(WorkbookModel& model, const LoadOptions& options) : m_model(model), m_options(options) {}
 
-    void AddSheet(const std::string& name) override { m_model.sheets.emplace_back(name); }
+    bool AddSheet(const std::string& name) override
+    {
+        m_model.sheets.emplace_back(name);
+        return true;
+    }
 
-    void AddCell(int sheet, const ImportedCell& cell) override
+    bool AddCell(int sheet, const ImportedCell& cell) override
     {
         SheetModel& target = m_model.sheets.at(static_cast<size_t>(sheet));
         bool inWindow = m_options.retainedRows == 0 || cell.row <= m_options.retainedRows;
@@ -107,15 +111,16 @@ public:
         size_t before = target.StoredCount();
         target.Add(cell, keep);
         m_stored += target.StoredCount() - before;
+        return true;
     }
 
-    void EndSheet(int sheet) override
+    bool EndSheet(int sheet) override
     {
         SheetModel& target = m_model.sheets.at(static_cast<size_t>(sheet));
-        if (m_cutoff.count(sheet) != 0)
-            return;
-        if (m_options.retainedRows != 0 && target.UsedRect().lastRow > m_options.retainedRows)
+        if (m_cutoff.count(sheet) == 0 && m_options.retainedRows != 0 &&
+            target.UsedRect().lastRow > m_options.retainedRows)
             target.LimitTo(m_options.retainedRows);
+        return true;
     }
 
 private:
@@ -136,18 +141,15 @@ class ValueCounter : public ImportSink {
 public:
     ValueCounter(int sheet, const CellRect& block) : m_sheet(sheet), m_block(block) {}
 
-    void AddSheet(const std::string&) override {}
-    void AddCell(int sheet, const ImportedCell& cell) override
+    bool AddSheet(const std::string&) override { return true; }
+    bool AddCell(int sheet, const ImportedCell& cell) override
     {
         if (sheet == m_sheet && cell.type != Variant::Empty && cell.row >= m_block.firstRow &&
             cell.row <= m_block.lastRow && cell.column >= m_block.firstColumn && cell.column <= m_block.lastColumn)
             ++count;
+        return true;
     }
-    void EndSheet(int sheet) override
-    {
-        if (sheet == m_sheet)
-            throw StopImport();
-    }
+    bool EndSheet(int sheet) override { return sheet != m_sheet; }
 
     long long count = 0;
 
@@ -158,24 +160,22 @@ private:
 
 } // namespace
 
-long long CountValuesInFile(const std::string& path, int sheet, const CellRect& block, const ImportLimits& limits)
+sys::Status CountValuesInFile(const std::string& path, int sheet, const CellRect& block, const ImportLimits& limits,
+                              long long& count)
 {
     ValueCounter counter(sheet, block);
     StyleTable styles;
-    try {
-        ImportWorkbook(path, counter, styles, limits);
-    } catch (const StopImport&) {
-    }
-    return counter.count;
+    const sys::Status status = ImportWorkbook(path, counter, styles, limits);
+    count = counter.count;
+    return status;
 }
 
-std::unique_ptr<WorkbookModel> LoadWorkbook(const std::string& path, const LoadOptions& options)
+sys::Status LoadWorkbook(const std::string& path, const LoadOptions& options, std::unique_ptr<WorkbookModel>& model)
 {
-    auto model = std::make_unique<WorkbookModel>();
+    model = std::make_unique<WorkbookModel>();
     model->path = path;
     ModelBuilder builder(*model, options);
-    ImportWorkbook(path, builder, model->styles, options.limits);
-    return model;
+    return ImportWorkbook(path, builder, model->styles, options.limits);
 }
 
 } // namespace sheet

@@ -77,11 +77,12 @@ public:
     std::string TextOf(const StoredCell* cell) const;
 };
 
-// Reads `path` keeping what `options` allows. Throws AutomationError.
-std::unique_ptr<WorkbookModel> LoadWorkbook(const std::string& path, const LoadOptions& options);
+// Reads `path` into `model`, keeping what `options` allows.
+sys::Status LoadWorkbook(const std::string& path, const LoadOptions& options, std::unique_ptr<WorkbookModel>& model);
 
-// The cells of `block` of sheet `sheet` (from 0) that hold a value, by reading the file once more
-// without keeping its cells. Throws AutomationError.
-long long CountValuesInFile(const std::string& path, int sheet, const CellRect& block, const ImportLimits& limits);
+// Into `count`, the cells of `block` of sheet `sheet` (from 0) that hold a value, by reading the
+// file once more without keeping its cells.
+sys::Status CountValuesInFile(const std::string& path, int sheet, const CellRect& block, const ImportLimits& limits,
+                              long long& count);
 
 } // namespace sheet

@@ -9,9 +9,13 @@ namespace {
 class NameCollector : public ImportSink {
 public:
     explicit NameCollector(std::vector<std::string>& names) : m_names(names) {}
-    void AddSheet(const std::string& name) override { m_names.push_back(name); }
-    void AddCell(int, const ImportedCell&) override { throw StopImport(); }
-    void EndSheet(int) override { throw StopImport(); }
+    bool AddSheet(const std::string& name) override
+    {
+        m_names.push_back(name);
+        return true;
+    }
+    bool AddCell(int, const ImportedCell&) override { return false; }
+    bool EndSheet(int) override { return false; }
 
 private:
     std::vector<std::string>& m_names;
@@ -24,14 +28,14 @@ public:
                 const std::vector<bool>* textColumns)
         : m_sheet(sheet), m_styles(styles), m_onRow(onRow), m_textColumns(textColumns) {}
 
-    void AddSheet(const std::string&) override {}
+    bool AddSheet(const std::string&) override { return true; }
 
-    void AddCell(int sheet, const ImportedCell& cell) override
+    bool AddCell(int sheet, const ImportedCell& cell) override
     {
         if (sheet != m_sheet || cell.type == Variant::Empty)
-            return;
-        if (cell.row != m_row)
-            Emit();
+            return true;
+        if (cell.row != m_row && !Emit())
+            return false;
         m_row = cell.row;
         RowCell out;
         out.column = cell.column;
@@ -43,14 +47,15 @@ public:
         if (out.value.type == Variant::Text || WantsText(cell.column))
             out.text = m_styles.Format(cell.style).Render(out.value);
         m_cells.push_back(std::move(out));
+        return true;
     }
 
-    void EndSheet(int sheet) override
+    bool EndSheet(int sheet) override
     {
         if (sheet != m_sheet)
-            return;
+            return true;
         Emit();
-        throw StopImport(); // the later sheets are not needed
+        return false; // the later sheets are not needed
     }
 
 private:
@@ -60,14 +65,14 @@ private:
                (static_cast<size_t>(column) < m_textColumns->size() && (*m_textColumns)[static_cast<size_t>(column)]);
     }
 
-    void Emit()
+    // Hands the row on; false when the caller wants no more.
+    bool Emit()
     {
         if (m_cells.empty())
-            return;
-        bool goOn = m_onRow(m_row, m_cells);
+            return true;
+        const bool goOn = m_onRow(m_row, m_cells);
         m_cells.clear();
-        if (!goOn)
-            throw StopImport();
+        return goOn;
     }
 
     int m_sheet;
@@ -80,40 +85,25 @@ private:
 
 } // namespace
 
-bool WorkbookReader::Open(const std::string& path)
+sys::Status WorkbookReader::Open(const std::string& path)
 {
     m_path = path;
     m_sheetNames.clear();
-    m_error.clear();
     NameCollector names(m_sheetNames);
-    try {
-        ImportWorkbook(path, names, m_styles, m_limits);
-    } catch (const StopImport&) {
-    } catch (const AutomationError& e) {
-        m_error = e.what();
+    m_status = ImportWorkbook(path, names, m_styles, m_limits);
+    if (!m_status)
         m_sheetNames.clear();
-        return false;
-    }
-    return true;
+    return m_status;
 }
 
-bool WorkbookReader::ReadRows(int sheet, const RowCallback& onRow, const std::vector<bool>* textColumns)
+sys::Status WorkbookReader::ReadRows(int sheet, const RowCallback& onRow, const std::vector<bool>* textColumns)
 {
-    m_error.clear();
-    if (sheet < 1 || sheet > SheetCount()) {
-        m_error = "Cannot read " + m_path + ": the workbook has no sheet " + std::to_string(sheet) + ".";
-        return false;
-    }
+    if (sheet < 1 || sheet > SheetCount())
+        return m_status = sys::Status::Fail(m_path, 0,
+                                            "Cannot read " + m_path + ": the workbook has no sheet " + std::to_string(sheet) + ".");
     // Both readers fill the style table before the first cell arrives.
     RowStreamer streamer(sheet - 1, m_styles, onRow, textColumns);
-    try {
-        ImportWorkbook(m_path, streamer, m_styles, m_limits);
-    } catch (const StopImport&) {
-    } catch (const AutomationError& e) {
-        m_error = e.what();
-        return false;
-    }
-    return true;
+    return m_status = ImportWorkbook(m_path, streamer, m_styles, m_limits);
 }
 
 } // namespace sheet

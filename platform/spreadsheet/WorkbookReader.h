@@ -28,8 +28,9 @@ public:
     explicit WorkbookReader(ImportLimits limits = ImportLimits()) : m_limits(limits) {}
 
     // Opens `path` (the content tells .xlsx from .xls) and reads its sheet names, stopping
-    // before the first cell: damage further in shows when the rows are read.
-    bool Open(const std::string& path);
+    // before the first cell: damage further in shows when the rows are read. A failure's message
+    // names the file and the cause as automation words it ("Cannot open <path>: <why>").
+    sys::Status Open(const std::string& path);
     int SheetCount() const { return static_cast<int>(m_sheetNames.size()); }
     const std::vector<std::string>& SheetNames() const { return m_sheetNames; }
 
@@ -37,22 +38,22 @@ public:
     // With `textColumns`, numbers, booleans and errors get their displayed text only in the
     // columns it marks true (indexed by column): rendering a number through its format costs
     // more than reading it, and a conversion needs the texts of a few columns only.
-    bool ReadRows(int sheet, const RowCallback& onRow, const std::vector<bool>* textColumns = nullptr);
+    sys::Status ReadRows(int sheet, const RowCallback& onRow, const std::vector<bool>* textColumns = nullptr);
 
     // What the sheet displays for `cell`, for one read without its text.
     std::string DisplayedText(const RowCell& cell) const { return m_styles.Format(cell.style).Render(cell.value); }
     // True when the cell's number format shows numbers as dates or times.
     bool ShowsDateTime(const RowCell& cell) const { return m_styles.Format(cell.style).IsDateTime(); }
 
-    // Why the last Open or ReadRows failed: names the file and the cause.
-    const std::string& Error() const { return m_error; }
+    // How the last Open or ReadRows ended.
+    const sys::Status& status() const { return m_status; }
 
 private:
     ImportLimits m_limits;
     std::string m_path;
     std::vector<std::string> m_sheetNames;
     StyleTable m_styles;
-    std::string m_error;
+    sys::Status m_status;
 };
 
 } // namespace sheet

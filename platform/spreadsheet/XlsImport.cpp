@@ -79,6 +79,7 @@ private:
     const std::string& m_path;
     BiffStream& m_stream;
     ImportSink& m_sink;
+    bool m_stopped = false; // the sink wants no more
     StyleTable& m_styles;
     const ImportLimits& m_limits;
 
@@ -215,10 +216,12 @@ void XlsReader::ReadSheets()
 {
     SetSheetEnds();
     for (const SheetEntry& sheet : m_sheets)
-        m_sink.AddSheet(sheet.name);
+        if (!m_sink.AddSheet(sheet.name))
+            return;
     for (std::size_t s = 0; s < m_sheets.size(); ++s) {
         ReadSheet(static_cast<int>(s));
-        m_sink.EndSheet(static_cast<int>(s));
+        if (m_stopped || !m_sink.EndSheet(static_cast<int>(s)))
+            return;
     }
 }
 
@@ -232,7 +235,7 @@ void XlsReader::ReadSheet(int index)
     m_formulaAwaitingText.reset();
     // Charts embedded in a sheet bring their own BOF ... EOF inside it.
     int depth = 1;
-    while (m_stream.Next(record)) {
+    while (!m_stopped && m_stream.Next(record)) {
         if (record.offset >= sheet.end)
             m_stream.Fail("the sheet '" + sheet.name + "' runs into the next sheet without its EOF record");
         if (record.id == kBof) {
@@ -244,7 +247,8 @@ void XlsReader::ReadSheet(int index)
             ReadCellRecord(record, index);
         }
     }
-    m_stream.Fail("the sheet '" + sheet.name + "' ends without its EOF record");
+    if (!m_stopped)
+        m_stream.Fail("the sheet '" + sheet.name + "' ends without its EOF record");
 }
 
 ImportedCell XlsReader::CellAt(BiffCursor& body, const BiffRecord& record)
@@ -262,7 +266,8 @@ void XlsReader::Emit(int sheet, ImportedCell& cell)
 {
     if (cell.type == Variant::Number && m_date1904 && cell.style < m_dateStyles.size() && m_dateStyles[cell.style])
         cell.number += k1904Offset;
-    m_sink.AddCell(sheet, cell);
+    if (!m_stopped)
+        m_stopped = !m_sink.AddCell(sheet, cell);
 }
 
 void XlsReader::ReadCellRecord(const BiffRecord& record, int sheet)

@@ -188,7 +188,8 @@ void XlsxReader::Read()
             worksheets.emplace_back(sheet.name, SheetPart(sheet, relationship));
     }
     for (const auto& [name, part] : worksheets)
-        m_sink.AddSheet(name);
+        if (!m_sink.AddSheet(name))
+            return;
 
     xlsx::CellStyles cellStyles;
     if (const ZipReader::Entry* styles = Related(relationships, "styles", folder + "styles.xml")) {
@@ -204,8 +205,9 @@ void XlsxReader::Read()
     const xlsx::SheetContext context{strings, cellStyles, workbook.date1904, m_limits};
     for (std::size_t s = 0; s < worksheets.size(); ++s) {
         PartReader reader(m_package, *worksheets[s].second);
-        xlsx::ReadSheetCells(reader.Xml(), context, static_cast<int>(s), m_sink);
-        m_sink.EndSheet(static_cast<int>(s));
+        if (!xlsx::ReadSheetCells(reader.Xml(), context, static_cast<int>(s), m_sink) ||
+            !m_sink.EndSheet(static_cast<int>(s)))
+            return;
     }
 }
 

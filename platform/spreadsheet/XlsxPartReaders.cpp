@@ -257,7 +257,8 @@ public:
     SheetCellReader(XmlScanner& xml, const SheetContext& context, int index, ImportSink& sink)
         : m_xml(xml), m_context(context), m_index(index), m_sink(sink) {}
 
-    void Read();
+    // False when the sink stopped the reading.
+    bool Read();
 
 private:
     void StartRow();
@@ -272,16 +273,17 @@ private:
     const SheetContext& m_context;
     int m_index;
     ImportSink& m_sink;
+    bool m_stopped = false;
     int m_row = 0;    // of the last row or cell
     int m_column = 0; // of the last cell in the row
     RawCell m_raw;
     ImportedCell m_cell;
 };
 
-void SheetCellReader::Read()
+bool SheetCellReader::Read()
 {
     bool inSheetData = false;
-    for (Token token = m_xml.Next(); token != Token::End; token = m_xml.Next()) {
+    for (Token token = m_xml.Next(); token != Token::End && !m_stopped; token = m_xml.Next()) {
         if (token == Token::EndTag && m_xml.Depth() == 1) {
             inSheetData = false;
         } else if (token != Token::StartTag) {
@@ -294,6 +296,7 @@ void SheetCellReader::Read()
             ReadCell();
         }
     }
+    return !m_stopped;
 }
 
 void SheetCellReader::FailOutsideGrid(int row, int column) const
@@ -357,7 +360,7 @@ void SheetCellReader::ReadCell()
     Interpret(m_cell);
     // A blank cell counts only when it carries a style other than General's default.
     if (m_cell.type != Variant::Empty || m_cell.style != 0)
-        m_sink.AddCell(m_index, m_cell);
+        m_stopped = !m_sink.AddCell(m_index, m_cell);
 }
 
 // A cell without a reference follows the one before in its row.
@@ -439,9 +442,9 @@ void SheetCellReader::Interpret(ImportedCell& cell)
 
 } // namespace
 
-void ReadSheetCells(XmlScanner& xml, const SheetContext& context, int index, ImportSink& sink)
+bool ReadSheetCells(XmlScanner& xml, const SheetContext& context, int index, ImportSink& sink)
 {
-    SheetCellReader(xml, context, index, sink).Read();
+    return SheetCellReader(xml, context, index, sink).Read();
 }
 
 } // namespace sheet::xlsx

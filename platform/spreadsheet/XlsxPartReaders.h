@@ -46,8 +46,9 @@ struct SheetContext {
     const ImportLimits& limits;
 };
 
-// <worksheet>: every cell of <sheetData> goes to `sink` as a cell of sheet `index`.
-void ReadSheetCells(XmlScanner& xml, const SheetContext& context, int index, ImportSink& sink);
+// <worksheet>: every cell of <sheetData> goes to `sink` as a cell of sheet `index`; false when the
+// sink stopped the reading.
+bool ReadSheetCells(XmlScanner& xml, const SheetContext& context, int index, ImportSink& sink);
 
 // A cell's number text ("1.5", "1E+15", " -2 "), correctly rounded; nothing when it is not one.
 std::optional<double> ParseNumber(std::string_view text);

@@ -1,7 +1,7 @@
 #include "platform/system/Text.h"
 
 #include <algorithm>
-
+#include <charconv>
 #include <cstdarg>
 #include <cstdio>
 #include <limits>
@@ -60,20 +60,17 @@ bool ScanInt(std::string_view s, int& value)
         negative = s[i] == '-';
         ++i;
     }
-    if (i >= s.size() || s[i] < '0' || s[i] > '9')
+    // The digits; a run too long for any int saturates instead of failing.
+    constexpr unsigned long long kBeyondInt = static_cast<unsigned long long>(std::numeric_limits<int>::max()) + 1;
+    unsigned long long magnitude = 0;
+    const char* const digits = s.data() + i;
+    const auto [end, error] = std::from_chars(digits, s.data() + s.size(), magnitude);
+    if (end == digits)
         return false;
-    // Accumulate in 64 bits and saturate, so absurd inputs cannot overflow.
-    long long v = 0;
-    for (; i < s.size() && s[i] >= '0' && s[i] <= '9'; ++i) {
-        v = v * 10 + (s[i] - '0');
-        if (v > static_cast<long long>(std::numeric_limits<int>::max()) + 1)
-            v = static_cast<long long>(std::numeric_limits<int>::max()) + 1;
-    }
-    if (negative)
-        v = -v;
-    if (v > std::numeric_limits<int>::max())
-        v = std::numeric_limits<int>::max();
-    value = static_cast<int>(v);
+    if (error == std::errc::result_out_of_range || magnitude > kBeyondInt)
+        magnitude = kBeyondInt;
+    const long long v = negative ? -static_cast<long long>(magnitude) : static_cast<long long>(magnitude);
+    value = v > std::numeric_limits<int>::max() ? std::numeric_limits<int>::max() : static_cast<int>(v);
     return true;
 }
 

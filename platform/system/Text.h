@@ -14,7 +14,8 @@ bool StartsWithNoCase(std::string_view s, std::string_view prefix);
 // printf-style formatting into a std::string.
 std::string Format(const char* format, ...) __attribute__((format(printf, 1, 2)));
 
-// Reads a leading decimal integer the way "%d" scanning does: optional blanks, a sign, digits.
+// Reads a leading decimal integer the way "%d" scanning does: optional blanks, a sign, digits (a
+// number beyond an int saturates).
 // Returns false when no digit follows; anything after the digits is ignored.
 bool ScanInt(std::string_view s, int& value);
 // atoi: the leading integer, 0 when there is none.

@@ -25,10 +25,13 @@ TextFileInput::~TextFileInput()
         std::fclose(m_file);
 }
 
-bool TextFileInput::Open(const std::string& path)
+Status TextFileInput::Open(const std::string& path)
 {
+    m_path = path;
     m_file = OpenRegularFile(path, m_error);
-    return m_file && TellEncoding();
+    if (m_file)
+        TellEncoding();
+    return status();
 }
 
 size_t TextFileInput::ReadFile(char* out, size_t length)

@@ -3,6 +3,8 @@
 // keep a reader waiting or feed it without end. The bytes come out as UTF-8: a UTF-8 byte-order mark
 // is passed over, UTF-16 of either byte order (told by its mark, or by a zero byte beside the first
 // character) is converted as it is read, and UTF-32 is refused.
+#include "platform/system/Status.h"
+
 #include <cstdint>
 #include <cstdio>
 #include <string>
@@ -20,13 +22,14 @@ public:
     TextFileInput(const TextFileInput&) = delete;
     TextFileInput& operator=(const TextFileInput&) = delete;
 
-    // False with Error() saying why (the path is not part of it).
-    bool Open(const std::string& path);
+    // Fails naming the file and why it cannot be read as text.
+    Status Open(const std::string& path);
     // Up to `capacity` bytes of the text as UTF-8 into `out`; 0 at the end of the file or on a
-    // failure, which Error() then describes.
+    // failure, which status() then describes.
     size_t Read(char* out, size_t capacity);
 
-    const std::string& Error() const { return m_error; }
+    // Failed once a read failed or the text turned out to be broken.
+    Status status() const { return m_error.empty() ? Status::Ok() : Status::Fail(m_path, 0, m_error); }
     bool IsUtf16() const { return m_encoding != Encoding::Utf8; }
     // Bytes of the file read so far, byte-order mark included.
     std::uint64_t FileBytesRead() const { return m_fileBytes; }
@@ -42,6 +45,7 @@ private:
     void DecodePending();
     size_t ReadFile(char* out, size_t length);
 
+    std::string m_path;
     std::FILE* m_file = nullptr;
     Encoding m_encoding = Encoding::Utf8;
     std::string m_pending; // bytes read but not handed out (UTF-8) or not converted yet (UTF-16)

@@ -88,11 +88,18 @@ Verdict Ask(const CString& bridgeName, const CString& templatePath, const CStrin
     return verdict;
 }
 
+// The setup's number of the format a bridge name selects; 0 for an unknown name.
+int FormatOfBridge(const char* bridgeName)
+{
+    const sys::FileFormatInfo* info = sys::FindFormatOfBridge(bridgeName);
+    return info ? sys::Number(info->format) : 0;
+}
+
 // What the engine does with the same files: convert to rbx0 and report success.
 bool EngineConverts(int format, const std::string& file, const std::string& templatePath, const TempFolder& scratch)
 {
-    converter::Status status;
-    const auto inputFormat = static_cast<converter::Format>(format);
+    sys::Status status;
+    const auto inputFormat = static_cast<sys::FileFormat>(format);
     std::unique_ptr<CSpecification> spec = converter::LoadTemplate(inputFormat, templatePath, status);
     if (!status)
         return false;
@@ -100,7 +107,7 @@ bool EngineConverts(int format, const std::string& file, const std::string& temp
     job.inputFormat = inputFormat;
     job.input = file;
     job.spec = spec.get();
-    job.outputFormat = converter::Format::Rbx0;
+    job.outputFormat = sys::FileFormat::Rbx0;
     job.output = scratch / "engine-output.rbx0";
     const bool converted = converter::ConvertFile(job).converted;
     std::filesystem::remove(job.output);
@@ -160,7 +167,7 @@ TEST_F(BridgeVerdictTest, AsciiTemplateThatFitsAndOneThatDoesNot)
 TEST_F(BridgeVerdictTest, ExcelTemplateThatFitsAndOneThatDoesNot)
 {
     CExcelSpecification defaults;
-    const bool engineReadsExcel = converter::MakeReader(converter::Format::Excel, &defaults) != nullptr;
+    const bool engineReadsExcel = converter::MakeReader(sys::FileFormat::Excel, &defaults) != nullptr;
     if (!engineReadsExcel)
         std::printf("note: the conversion engine of this build reads no Excel input, so neither does the bridge\n");
     ExpectAgreement(3, excelFile, excelTemplate, engineReadsExcel);
@@ -245,11 +252,11 @@ TEST_F(BridgeVerdictTest, SetupRecordSeesTheSameVerdicts)
 
 TEST(BridgeNames, SelectTheFormatExactly)
 {
-    EXPECT_EQ(bridge::FormatOfBridge("rbx Timeseries Bridge"), 1);
-    EXPECT_EQ(bridge::FormatOfBridge("ASCII Timeseries Bridge (General)"), 2);
-    EXPECT_EQ(bridge::FormatOfBridge("Excel Timeseries Bridge"), 3);
-    EXPECT_EQ(bridge::FormatOfBridge("Excel Timeseries Bridge "), 0);
-    EXPECT_EQ(bridge::FormatOfBridge(""), 0);
+    EXPECT_EQ(FormatOfBridge("rbx Timeseries Bridge"), 1);
+    EXPECT_EQ(FormatOfBridge("ASCII Timeseries Bridge (General)"), 2);
+    EXPECT_EQ(FormatOfBridge("Excel Timeseries Bridge"), 3);
+    EXPECT_EQ(FormatOfBridge("Excel Timeseries Bridge "), 0);
+    EXPECT_EQ(FormatOfBridge(""), 0);
     EXPECT_EQ(bridge::TemplatePathOf("TemplateFilePath=/t/a b=c.xml"), "/t/a b=c.xml");
     EXPECT_EQ(bridge::TemplatePathOf("TemplateFilePath="), "");
     EXPECT_EQ(bridge::TemplatePathOf("Template=/t/a.xml"), "");

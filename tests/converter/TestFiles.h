@@ -68,14 +68,14 @@ inline CAsciiSpecification GlobalSpec()
 }
 
 // Writes `rows` through `writer` into `path`: Begin, a Write for each row, Finish.
-inline converter::Status WriteSeries(converter::SeriesWriter& writer, const std::string& path,
+inline sys::Status WriteSeries(converter::SeriesWriter& writer, const std::string& path,
                                      const converter::SeriesHeader& header, const std::vector<converter::Row>& rows,
                                      const std::string& title = "")
 {
-    if (converter::Status begun = writer.Begin(path, header, title); !begun)
+    if (sys::Status begun = writer.Begin(path, header, title); !begun)
         return begun;
     for (const converter::Row& row : rows)
-        if (converter::Status written = writer.Write(row); !written)
+        if (sys::Status written = writer.Write(row); !written)
             return written;
     return writer.Finish();
 }

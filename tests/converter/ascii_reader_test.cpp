@@ -12,7 +12,7 @@ using namespace converter;
 namespace {
 
 struct Read {
-    Status status;
+    sys::Status status;
     SeriesHeader header;
     std::vector<Row> rows;
 };
@@ -166,7 +166,7 @@ TEST(AsciiSeriesReader, OverlongLineFailsInsteadOfGrowing)
 {
     CAsciiSpecification spec = GlobalSpec();
     std::string content = "T\tA\n2020/01/01 00:00:00\t1\n";
-    content += std::string(LineSource::kMaxLineLength + 10, '1') + "\n";
+    content += std::string(sys::kLongestTextLine + 10, '1') + "\n";
     const Read r = ReadAll(spec, content);
     ASSERT_FALSE(r.status);
     EXPECT_EQ(r.status.problem().line, 3);

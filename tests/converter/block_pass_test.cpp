@@ -159,14 +159,14 @@ TEST(StampReader, GivesWhatTheFormatGivesOverRunsOfTexts)
         "2020/12/31 -1:00:00", "2020/12/31 +1:00:00", "2020/12/31 23:59:59",
     };
     for (const char* format : {"YYYY/MM/DD HH:mm:ss", "YYYY-MM-DD HH:mm:ss", "DD/MM/YYYY HH:mm:ss"}) {
-        const DateFormat dateFormat(format);
-        StampFields start;
+        const sys::DateFormat dateFormat(format);
+        sys::DateTimeFields start;
         start.year = 100;
         StampReader reader(dateFormat, start);
         std::mt19937 random(3);
         for (int n = 0; n < 3000; ++n) {
             const std::string text = texts[random() % std::size(texts)];
-            StampFields fields = start;
+            sys::DateTimeFields fields = start;
             const bool formatReads = dateFormat.Read(text, fields);
             const std::optional<Stamp> expected = formatReads ? StampFromFields(fields) : std::nullopt;
             Stamp stamp = -1;
@@ -193,7 +193,7 @@ Outcome ReadWith(const CSpecification& spec, const std::string& path, Pass pass,
     reader.UseFusedPass(pass != Pass::Splitter);
     reader.UseBlockPass(pass == Pass::Blocks);
     Outcome out;
-    Status status = reader.Open(path);
+    sys::Status status = reader.Open(path);
     if (status && selection)
         reader.Select(*selection);
     Row row;

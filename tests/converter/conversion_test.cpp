@@ -23,9 +23,9 @@ const std::string kSample = "Rainfall[mm]:Accumulated\tWater Level[m]:Instantane
                             "2020/01/01 00:15:00\t\t1.5\t8\n"
                             "2020/01/01 00:30:00\t0.3\t\t9\n";
 
-FileReport Convert(Format in, const std::string& input, Format out, const std::string& output, CUIntArray items = {})
+FileReport Convert(sys::FileFormat in, const std::string& input, sys::FileFormat out, const std::string& output, CUIntArray items = {})
 {
-    Status status;
+    sys::Status status;
     std::unique_ptr<CSpecification> spec = LoadTemplate(in, "", status);
     FileJob job{in, input, spec.get(), std::move(items), out, output, "Title"};
     return ConvertFile(job);
@@ -44,10 +44,10 @@ TEST(Conversion, TextThroughRbx0AndBackKeepsEverything)
 {
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), kSample);
-    FileReport there = Convert(Format::Ascii, folder.Path("in.txt"), Format::Rbx0, folder.Path("mid.rbx0"));
+    FileReport there = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("mid.rbx0"));
     ASSERT_TRUE(there.converted) << there.problem.Describe();
     EXPECT_EQ(there.rows, 3u);
-    FileReport back = Convert(Format::Rbx0, folder.Path("mid.rbx0"), Format::Ascii, folder.Path("out.txt"));
+    FileReport back = Convert(sys::FileFormat::Rbx0, folder.Path("mid.rbx0"), sys::FileFormat::Ascii, folder.Path("out.txt"));
     ASSERT_TRUE(back.converted) << back.problem.Describe();
     std::string expected = kSample;
     expected.replace(expected.find("Date/time"), 9, "Date/time"); // the rbx0 file names its time column so too
@@ -59,7 +59,7 @@ TEST(Conversion, TextToTextWithSelectionReorders)
 {
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), kSample);
-    FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt"), {2, 0});
+    FileReport report = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"), {2, 0});
     ASSERT_TRUE(report.converted) << report.problem.Describe();
     EXPECT_EQ(report.itemsWritten, 2u);
     EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")),
@@ -84,7 +84,7 @@ TEST(Conversion, ASelectionNamingAnItemTwiceOrOneTheFileLacksIsRefused)
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), kSample);
     for (const auto& c : cases) {
-        FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt"), c.items);
+        FileReport report = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"), c.items);
         EXPECT_FALSE(report.converted);
         EXPECT_EQ(report.problem.message, c.problem);
         EXPECT_FALSE(std::filesystem::exists(folder.Path("out.txt")));
@@ -96,8 +96,8 @@ TEST(Conversion, ASelectionNamingAnItemTwiceOrOneTheFileLacksIsRefused)
 // Through every output kind (Excel output as .xlsx and as .xls) and back to the text.
 TEST(Conversion, EveryFormatPairRoundTrips)
 {
-    const std::pair<Format, const char*> outputs[] = {
-        {Format::Rbx0, ".rbx0"}, {Format::Ascii, ".txt"}, {Format::Excel, ".xlsx"}, {Format::Excel, ".xls"}};
+    const std::pair<sys::FileFormat, const char*> outputs[] = {
+        {sys::FileFormat::Rbx0, ".rbx0"}, {sys::FileFormat::Ascii, ".txt"}, {sys::FileFormat::Excel, ".xlsx"}, {sys::FileFormat::Excel, ".xls"}};
     for (const auto& [middle, middleExtension] : outputs)
         for (const auto& [last, lastExtension] : outputs) {
             SCOPED_TRACE(std::string(middleExtension) + " then " + lastExtension);
@@ -105,11 +105,11 @@ TEST(Conversion, EveryFormatPairRoundTrips)
             convtest::WriteFile(folder.Path("in.txt"), kSample);
             const std::string mid = folder.Path(std::string("mid") + middleExtension);
             const std::string end = folder.Path(std::string("end") + lastExtension);
-            FileReport first = Convert(Format::Ascii, folder.Path("in.txt"), middle, mid);
+            FileReport first = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), middle, mid);
             ASSERT_TRUE(first.converted) << first.problem.Describe();
             FileReport second = Convert(middle, mid, last, end);
             ASSERT_TRUE(second.converted) << second.problem.Describe();
-            FileReport back = Convert(last, end, Format::Ascii, folder.Path("back.txt"));
+            FileReport back = Convert(last, end, sys::FileFormat::Ascii, folder.Path("back.txt"));
             ASSERT_TRUE(back.converted) << back.problem.Describe();
             EXPECT_EQ(convtest::ReadFile(folder.Path("back.txt")), kSample);
         }
@@ -120,7 +120,7 @@ TEST(Conversion, AnXlsWorkbookInTheEngineLayoutReadsWithoutATemplateFile)
     // Written record by record by tests/data/spreadsheet/make_test_files.py: date-time cells,
     // blank cells for the missing values.
     convtest::ScratchFolder folder;
-    FileReport report = Convert(Format::Excel, std::string(VELMORA_TEST_DATA) + "/spreadsheet/engine-layout.xls", Format::Ascii,
+    FileReport report = Convert(sys::FileFormat::Excel, std::string(VELMORA_TEST_DATA) + "/spreadsheet/engine-layout.xls", sys::FileFormat::Ascii,
                                 folder.Path("out.txt"));
     ASSERT_TRUE(report.converted) << report.problem.Describe();
     EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")), kSample);
@@ -139,17 +139,17 @@ TEST(Conversion, ExcelRowsCrossTheReadingBatchesAndDeleteValuesMatchTheDisplayed
     }
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), original);
-    ASSERT_TRUE(Convert(Format::Ascii, folder.Path("in.txt"), Format::Excel, folder.Path("mid.xlsx")).converted);
-    FileReport plain = Convert(Format::Excel, folder.Path("mid.xlsx"), Format::Ascii, folder.Path("plain.txt"));
+    ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Excel, folder.Path("mid.xlsx")).converted);
+    FileReport plain = Convert(sys::FileFormat::Excel, folder.Path("mid.xlsx"), sys::FileFormat::Ascii, folder.Path("plain.txt"));
     ASSERT_TRUE(plain.converted) << plain.problem.Describe();
     EXPECT_EQ(convtest::ReadFile(folder.Path("plain.txt")), original);
 
-    Status status;
-    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Excel, "", status);
+    sys::Status status;
+    std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Excel, "", status);
     spec->m_DataDesc.m_nDeleteValueCheck = 1;
     spec->m_DataDesc.m_nDeleteValueRadio = 0;
     spec->m_DataDesc.m_strDeleteValue = "-999";
-    FileJob job{Format::Excel, folder.Path("mid.xlsx"), spec.get(), {}, Format::Ascii, folder.Path("deleted.txt"), "Title"};
+    FileJob job{sys::FileFormat::Excel, folder.Path("mid.xlsx"), spec.get(), {}, sys::FileFormat::Ascii, folder.Path("deleted.txt"), "Title"};
     FileReport deleted = ConvertFile(job);
     ASSERT_TRUE(deleted.converted) << deleted.problem.Describe();
     EXPECT_EQ(convtest::ReadFile(folder.Path("deleted.txt")), withoutDeleted);
@@ -168,9 +168,9 @@ TEST(Conversion, Rbx0HeaderDescribesAxisAndItems)
     };
     for (const Case& c : cases) {
         convtest::WriteFile(folder.Path("in.txt"), c.text);
-        ASSERT_TRUE(Convert(Format::Ascii, folder.Path("in.txt"), Format::Rbx0, folder.Path("out.rbx0")).converted);
+        ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("out.rbx0")).converted);
         rbx::CRbxReader reader;
-        ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.Error();
+        ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.status().problem().Describe();
         const rbx::FileHeader& header = reader.Header();
         EXPECT_EQ(header.title, "Title");
         EXPECT_EQ(header.axis.type, c.axisType);
@@ -193,14 +193,14 @@ TEST(Conversion, DamagedWorkbookFailsWithoutOutput)
 {
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), kSample);
-    ASSERT_TRUE(Convert(Format::Ascii, folder.Path("in.txt"), Format::Excel, folder.Path("good.xlsx")).converted);
+    ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Excel, folder.Path("good.xlsx")).converted);
     const std::string bytes = convtest::ReadFile(folder.Path("good.xlsx"));
     std::string flipped = bytes;
     for (size_t i = bytes.size() / 3; i < bytes.size() / 3 + 64; ++i)
         flipped[i] = static_cast<char>(~flipped[i]);
     for (const std::string& damaged : {bytes.substr(0, bytes.size() / 2), flipped, std::string("PK not a zip")}) {
         convtest::WriteFile(folder.Path("bad.xlsx"), damaged);
-        FileReport report = Convert(Format::Excel, folder.Path("bad.xlsx"), Format::Ascii, folder.Path("out.txt"));
+        FileReport report = Convert(sys::FileFormat::Excel, folder.Path("bad.xlsx"), sys::FileFormat::Ascii, folder.Path("out.txt"));
         EXPECT_FALSE(report.converted);
         EXPECT_FALSE(report.problem.message.empty());
         EXPECT_FALSE(fs::exists(folder.Path("out.txt")));
@@ -212,13 +212,13 @@ TEST(Conversion, FailureLeavesTheOldOutputAndNoTemporary)
     convtest::ScratchFolder folder;
     std::string broken = kSample + "2020/01/01 00:45:00\t1\n"; // one field short
     convtest::WriteFile(folder.Path("in.txt"), broken);
-    for (Format out : {Format::Ascii, Format::Rbx0, Format::Excel}) {
-        const std::string output = folder.Path(std::string("out") + OutputExtension(out));
+    for (sys::FileFormat out : {sys::FileFormat::Ascii, sys::FileFormat::Rbx0, sys::FileFormat::Excel}) {
+        const std::string output = folder.Path(std::string("out") + sys::FormatInfo(out).outputExtension);
         convtest::WriteFile(output, "old content");
-        FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), out, output);
-        ASSERT_FALSE(report.converted) << FormatName(out);
+        FileReport report = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), out, output);
+        ASSERT_FALSE(report.converted) << sys::FormatInfo(out).name;
         EXPECT_EQ(report.problem.line, 6);
-        EXPECT_EQ(convtest::ReadFile(output), "old content") << FormatName(out);
+        EXPECT_EQ(convtest::ReadFile(output), "old content") << sys::FormatInfo(out).name;
     }
     EXPECT_TRUE(LeftoverTemporaries(folder.Root()).empty());
 }
@@ -227,7 +227,7 @@ TEST(Conversion, DecreasingStampsCannotGoToRbx0)
 {
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), "Undefined[Undefined]:Instantaneous\nT\tA\n2020/01/01 00:00:01\t1\n2020/01/01 00:00:00\t2\n");
-    FileReport report = Convert(Format::Ascii, folder.Path("in.txt"), Format::Rbx0, folder.Path("out.rbx0"));
+    FileReport report = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("out.rbx0"));
     ASSERT_FALSE(report.converted);
     EXPECT_EQ(report.problem.line, 4);
     EXPECT_FALSE(fs::exists(folder.Path("out.rbx0")));
@@ -237,11 +237,11 @@ TEST(Conversion, TruncatedRbx0FailsWithoutOutput)
 {
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), kSample);
-    ASSERT_TRUE(Convert(Format::Ascii, folder.Path("in.txt"), Format::Rbx0, folder.Path("good.rbx0")).converted);
+    ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("good.rbx0")).converted);
     const std::string bytes = convtest::ReadFile(folder.Path("good.rbx0"));
     for (size_t keep : {size_t{0}, size_t{10}, bytes.size() / 2, bytes.size() - 3}) {
         convtest::WriteFile(folder.Path("cut.rbx0"), bytes.substr(0, keep));
-        FileReport report = Convert(Format::Rbx0, folder.Path("cut.rbx0"), Format::Ascii, folder.Path("out.txt"));
+        FileReport report = Convert(sys::FileFormat::Rbx0, folder.Path("cut.rbx0"), sys::FileFormat::Ascii, folder.Path("out.txt"));
         EXPECT_FALSE(report.converted) << keep;
         EXPECT_FALSE(report.problem.message.empty());
         EXPECT_FALSE(fs::exists(folder.Path("out.txt"))) << keep;
@@ -256,14 +256,17 @@ TEST(Conversion, CanConvertJudgesExtensionTemplateAndContent)
     convtest::WriteFile(folder.Path("noext"), kSample);
     convtest::WriteFile(folder.Path("binary"), std::string("a\0b", 3));
     convtest::WriteFile(folder.Path("misfit.txt"), "just words\n");
-    std::string reason;
-    EXPECT_TRUE(CanConvert(Format::Ascii, folder.Path("good.txt"), "", &reason)) << reason;
-    EXPECT_TRUE(CanConvert(Format::Ascii, folder.Path("noext"), "", &reason)) << reason;
-    EXPECT_FALSE(CanConvert(Format::Ascii, folder.Path("good.dat"), "", &reason));
-    EXPECT_FALSE(CanConvert(Format::Ascii, folder.Path("binary"), "", &reason));
-    EXPECT_FALSE(CanConvert(Format::Ascii, folder.Path("misfit.txt"), "", &reason));
-    EXPECT_NE(reason.find("misfit.txt"), std::string::npos);
-    EXPECT_FALSE(CanConvert(Format::Ascii, folder.Path("good.txt"), folder.Path("no-template.xml"), &reason));
+    auto reason = [](const sys::Status& verdict) { return verdict.problem().Describe(); };
+    const sys::Status good = CanConvert(sys::FileFormat::Ascii, folder.Path("good.txt"), "");
+    EXPECT_TRUE(good) << reason(good);
+    const sys::Status noExtension = CanConvert(sys::FileFormat::Ascii, folder.Path("noext"), "");
+    EXPECT_TRUE(noExtension) << reason(noExtension);
+    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("good.dat"), ""));
+    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("binary"), ""));
+    const sys::Status misfit = CanConvert(sys::FileFormat::Ascii, folder.Path("misfit.txt"), "");
+    EXPECT_FALSE(misfit);
+    EXPECT_NE(reason(misfit).find("misfit.txt"), std::string::npos);
+    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("good.txt"), folder.Path("no-template.xml")));
 }
 
 TEST(ConversionJob, FolderConvertsTheRestAndReportsTheMisfit)

@@ -24,7 +24,7 @@ Outcome ReadWith(const CSpecification& spec, const std::string& path, bool fused
     AsciiSeriesReader reader(spec);
     reader.UseFusedPass(fused);
     Outcome out;
-    Status status = reader.Open(path);
+    sys::Status status = reader.Open(path);
     Row row;
     while (status && reader.Next(row))
         out.rows.push_back(row);

@@ -61,7 +61,7 @@ TEST(OutputFile, ACommitDoesNotReplaceWhatIsNoLongerARegularFile)
         OutputFile output(final);
         ASSERT_TRUE(output.Create());
         ASSERT_EQ(::mkfifo(final.c_str(), 0600), 0); // made while the output was being written
-        const Status committed = output.Commit();
+        const sys::Status committed = output.Commit();
         EXPECT_FALSE(committed);
         EXPECT_NE(committed.problem().message.find("a named pipe (FIFO)"), std::string::npos);
     }
@@ -81,7 +81,7 @@ TEST(OutputFile, ALinkPlantedAtThePartFilesNameIsNeverWrittenThroughNorMovedInto
     fs::create_symlink(victim, output.TemporaryPath());
     convtest::WriteFile(output.WriterPath(), "converted"); // as a writer does
     EXPECT_EQ(convtest::ReadFile(victim), "someone's file");
-    const Status committed = output.Commit();
+    const sys::Status committed = output.Commit();
     EXPECT_FALSE(committed);
     EXPECT_NE(committed.problem().message.find("was replaced"), std::string::npos) << committed.problem().message;
     EXPECT_FALSE(fs::exists(final));
@@ -96,7 +96,7 @@ TEST(OutputFile, ANameTooLongForThePartFileIsShortenedAndAMissingFolderSaysWhy)
     EXPECT_LE(fs::path(output.TemporaryPath()).filename().string().size(), 255u);
 
     OutputFile nowhere(folder.Path("missing/out.txt"));
-    const Status created = nowhere.Create();
+    const sys::Status created = nowhere.Create();
     EXPECT_FALSE(created);
     EXPECT_EQ(created.problem().file, folder.Path("missing/out.txt"));
     EXPECT_NE(created.problem().message.find("No such file or directory"), std::string::npos) << created.problem().message;

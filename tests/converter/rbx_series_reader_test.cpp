@@ -151,12 +151,12 @@ TEST(RbxSeriesReader, RowsCrossBlocksInOrderUntilADamagedStep)
     const size_t steps = 1100000; // 17.6 MB of records
     {
         rbx::CRbxWriter writer;
-        ASSERT_TRUE(writer.Open(path, rbxtest::Definition({Item("A", rbx::kFloat64)}))) << writer.Error();
+        ASSERT_TRUE(writer.Open(path, rbxtest::Definition({Item("A", rbx::kFloat64)}))) << writer.status().problem().Describe();
         for (size_t s = 0; s < steps; ++s) {
             const double value = static_cast<double>(s) * 0.25;
             ASSERT_TRUE(writer.WriteStep(static_cast<double>(s), &value));
         }
-        ASSERT_TRUE(writer.Close()) << writer.Error();
+        ASSERT_TRUE(writer.Close()) << writer.status().problem().Describe();
     }
     {
         RbxSeriesReader reader;

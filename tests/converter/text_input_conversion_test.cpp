@@ -22,9 +22,9 @@ const std::string kText = "Date/time\tPegel \xC3\x96hringen\tRain\n"
 
 using testsupport::Utf16;
 
-FileReport Convert(const CSpecification& spec, const std::string& input, Format out, const std::string& output)
+FileReport Convert(const CSpecification& spec, const std::string& input, sys::FileFormat out, const std::string& output)
 {
-    FileJob job{Format::Ascii, input, &spec, {}, out, output, "Title"};
+    FileJob job{sys::FileFormat::Ascii, input, &spec, {}, out, output, "Title"};
     return ConvertFile(job);
 }
 
@@ -46,16 +46,16 @@ TEST_F(TextInputConversion, MarksAndUtf16ReadAsTheirText)
         {"UTF-16 little endian without a mark", Utf16(kText, false)},
     };
     convtest::WriteFile(folder.Path("plain.txt"), kText);
-    ASSERT_TRUE(Convert(spec, folder.Path("plain.txt"), Format::Ascii, folder.Path("plain.out")).converted);
+    ASSERT_TRUE(Convert(spec, folder.Path("plain.txt"), sys::FileFormat::Ascii, folder.Path("plain.out")).converted);
     const std::string expected = convtest::ReadFile(folder.Path("plain.out"));
     ASSERT_EQ(spec.Save(folder.Path("t.xml")), 1) << spec.LastError();
     for (const auto& c : cases) {
         convtest::WriteFile(folder.Path("in.txt"), c.bytes);
-        const FileReport report = Convert(spec, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt"));
+        const FileReport report = Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"));
         ASSERT_TRUE(report.converted) << c.label << ": " << report.problem.Describe();
         EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")), expected) << c.label;
-        std::string reason;
-        EXPECT_TRUE(CanConvert(Format::Ascii, folder.Path("in.txt"), folder.Path("t.xml"), &reason)) << c.label << ": " << reason;
+        const sys::Status verdict = CanConvert(sys::FileFormat::Ascii, folder.Path("in.txt"), folder.Path("t.xml"));
+        EXPECT_TRUE(verdict) << c.label << ": " << verdict.problem().Describe();
     }
 }
 
@@ -66,7 +66,7 @@ TEST_F(TextInputConversion, DataOnTheFirstLineAfterAMark)
     const std::string data = kText.substr(kText.find('\n') + 1);
     for (const std::string& bytes : {"\xEF\xBB\xBF" + data, "\xFF\xFE" + Utf16(data, false)}) {
         convtest::WriteFile(folder.Path("in.txt"), bytes);
-        const FileReport report = Convert(spec, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt"));
+        const FileReport report = Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"));
         ASSERT_TRUE(report.converted) << report.problem.Describe();
         EXPECT_EQ(report.rows, 2u);
         EXPECT_EQ(report.firstStamp, "2020/01/01 00:00:00");
@@ -87,7 +87,7 @@ TEST_F(TextInputConversion, WhatCannotBeReadIsRefusedByName)
         {folder.Path("endless.txt"), "longer than"},
     };
     for (const auto& [path, reason] : cases) {
-        const FileReport report = Convert(spec, path, Format::Rbx0, folder.Path("out.rbx0"));
+        const FileReport report = Convert(spec, path, sys::FileFormat::Rbx0, folder.Path("out.rbx0"));
         EXPECT_FALSE(report.converted) << path;
         const std::string problem = report.problem.Describe();
         EXPECT_EQ(problem.rfind(path, 0), 0u) << problem;
@@ -101,15 +101,15 @@ TEST_F(TextInputConversion, EightBitNamesAreWindows1252InEveryOutput)
     convtest::WriteFile(folder.Path("in.txt"), "Date/time\tPegel \xD6hringen \x80\tRain\n2020/01/01 00:00:00\t1.5\t0.1\n");
     const std::string name = "Pegel \xC3\x96hringen \xE2\x82\xAC";
 
-    ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), Format::Rbx0, folder.Path("out.rbx0")).converted);
+    ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("out.rbx0")).converted);
     rbx::CRbxReader reader;
-    ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.Error();
+    ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.status().problem().Describe();
     EXPECT_EQ(reader.Header().items.at(0).name, name);
 
-    ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt")).converted);
+    ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt")).converted);
     EXPECT_NE(convtest::ReadFile(folder.Path("out.txt")).find("\t" + name + "\t"), std::string::npos);
 
-    ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), Format::Excel, folder.Path("out.xlsx")).converted);
+    ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Excel, folder.Path("out.xlsx")).converted);
     const convtest::ZipContents zip = convtest::Unzip(convtest::ReadFile(folder.Path("out.xlsx")));
     ASSERT_EQ(zip.error, "");
     EXPECT_NE(zip.parts.at("xl/sharedStrings.xml").find(">" + name + "<"), std::string::npos);
@@ -124,12 +124,12 @@ TEST_F(TextInputConversion, UserLocaleTakesTheDecimalSeparatorFromTheEnvironment
     convtest::WriteFile(folder.Path("in.txt"), "Date/time\tA\n2020/01/01 00:00:00\t3,5\n");
     {
         const testsupport::LocaleEnvironment environment(german, testsupport::ScratchLocale::kName, nullptr, nullptr);
-        const FileReport report = Convert(spec, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt"));
+        const FileReport report = Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"));
         ASSERT_TRUE(report.converted) << report.problem.Describe();
         EXPECT_NE(convtest::ReadFile(folder.Path("out.txt")).find("\t3.5\n"), std::string::npos);
     }
     const testsupport::LocaleEnvironment environment(german, nullptr, "C", testsupport::ScratchLocale::kName);
-    EXPECT_FALSE(Convert(spec, folder.Path("in.txt"), Format::Ascii, folder.Path("out.txt")).converted)
+    EXPECT_FALSE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt")).converted)
         << "LC_NUMERIC names the C locale, whose separator is the point";
 }
 

@@ -1,8 +1,9 @@
-// Stamps and numbers as text: the compiled date format against the reference readers, the output
-// form of stamps, and values read with each decimal separator.
+// Stamps and numbers as text: the date/time reader's shortcut against its token-by-token reading,
+// stamps against automation dates, the output form of stamps, and values read with each decimal
+// separator.
 #include "converter/NumberText.h"
 #include "converter/StampText.h"
-#include "parsers/DateTimeText.h"
+#include "platform/system/OleDateTime.h"
 
 #include <gtest/gtest.h>
 
@@ -15,33 +16,24 @@ using namespace converter;
 
 namespace {
 
+// The date/time reader with its compact shortcut against its token-by-token reading, and the stamp
+// of the fields against the automation date of the same fields.
 void ExpectSameAsReference(const std::string& text, const std::string& format)
 {
-    COleDateTime reference;
-    const bool referenceOk = ParseDateTimeText(text, format, reference);
-    StampFields fields;
-    const bool ok = DateFormat(format).Read(text, fields);
+    sys::DateTimeFields reference;
+    const bool referenceOk = sys::DateFormat(format).ReadTokens(text, reference);
+    sys::DateTimeFields fields;
+    const bool ok = sys::DateFormat(format).Read(text, fields);
     ASSERT_EQ(ok, referenceOk) << "[" << text << "] with [" << format << "]";
     if (!ok)
         return;
+    COleDateTime automation;
+    automation.SetDateTime(reference.year, reference.month, reference.day, reference.hour, reference.minute,
+                           reference.second);
     const std::optional<Stamp> stamp = StampFromFields(fields);
-    ASSERT_EQ(stamp.has_value(), reference.IsValid()) << "[" << text << "] with [" << format << "]";
+    ASSERT_EQ(stamp.has_value(), automation.IsValid()) << "[" << text << "] with [" << format << "]";
     if (stamp) {
-        EXPECT_EQ(*stamp, reference.ToUnixSeconds()) << "[" << text << "] with [" << format << "]";
-    }
-
-    CDateFields date;
-    StampFields dateFields;
-    dateFields.year = 100;
-    ASSERT_EQ(DateFormat(format, DateFormat::Reads::Date).Read(text, dateFields), ParseDateText(text, format, date));
-    CTimeFields time{1, 2, 3};
-    StampFields timeFields;
-    timeFields.hour = 1, timeFields.minute = 2, timeFields.second = 3;
-    const bool timeOk = ParseTimeText(text, format, time);
-    ASSERT_EQ(DateFormat(format, DateFormat::Reads::Time).Read(text, timeFields), timeOk);
-    if (timeOk) {
-        EXPECT_EQ(timeFields.hour * 3600 + timeFields.minute * 60 + timeFields.second,
-                  time.hour * 3600 + time.minute * 60 + time.second);
+        EXPECT_EQ(*stamp, automation.ToUnixSeconds()) << "[" << text << "] with [" << format << "]";
     }
 }
 
@@ -99,8 +91,8 @@ TEST(DateFormat, CompactStampsAgreeWithTheReference)
 
 TEST(DateFormat, ExtraSeparatorsSplitJoinedFields)
 {
-    StampFields fields;
-    ASSERT_TRUE(DateFormat("YYYY/MM/DD,HH:mm:ss", DateFormat::Reads::DateTime, ",").Read("2020/05/06 07:08:09", fields));
+    sys::DateTimeFields fields;
+    ASSERT_TRUE(sys::DateFormat("YYYY/MM/DD,HH:mm:ss", sys::DateFormat::Reads::DateTime, ",").Read("2020/05/06 07:08:09", fields));
     EXPECT_EQ(FormatStamp(*StampFromFields(fields)), "2020/05/06 07:08:09");
 }
 
@@ -320,6 +312,34 @@ TEST(StampPrinter, WritesWhatFormatStampWrites)
     for (Stamp s : stamps) {
         char buffer[32];
         ASSERT_EQ(std::string(buffer, printer.Write(s, buffer)), FormatStamp(s)) << s;
+    }
+}
+
+} // namespace
+
+namespace {
+
+// The decimal comma and a locale's separator take the same general reading.
+TEST(NumberReader, DecimalCommaAndOtherSeparatorsReadAsBefore)
+{
+    const struct {
+        const char* separator;
+        const char* field;
+        ValueText expected;
+        double value;
+    } cases[] = {
+        {",", "3,5", ValueText::Number, 3.5},        {",", "-1,25e3", ValueText::Number, -1250},
+        {",", "1.234,5", ValueText::NotANumber, 0},  {",", "3.5", ValueText::WrongSeparator, 0},
+        {",", "1e400", ValueText::NotANumber, 0},    {",", "0,0", ValueText::Number, 0},
+        {"'", "1'5", ValueText::Number, 1.5},        {"'", "1.5", ValueText::Number, 1.5},
+        {"\xD9\xAB", "2\xD9\xAB" "5", ValueText::Number, 2.5},
+    };
+    for (const auto& c : cases) {
+        double value = 0;
+        ASSERT_EQ(NumberReader(c.separator).Read(c.field, value), c.expected) << c.separator << " [" << c.field << "]";
+        if (c.expected == ValueText::Number) {
+            EXPECT_EQ(value, c.value) << c.field;
+        }
     }
 }
 

@@ -27,7 +27,7 @@ namespace {
 
 Stamp At(int year, int month, int day, int hour = 0, int minute = 0, int second = 0)
 {
-    return *StampFromFields(StampFields{year, month, day, hour, minute, second});
+    return *StampFromFields(sys::DateTimeFields{year, month, day, hour, minute, second});
 }
 
 ItemInfo Item(std::string name, std::string type = "Rainfall", std::string unit = "mm")
@@ -35,7 +35,7 @@ ItemInfo Item(std::string name, std::string type = "Rainfall", std::string unit 
     return ItemInfo{std::move(name), std::move(type), std::move(unit), "Accumulated"};
 }
 
-Status WriteXls(const std::string& path, const SeriesHeader& header, const std::vector<Row>& rows,
+sys::Status WriteXls(const std::string& path, const SeriesHeader& header, const std::vector<Row>& rows,
                 const std::string& title = "")
 {
     XlsSeriesWriter writer;
@@ -183,14 +183,14 @@ print("workbook", len(book), zlib.crc32(book))
                                   std::to_string(rbx::Crc32(0, stream.data(), stream.size())) + "\n");
 
     sheet::WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(path)) << reader.Error();
+    ASSERT_TRUE(reader.Open(path)) << reader.status().problem().message;
     int rows = 0;
     std::vector<sheet::RowCell> last;
     ASSERT_TRUE(reader.ReadRows(1, [&](int number, const std::vector<sheet::RowCell>& cells) {
         rows = number;
         last = cells;
         return true;
-    })) << reader.Error();
+    })) << reader.status().problem().message;
     EXPECT_EQ(rows, 65536);
     ASSERT_EQ(last.size(), 21u);
     EXPECT_EQ(last[0].text, "2020/02/15 12:13:00");
@@ -219,9 +219,9 @@ TEST(XlsWriter, LibreOfficeReadsTheWorkbook)
     ASSERT_EQ(std::system(command.c_str()), 0) << convtest::ReadFile(folder.Path("convert.log"));
     ASSERT_TRUE(std::filesystem::exists(folder.Path("office.xlsx"))) << convtest::ReadFile(folder.Path("convert.log"));
 
-    Status status;
-    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Excel, "", status);
-    std::unique_ptr<SeriesReader> reader = MakeReader(Format::Excel, spec.get());
+    sys::Status status;
+    std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Excel, "", status);
+    std::unique_ptr<SeriesReader> reader = MakeReader(sys::FileFormat::Excel, spec.get());
     ASSERT_TRUE(reader->Open(folder.Path("office.xlsx"))) << reader->status().problem().Describe();
     EXPECT_EQ(reader->Header().timeTitle, "Date/time");
     ASSERT_EQ(reader->Header().items.size(), 2u);
@@ -249,7 +249,7 @@ TEST(XlsWriter, TheFormatsLimitsGiveClearErrors)
     SeriesHeader wide;
     wide.items.assign(256, Item("x"));
     XlsSeriesWriter tooWide;
-    const Status refused = tooWide.Begin(folder.Path("wide.xls"), wide, "");
+    const sys::Status refused = tooWide.Begin(folder.Path("wide.xls"), wide, "");
     EXPECT_FALSE(refused);
     EXPECT_EQ(refused.problem().message, "256 items do not fit the 255 value columns of an .xls sheet (.xlsx holds 16,383)");
     EXPECT_FALSE(std::filesystem::exists(folder.Path("wide.xls")));
@@ -261,9 +261,9 @@ TEST(XlsWriter, TheFormatsLimitsGiveClearErrors)
     for (int r = 0; r < 65535; ++r)
         text += FormatStamp(At(2020, 1, 1) + r * 60LL) + "\t" + std::to_string(r) + "\n";
     convtest::WriteFile(folder.Path("long.txt"), text);
-    Status status;
-    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Ascii, "", status);
-    FileJob job{Format::Ascii, folder.Path("long.txt"), spec.get(), {}, Format::Excel, folder.Path("long.xls"), ""};
+    sys::Status status;
+    std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Ascii, "", status);
+    FileJob job{sys::FileFormat::Ascii, folder.Path("long.txt"), spec.get(), {}, sys::FileFormat::Excel, folder.Path("long.xls"), ""};
     const FileReport report = ConvertFile(job);
     EXPECT_FALSE(report.converted);
     EXPECT_NE(report.problem.message.find("more rows than an .xls sheet holds (65536 with the two header rows)"),
@@ -278,8 +278,8 @@ TEST(XlsWriter, TheFormatsLimitsGiveClearErrors)
     convtest::WriteFile(folder.Path("long.txt"), text);
     const FileReport fits = ConvertFile(job);
     ASSERT_TRUE(fits.converted) << fits.problem.Describe();
-    std::unique_ptr<CSpecification> excel = LoadTemplate(Format::Excel, "", status);
-    FileJob back{Format::Excel, folder.Path("long.xls"), excel.get(), {}, Format::Ascii, folder.Path("back.txt"), ""};
+    std::unique_ptr<CSpecification> excel = LoadTemplate(sys::FileFormat::Excel, "", status);
+    FileJob back{sys::FileFormat::Excel, folder.Path("long.xls"), excel.get(), {}, sys::FileFormat::Ascii, folder.Path("back.txt"), ""};
     ASSERT_TRUE(ConvertFile(back).converted);
     EXPECT_EQ(convtest::ReadFile(folder.Path("back.txt")), text);
 }
@@ -297,13 +297,13 @@ TEST(ExcelOutput, StampsGetTheSheetsOwnDayNumbers)
     for (const char* stamp : stamps)
         text += std::string(stamp) + "\t1\n";
     convtest::WriteFile(folder.Path("in.txt"), text);
-    Status status;
-    std::unique_ptr<CSpecification> ascii = LoadTemplate(Format::Ascii, "", status);
-    std::unique_ptr<CSpecification> excel = LoadTemplate(Format::Excel, "", status);
+    sys::Status status;
+    std::unique_ptr<CSpecification> ascii = LoadTemplate(sys::FileFormat::Ascii, "", status);
+    std::unique_ptr<CSpecification> excel = LoadTemplate(sys::FileFormat::Excel, "", status);
     for (const char* extension : {".xls", ".xlsx"}) {
         SCOPED_TRACE(extension);
         const std::string out = folder.Path(std::string("out") + extension);
-        FileJob job{Format::Ascii, folder.Path("in.txt"), ascii.get(), {}, Format::Excel, out, ""};
+        FileJob job{sys::FileFormat::Ascii, folder.Path("in.txt"), ascii.get(), {}, sys::FileFormat::Excel, out, ""};
         ASSERT_TRUE(ConvertFile(job).converted);
         // The other tools' view: xlrd's raw day numbers, openpyxl's dates (it knows the calendar).
         const pytools::Result read = pytools::Run(std::string(extension) == ".xls" ? R"(
@@ -325,7 +325,7 @@ for r in range(3, sheet.max_row + 1):
                                    ? "'0100/01/01 00:00:00'\n'1899/12/31 23:00:00'\n1.5\n59.0\n61.25\n44333.0\n"
                                    : "0100/01/01 00:00:00\n1899/12/31 23:00:00\n1900/01/01 12:00:00\n"
                                      "1900/02/28 00:00:00\n1900/03/01 06:00:00\n2021/05/17 00:00:00\n");
-        FileJob back{Format::Excel, out, excel.get(), {}, Format::Ascii, folder.Path("back.txt"), ""};
+        FileJob back{sys::FileFormat::Excel, out, excel.get(), {}, sys::FileFormat::Ascii, folder.Path("back.txt"), ""};
         const FileReport report = ConvertFile(back);
         ASSERT_TRUE(report.converted) << report.problem.Describe();
         EXPECT_EQ(convtest::ReadFile(folder.Path("back.txt")), text);

@@ -33,10 +33,10 @@ struct ReadBack {
 
 Stamp At(int year, int month, int day, int hour = 0, int minute = 0, int second = 0)
 {
-    return *StampFromFields(StampFields{year, month, day, hour, minute, second});
+    return *StampFromFields(sys::DateTimeFields{year, month, day, hour, minute, second});
 }
 
-Status WriteWorkbook(const std::string& path, const SeriesHeader& header, const std::vector<Row>& rows,
+sys::Status WriteWorkbook(const std::string& path, const SeriesHeader& header, const std::vector<Row>& rows,
                      const std::string& title = "")
 {
     XlsxSeriesWriter writer;
@@ -46,9 +46,9 @@ Status WriteWorkbook(const std::string& path, const SeriesHeader& header, const 
 ReadBack ReadWorkbook(const std::string& path)
 {
     ReadBack back;
-    Status status;
-    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Excel, "", status);
-    std::unique_ptr<SeriesReader> reader = MakeReader(Format::Excel, spec.get());
+    sys::Status status;
+    std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Excel, "", status);
+    std::unique_ptr<SeriesReader> reader = MakeReader(sys::FileFormat::Excel, spec.get());
     status = reader->Open(path);
     if (!status) {
         back.problem = status.problem().Describe();
@@ -295,7 +295,7 @@ TEST(XlsxWriter, GridLimitsFailClearly)
     EXPECT_TRUE(WriteWorkbook(folder.Path("widest.xlsx"), wide, {{0, std::vector<double>(wide.items.size(), 2.5)}}));
     wide.items.push_back(Item("one too many"));
     XlsxSeriesWriter tooWide;
-    const Status refused = tooWide.Begin(folder.Path("too-wide.xlsx"), wide, "");
+    const sys::Status refused = tooWide.Begin(folder.Path("too-wide.xlsx"), wide, "");
     ASSERT_FALSE(refused);
     EXPECT_EQ(refused.problem().message, "16384 items do not fit the 16383 value columns of a worksheet");
 
@@ -305,7 +305,7 @@ TEST(XlsxWriter, GridLimitsFailClearly)
     ASSERT_TRUE(tall.Begin(path, narrow, ""));
     for (unsigned row = 2; row < XlsxSeriesWriter::kMaxRows; ++row)
         ASSERT_TRUE(tall.Write(Row{Stamp(row) * 60, {}})) << row;
-    const Status full = tall.Write(Row{0, {}});
+    const sys::Status full = tall.Write(Row{0, {}});
     ASSERT_FALSE(full);
     EXPECT_EQ(full.problem().message, "more rows than a worksheet holds (1048576)");
     ASSERT_TRUE(tall.Finish());
@@ -321,17 +321,17 @@ TEST(XlsxWriter, WriteFailuresNameTheCauseAndLeaveNoOutput)
     SeriesHeader header;
     header.items = {Item("a"), Item("b")};
     std::vector<Row> rows(20000, Row{At(2020, 1, 1), {1.25, 2.5}});
-    const Status full = WriteWorkbook("/dev/full", header, rows);
+    const sys::Status full = WriteWorkbook("/dev/full", header, rows);
     ASSERT_FALSE(full);
     EXPECT_EQ(full.problem().file, "/dev/full");
     EXPECT_NE(full.problem().message.find("No space left on device"), std::string::npos) << full.problem().message;
 
     convtest::ScratchFolder folder;
     convtest::WriteFile(folder.Path("in.txt"), "Rainfall[mm]:Accumulated\nDate/time\tRain\n2020/01/01 00:00:00\t1\n");
-    Status status;
-    std::unique_ptr<CSpecification> spec = LoadTemplate(Format::Ascii, "", status);
+    sys::Status status;
+    std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Ascii, "", status);
     const std::string output = folder.Path("missing/out.xlsx");
-    const FileReport report = ConvertFile(FileJob{Format::Ascii, folder.Path("in.txt"), spec.get(), {}, Format::Excel, output, ""});
+    const FileReport report = ConvertFile(FileJob{sys::FileFormat::Ascii, folder.Path("in.txt"), spec.get(), {}, sys::FileFormat::Excel, output, ""});
     EXPECT_FALSE(report.converted);
     EXPECT_NE(report.problem.message.find("No such file or directory"), std::string::npos) << report.problem.message;
     EXPECT_FALSE(std::filesystem::exists(folder.Path("missing")));

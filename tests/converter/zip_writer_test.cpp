@@ -34,24 +34,24 @@ std::string Repetitive(size_t size)
 }
 
 // Writes the parts in order; a part whose name ends in '+' is streamed in pieces of 100,000 bytes.
-Status WritePackage(const std::string& path, const std::vector<std::pair<std::string, std::string>>& parts,
+sys::Status WritePackage(const std::string& path, const std::vector<std::pair<std::string, std::string>>& parts,
                     size_t bufferBytes = 256 * 1024)
 {
     ZipWriter zip(bufferBytes);
-    if (Status opened = zip.Open(path); !opened)
+    if (sys::Status opened = zip.Open(path); !opened)
         return opened;
     for (const auto& [name, data] : parts) {
         if (name.back() != '+') {
-            if (Status added = zip.AddEntry(name, data); !added)
+            if (sys::Status added = zip.AddEntry(name, data); !added)
                 return added;
             continue;
         }
-        if (Status begun = zip.BeginEntry(name.substr(0, name.size() - 1)); !begun)
+        if (sys::Status begun = zip.BeginEntry(name.substr(0, name.size() - 1)); !begun)
             return begun;
         for (size_t at = 0; at < data.size(); at += 100000)
-            if (Status appended = zip.Append(std::string_view(data).substr(at, 100000)); !appended)
+            if (sys::Status appended = zip.Append(std::string_view(data).substr(at, 100000)); !appended)
                 return appended;
-        if (Status ended = zip.EndEntry(); !ended)
+        if (sys::Status ended = zip.EndEntry(); !ended)
             return ended;
     }
     return zip.Close();
@@ -172,7 +172,7 @@ TEST(ZipWriter, WriteFailuresNameTheFileAndTheCause)
         {"/nonexistent-folder/x.zip", "No such file or directory"},
     };
     for (const Case& c : cases) {
-        const Status status = WritePackage(c.path, {{"a", RandomBytes(300000, 5)}, {"b+", Repetitive(2000000)}});
+        const sys::Status status = WritePackage(c.path, {{"a", RandomBytes(300000, 5)}, {"b+", Repetitive(2000000)}});
         ASSERT_FALSE(status) << c.path;
         EXPECT_EQ(status.problem().file, c.path);
         EXPECT_NE(status.problem().message.find(c.cause), std::string::npos) << status.problem().message;

@@ -52,7 +52,7 @@ TEST(TemporarySetupFile, IsPrivateAndRemovedOnlyWhenStillItsOwn)
     const std::string path = folder.File("Setup.wpx");
     {
         TemporarySetupFile file(folder.Path() + "/", "Setup.wpx", "content\n");
-        ASSERT_TRUE(file.Created()) << file.Error();
+        ASSERT_TRUE(file.Created()) << file.status().problem().message;
         EXPECT_EQ(file.Path(), path);
         EXPECT_EQ(ReadFile(path), "content\n");
         struct stat st {};
@@ -72,9 +72,9 @@ TEST(TemporarySetupFile, IsPrivateAndRemovedOnlyWhenStillItsOwn)
 
     TemporarySetupFile missing(folder.File("no-such-folder/"), "Setup.wpx", "x");
     EXPECT_FALSE(missing.Created());
-    EXPECT_NE(missing.Error().find(folder.File("no-such-folder/Setup.wpx") + ": No such file or directory"),
+    EXPECT_NE(missing.status().problem().message.find(folder.File("no-such-folder/Setup.wpx") + ": No such file or directory"),
               std::string::npos)
-        << missing.Error();
+        << missing.status().problem().message;
 }
 
 // Stopped by a signal the host may catch, a process removes its temporary setup file and then

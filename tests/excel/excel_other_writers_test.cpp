@@ -60,9 +60,9 @@ struct EngineRead {
 
 EngineRead Convert(const std::string& input, const std::string& output)
 {
-    converter::Status status;
-    std::unique_ptr<CSpecification> spec = converter::LoadTemplate(converter::Format::Excel, "", status);
-    converter::FileJob job{converter::Format::Excel, input, spec.get(), {}, converter::Format::Ascii, output, ""};
+    sys::Status status;
+    std::unique_ptr<CSpecification> spec = converter::LoadTemplate(sys::FileFormat::Excel, "", status);
+    converter::FileJob job{sys::FileFormat::Excel, input, spec.get(), {}, sys::FileFormat::Ascii, output, ""};
     const converter::FileReport report = converter::ConvertFile(job);
     return {report.converted, report.rows, report.notes, report.problem.Describe()};
 }
@@ -295,9 +295,9 @@ TEST_F(OtherWritersTest, SixteenThousandColumnsAreReadWhole)
     book.Number(3, 1, 44333);
     book.Close();
 
-    converter::Status status;
-    std::unique_ptr<CSpecification> spec = converter::LoadTemplate(converter::Format::Excel, "", status);
-    std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(converter::Format::Excel, spec.get());
+    sys::Status status;
+    std::unique_ptr<CSpecification> spec = converter::LoadTemplate(sys::FileFormat::Excel, "", status);
+    std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(sys::FileFormat::Excel, spec.get());
     ASSERT_TRUE(reader->Open(book.path)) << reader->status().problem().Describe();
     ASSERT_EQ(reader->Header().items.size(), 16000u);
     EXPECT_EQ(reader->Header().items[0].name, "N1");

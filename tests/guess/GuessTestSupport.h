@@ -58,9 +58,9 @@ struct ReadSeries {
 inline ReadSeries ReadWith(const std::string& path, const CSpecification& spec, bool excel)
 {
     ReadSeries series;
-    const auto format = excel ? converter::Format::Excel : converter::Format::Ascii;
+    const auto format = excel ? sys::FileFormat::Excel : sys::FileFormat::Ascii;
     std::unique_ptr<converter::SeriesReader> reader = converter::MakeReader(format, &spec);
-    if (converter::Status opened = reader->Open(path); !opened) {
+    if (sys::Status opened = reader->Open(path); !opened) {
         series.problem = opened.problem().Describe();
         return series;
     }

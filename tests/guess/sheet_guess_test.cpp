@@ -207,10 +207,10 @@ TEST(EngineWorkbooks, AreGuessedBackToTheEngineLayout)
     for (const char* extension : {".xlsx", ".xls"}) {
         SCOPED_TRACE(extension);
         const std::string output = folder + "velmora_guess_engine_" + std::to_string(::getpid()) + extension;
-        converter::Status loaded;
-        std::unique_ptr<CSpecification> spec = converter::LoadTemplate(converter::Format::Ascii, "", loaded);
-        converter::FileJob job{converter::Format::Ascii, kData + "tab_engine_layout.txt", spec.get(), {},
-                               converter::Format::Excel, output, "Gauge"};
+        sys::Status loaded;
+        std::unique_ptr<CSpecification> spec = converter::LoadTemplate(sys::FileFormat::Ascii, "", loaded);
+        converter::FileJob job{sys::FileFormat::Ascii, kData + "tab_engine_layout.txt", spec.get(), {},
+                               sys::FileFormat::Excel, output, "Gauge"};
         ASSERT_TRUE(converter::ConvertFile(job).converted);
         const guess::TemplateGuess guessed = guess::GuessTemplate(output, guess::InputKind::Excel);
         ASSERT_TRUE(guessed.spec) << guess::DescribeRefusal(guessed);

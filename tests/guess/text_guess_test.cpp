@@ -248,9 +248,9 @@ TEST(TextGuessOfTheExamples, ReadsAsTheirOwnTemplatesDo)
         const std::string data = std::string(VELMORA_SOURCE_DIR) + "/examples/data/" + name + ".txt";
         const guess::TemplateGuess guessed = guess::GuessTemplate(data, guess::InputKind::Ascii);
         ASSERT_TRUE(guessed.spec) << guess::DescribeRefusal(guessed);
-        converter::Status loaded;
+        sys::Status loaded;
         std::unique_ptr<CSpecification> own = converter::LoadTemplate(
-            converter::Format::Ascii, std::string(VELMORA_SOURCE_DIR) + "/examples/templates/" + name + ".xml", loaded);
+            sys::FileFormat::Ascii, std::string(VELMORA_SOURCE_DIR) + "/examples/templates/" + name + ".xml", loaded);
         ASSERT_TRUE(own);
         own->m_arrSelItems.clear(); // the example's own selection reorders the items
         const ReadSeries fromGuess = ReadWith(data, *guessed.spec, false), fromOwn = ReadWith(data, *own, false);

@@ -2,6 +2,7 @@
 #include "parsers/ExcelFilePreviewParser.h"
 #include "parsers/ParserFactory.h"
 #include "parsers/RbxPreviewFileParser.h"
+#include "platform/system/FileFormat.h"
 #include "templates/AsciiSpecification.h"
 #include "templates/ExcelSpecification.h"
 
@@ -9,7 +10,17 @@
 
 namespace {
 
+constexpr int kFormatRbx0 = sys::Number(sys::FileFormat::Rbx0);
+constexpr int kFormatAscii = sys::Number(sys::FileFormat::Ascii);
+constexpr int kFormatExcel = sys::Number(sys::FileFormat::Excel);
 constexpr int kFormats[] = {kFormatRbx0, kFormatAscii, kFormatExcel};
+
+// The number of the format a command line names; 0 for another name.
+int FormatFromName(const char* name)
+{
+    const sys::FileFormatInfo* info = sys::FindFormatNamed(name);
+    return info ? sys::Number(info->format) : 0;
+}
 
 TEST(ParserFactory, EachFormatsParserServesThatFormatOnly)
 {

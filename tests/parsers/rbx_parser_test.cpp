@@ -36,10 +36,10 @@ protected:
     {
         const std::string path = folder.Path("series.rbx0");
         rbx::CRbxWriter writer;
-        EXPECT_TRUE(writer.Open(path, definition)) << writer.Error();
+        EXPECT_TRUE(writer.Open(path, definition)) << writer.status().problem().Describe();
         for (const Step& step : steps)
-            EXPECT_TRUE(writer.WriteStep(step.time, step.values.data())) << writer.Error();
-        EXPECT_TRUE(writer.Close()) << writer.Error();
+            EXPECT_TRUE(writer.WriteStep(step.time, step.values.data())) << writer.status().problem().Describe();
+        EXPECT_TRUE(writer.Close()) << writer.status().problem().Describe();
         return path;
     }
 

@@ -3,6 +3,7 @@
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
 #include "platform/system/TextFileInput.h"
+#include "platform/system/TextLineReader.h"
 #include "tests/support/ScratchLocale.h"
 #include "tests/support/Utf16.h"
 
@@ -10,6 +11,7 @@
 
 #include <filesystem>
 #include <fstream>
+#include <random>
 #include <sys/stat.h>
 
 namespace {
@@ -36,14 +38,14 @@ using testsupport::Utf16;
 std::string ReadAll(const std::string& path, size_t chunk, std::string& error)
 {
     sys::TextFileInput input;
-    if (!input.Open(path)) {
-        error = input.Error();
+    if (const sys::Status opened = input.Open(path); !opened) {
+        error = opened.problem().message;
         return {};
     }
     std::string text(chunk, '\0'), all;
     while (size_t got = input.Read(text.data(), chunk))
         all.append(text, 0, got);
-    error = input.Error();
+    error = input.status().problem().message;
     return all;
 }
 
@@ -117,11 +119,100 @@ TEST(TextFileInput, OpensOnlyRegularFiles)
     };
     for (const auto& c : cases) {
         sys::TextFileInput input;
-        EXPECT_FALSE(input.Open(c.path)) << c.path;
-        EXPECT_NE(input.Error().find(c.messagePart), std::string::npos) << c.path << ": " << input.Error();
+        const sys::Status opened = input.Open(c.path);
+        EXPECT_FALSE(opened) << c.path;
+        EXPECT_NE(opened.problem().message.find(c.messagePart), std::string::npos) << c.path << ": " << opened.problem().message;
         std::string error;
         EXPECT_EQ(sys::OpenRegularFile(c.path, error), nullptr) << c.path;
     }
+}
+
+// The line reader hands lines out whole (Next) or copies their start (Read); both ways must give
+// the same lines, numbers and byte counts over lines that cross its buffer in every place.
+TEST(TextLineReader, WholeLinesAndCopiedLinesAgree)
+{
+    std::mt19937 random(15);
+    const std::string alphabet = "ab\r\t\xC3\x96 ";
+    for (int n = 0; n < 200; ++n) {
+        std::string content;
+        const int lines = static_cast<int>(random() % 12);
+        for (int l = 0; l < lines; ++l) {
+            const size_t length = random() % 4 == 0 ? random() % 300 : random() % 20;
+            for (size_t i = 0; i < length; ++i)
+                content += alphabet[random() % alphabet.size()];
+            if (l + 1 < lines || random() % 2)
+                content += random() % 3 == 0 ? "\r\n" : "\n";
+        }
+        ScratchFile file(content);
+        sys::TextLineReader whole(sys::TextLineReader::OverlongLine::TooLong, 16);
+        sys::TextLineReader copied(sys::TextLineReader::OverlongLine::TooLong, 16);
+        sys::TextLineReader cut(sys::TextLineReader::OverlongLine::TooLong, 16);
+        ASSERT_TRUE(whole.Open(file.Path()));
+        ASSERT_TRUE(copied.Open(file.Path()));
+        ASSERT_TRUE(cut.Open(file.Path()));
+        // The lines as the file holds them, line ends cut off but a "\r" before them kept.
+        std::vector<std::string> raw;
+        for (size_t at = 0; at < content.size();) {
+            const size_t newline = std::min(content.find('\n', at), content.size());
+            raw.push_back(content.substr(at, newline - at));
+            at = newline + 1;
+        }
+        std::string_view line;
+        std::string copy, start;
+        for (const std::string& held : raw) {
+            const std::string expected = !held.empty() && held.back() == '\r' ? held.substr(0, held.size() - 1) : held;
+            ASSERT_TRUE(whole.Next(line)) << content;
+            EXPECT_EQ(line, expected);
+            ASSERT_TRUE(copied.Read(copy)) << content;
+            EXPECT_EQ(copy, expected);
+            // A start of 10 bytes: a character cut there is dropped; a line that fits loses its "\r".
+            std::string expectedStart = held.size() > 10 ? held.substr(0, 10) : expected;
+            if (held.size() > 10)
+                text::DropPartialCharacter(expectedStart);
+            ASSERT_TRUE(cut.Read(start, 10));
+            EXPECT_EQ(start, expectedStart);
+            EXPECT_EQ(copied.LineNumber(), whole.LineNumber());
+            EXPECT_EQ(copied.BytesConsumed(), whole.BytesConsumed());
+        }
+        EXPECT_FALSE(whole.Next(line));
+        EXPECT_FALSE(copied.Read(copy));
+        EXPECT_FALSE(cut.Skip());
+        EXPECT_TRUE(whole.status() && copied.status() && cut.status());
+        EXPECT_EQ(whole.BytesConsumed(), content.size());
+    }
+}
+
+// A line without a line break within the limit is refused, in either wording, however it is read.
+TEST(TextLineReader, RefusesALineWithoutABreakWithinTheLimit)
+{
+    ScratchFile file("head\n" + std::string(sys::kLongestTextLine, 'x') + "\nnext\n");
+    using Wording = sys::TextLineReader::OverlongLine;
+    for (Wording wording : {Wording::NoLineBreak, Wording::TooLong}) {
+        sys::TextLineReader whole(wording), skipped(wording);
+        ASSERT_TRUE(whole.Open(file.Path()));
+        ASSERT_TRUE(skipped.Open(file.Path()));
+        std::string_view line;
+        ASSERT_TRUE(whole.Next(line));
+        EXPECT_FALSE(whole.Next(line));
+        ASSERT_TRUE(skipped.Skip());
+        EXPECT_FALSE(skipped.Skip());
+        const std::string expected = wording == Wording::NoLineBreak ? "no line break within 4194304 bytes"
+                                                                     : "the line is longer than 4194304 bytes";
+        for (const sys::TextLineReader* reader : {&whole, &skipped}) {
+            EXPECT_EQ(reader->status().problem().line, 2);
+            EXPECT_NE(reader->status().problem().message.find(expected), std::string::npos)
+                << reader->status().problem().message;
+        }
+    }
+    // One byte less is a line.
+    ScratchFile longest(std::string(sys::kLongestTextLine - 1, 'x') + "\nnext");
+    sys::TextLineReader reader;
+    ASSERT_TRUE(reader.Open(longest.Path()));
+    std::string_view line;
+    ASSERT_TRUE(reader.Next(line));
+    EXPECT_EQ(line.size(), sys::kLongestTextLine - 1);
+    ASSERT_TRUE(reader.Next(line));
+    EXPECT_EQ(line, "next");
 }
 
 TEST(TextBytes, AreUtf8WhenTheyCanBeAndWindows1252Otherwise)

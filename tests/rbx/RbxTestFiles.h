@@ -48,10 +48,10 @@ inline void WriteFile(const std::string& path, const rbx::FileDefinition& defini
                       const std::vector<std::vector<double>>& values)
 {
     rbx::CRbxWriter writer;
-    ASSERT_TRUE(writer.Open(path, definition)) << writer.Error();
+    ASSERT_TRUE(writer.Open(path, definition)) << writer.status().problem().Describe();
     for (std::size_t s = 0; s < times.size(); ++s)
-        ASSERT_TRUE(writer.WriteStep(times[s], values[s].data())) << writer.Error();
-    ASSERT_TRUE(writer.Close()) << writer.Error();
+        ASSERT_TRUE(writer.WriteStep(times[s], values[s].data())) << writer.status().problem().Describe();
+    ASSERT_TRUE(writer.Close()) << writer.status().problem().Describe();
 }
 
 inline rbx::FileDefinition Definition(std::vector<rbx::ItemInfo> items, bool calendar = true)

@@ -36,31 +36,31 @@ TEST(RbxWriter, DoubleRecordsAreTheRecordsOfTheGeneralPacking)
 
     const std::string direct = folder.File("direct.rbx0");
     rbx::CRbxWriter writer;
-    ASSERT_TRUE(writer.Open(direct, definition)) << writer.Error();
+    ASSERT_TRUE(writer.Open(direct, definition)) << writer.status().problem().Describe();
     for (std::size_t s = 0; s < steps; ++s)
-        ASSERT_TRUE(writer.WriteStep(static_cast<double>(s), rows[s].data())) << writer.Error();
-    ASSERT_TRUE(writer.Close()) << writer.Error();
+        ASSERT_TRUE(writer.WriteStep(static_cast<double>(s), rows[s].data())) << writer.status().problem().Describe();
+    ASSERT_TRUE(writer.Close()) << writer.status().problem().Describe();
 
     // The same records packed by hand, each gap its item's delete value.
     const double deletes[values] = {-999.0, -1e300, -1e300, -1e300, 7.5};
     const std::string packed = folder.File("packed.rbx0");
     rbx::CRbxWriter raw;
-    ASSERT_TRUE(raw.Open(packed, definition)) << raw.Error();
+    ASSERT_TRUE(raw.Open(packed, definition)) << raw.status().problem().Describe();
     for (std::size_t s = 0; s < steps; ++s) {
         double record[values];
         for (std::size_t v = 0; v < values; ++v)
             record[v] = std::isnan(rows[s][v]) ? deletes[v] : rows[s][v];
-        ASSERT_TRUE(raw.WriteRawStep(static_cast<double>(s), record)) << raw.Error();
+        ASSERT_TRUE(raw.WriteRawStep(static_cast<double>(s), record)) << raw.status().problem().Describe();
     }
-    ASSERT_TRUE(raw.Close()) << raw.Error();
+    ASSERT_TRUE(raw.Close()) << raw.status().problem().Describe();
     EXPECT_EQ(ReadBytes(direct), ReadBytes(packed));
 
     rbx::CRbxReader reader;
-    ASSERT_TRUE(reader.Open(direct, rbx::VerifyChecksum::AtEnd)) << reader.Error();
+    ASSERT_TRUE(reader.Open(direct, rbx::VerifyChecksum::AtEnd)) << reader.status().problem().Describe();
     EXPECT_EQ(reader.Header().fileType, rbx::kPerItemDeleteValue);
     std::vector<double> times(steps), read(steps * values);
     std::size_t got = 0;
-    ASSERT_TRUE(reader.ReadSteps(steps, times.data(), read.data(), got)) << reader.Error();
+    ASSERT_TRUE(reader.ReadSteps(steps, times.data(), read.data(), got)) << reader.status().problem().Describe();
     ASSERT_EQ(got, steps);
     for (std::size_t s = 0; s < steps; ++s)
         for (std::size_t v = 0; v < values; ++v)

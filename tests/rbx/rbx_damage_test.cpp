@@ -17,13 +17,13 @@ namespace {
 bool ReadsCleanly(const std::string& path, rbx::VerifyChecksum verify, std::string* error = nullptr)
 {
     rbx::CRbxReader reader;
-    bool ok = reader.Open(path, verify);
+    bool ok = reader.Open(path, verify).ok();
     std::vector<double> times(16), values(16 * 4);
     std::size_t got = 1;
     while (ok && got > 0)
         ok = reader.ReadSteps(16, times.data(), values.data(), got);
     if (error)
-        *error = reader.Error();
+        *error = reader.status().problem().Describe();
     return ok;
 }
 
@@ -93,15 +93,15 @@ TEST_F(DamagedFile, DamagedDataFailAtOpenOrAtTheLastStep)
     const std::string damaged = Damaged();
     rbx::CRbxReader atOpen;
     EXPECT_FALSE(atOpen.Open(damaged, rbx::VerifyChecksum::AtOpen));
-    EXPECT_NE(atOpen.Error().find("data checksum"), std::string::npos) << atOpen.Error();
+    EXPECT_NE(atOpen.status().problem().Describe().find("data checksum"), std::string::npos) << atOpen.status().problem().Describe();
 
     rbx::CRbxReader atEnd;
-    ASSERT_TRUE(atEnd.Open(damaged, rbx::VerifyChecksum::AtEnd)) << atEnd.Error();
+    ASSERT_TRUE(atEnd.Open(damaged, rbx::VerifyChecksum::AtEnd)) << atEnd.status().problem().Describe();
     double times[3], values[6];
     std::size_t got = 0;
     EXPECT_TRUE(atEnd.ReadSteps(2, times, values, got));
     EXPECT_FALSE(atEnd.ReadSteps(2, times, values, got));
-    EXPECT_NE(atEnd.Error().find("data checksum"), std::string::npos) << atEnd.Error();
+    EXPECT_NE(atEnd.status().problem().Describe().find("data checksum"), std::string::npos) << atEnd.status().problem().Describe();
 }
 
 TEST_F(DamagedFile, ForgedHeadersWithAbsurdCountsAreRejected)

@@ -33,7 +33,7 @@ TEST(RbxFormat, TheWriterProducesTheDocumentedExampleByteForByte)
 TEST(RbxFormat, TheDocumentedExampleReads)
 {
     rbx::CRbxReader reader;
-    ASSERT_TRUE(reader.Open(std::string(VELMORA_TEST_DATA) + "/rbx/gauge.rbx0")) << reader.Error();
+    ASSERT_TRUE(reader.Open(std::string(VELMORA_TEST_DATA) + "/rbx/gauge.rbx0")) << reader.status().problem().Describe();
     EXPECT_EQ(reader.Header().title, "Gauge");
     EXPECT_EQ(reader.Header().axis.type, rbx::kEquidistantCalendar);
     EXPECT_EQ(reader.Header().axis.step, 3600.0);

@@ -56,7 +56,7 @@ TEST_P(RoundTrip, ReaderGivesBackHeaderTimesAndValues)
     WriteFile(path, definition, axis.times, rows);
 
     rbx::CRbxReader reader;
-    ASSERT_TRUE(reader.Open(path)) << reader.Error();
+    ASSERT_TRUE(reader.Open(path)) << reader.status().problem().Describe();
     const rbx::FileHeader& h = reader.Header();
     EXPECT_EQ(h.fileType, rbx::kSharedDeleteValue);
     EXPECT_EQ(h.dataType, type.dataType);
@@ -75,7 +75,7 @@ TEST_P(RoundTrip, ReaderGivesBackHeaderTimesAndValues)
 
     std::vector<double> times(4), values(8);
     std::size_t got = 0;
-    ASSERT_TRUE(reader.ReadSteps(4, times.data(), values.data(), got)) << reader.Error();
+    ASSERT_TRUE(reader.ReadSteps(4, times.data(), values.data(), got)) << reader.status().problem().Describe();
     ASSERT_EQ(got, 3u);
     for (std::size_t s = 0; s < 3; ++s) {
         EXPECT_EQ(times[s], axis.times[s]);
@@ -182,7 +182,7 @@ TEST(RbxWriter, DecidesTheAxisKindFromTheSteps)
         std::vector<std::vector<double>> rows(c.times.size(), {1.0});
         WriteFile(path, Definition({Item("A", rbx::kFloat32)}, c.calendar), c.times, rows);
         rbx::CRbxReader reader;
-        ASSERT_TRUE(reader.Open(path)) << reader.Error();
+        ASSERT_TRUE(reader.Open(path)) << reader.status().problem().Describe();
         EXPECT_EQ(reader.Header().axis.type, c.axisType);
         EXPECT_DOUBLE_EQ(reader.Header().axis.step, c.step);
         EXPECT_EQ(reader.Header().axis.steps, c.times.size());
@@ -198,15 +198,15 @@ TEST(RbxWriter, CalendarStampsCountFromTheFirstStampInTheAxisUnit)
     definition.timeUnitKey = 1402;
     definition.timeUnitText = "hour";
     rbx::CRbxWriter writer;
-    ASSERT_TRUE(writer.Open(path, definition)) << writer.Error();
+    ASSERT_TRUE(writer.Open(path, definition)) << writer.status().problem().Describe();
     const double value = 1.0;
     ASSERT_TRUE(writer.WriteStepAt(COleDateTime(2021, 6, 30, 22, 0, 0), &value));
     ASSERT_TRUE(writer.WriteStepAt(COleDateTime(2021, 6, 30, 23, 30, 0), &value));
     ASSERT_TRUE(writer.WriteStepAt(COleDateTime(2021, 7, 1, 2, 0, 0), &value));
-    ASSERT_TRUE(writer.Close()) << writer.Error();
+    ASSERT_TRUE(writer.Close()) << writer.status().problem().Describe();
 
     rbx::CRbxReader reader;
-    ASSERT_TRUE(reader.Open(path)) << reader.Error();
+    ASSERT_TRUE(reader.Open(path)) << reader.status().problem().Describe();
     EXPECT_EQ(reader.Header().axis.startDate, "2021-06-30");
     EXPECT_EQ(reader.Header().axis.startTime, "22:00:00");
     EXPECT_EQ(reader.Header().axis.type, rbx::kNonEquidistantCalendar);
@@ -223,7 +223,7 @@ TEST(RbxWriter, DifferentDeleteValuesMakeAPerItemFileAndNaNStoresTheDeleteValue)
     WriteFile(path, Definition({Item("A", rbx::kFloat32, -1e-35), Item("B", rbx::kInt32, -9999)}), {0.0},
               {{NAN, NAN}});
     rbx::CRbxReader reader;
-    ASSERT_TRUE(reader.Open(path)) << reader.Error();
+    ASSERT_TRUE(reader.Open(path)) << reader.status().problem().Describe();
     EXPECT_EQ(reader.Header().fileType, rbx::kPerItemDeleteValue);
     EXPECT_EQ(reader.Header().items[0].deleteValue, -1e-35);
     EXPECT_EQ(reader.Header().items[1].deleteValue, -9999.0);
@@ -257,13 +257,13 @@ TEST(RbxWriter, RejectsWhatTheFormatCannotHoldAndLeavesNoFileBehind)
         SCOPED_TRACE(c.what);
         const std::string path = folder.File("bad.rbx0");
         rbx::CRbxWriter writer;
-        bool ok = writer.Open(path, Definition(c.items));
+        bool ok = writer.Open(path, Definition(c.items)).ok();
         for (std::size_t s = 0; ok && s < c.times.size(); ++s)
             ok = writer.WriteStep(c.times[s], &c.values[s]);
         ok = ok && writer.Close();
         EXPECT_FALSE(ok);
-        EXPECT_NE(writer.Error().find(c.message), std::string::npos) << writer.Error();
-        EXPECT_EQ(writer.Error().rfind(path, 0), 0u) << "the message names the file";
+        EXPECT_NE(writer.status().problem().Describe().find(c.message), std::string::npos) << writer.status().problem().Describe();
+        EXPECT_EQ(writer.status().problem().Describe().rfind(path, 0), 0u) << "the message names the file";
         writer.Close();
         EXPECT_FALSE(std::filesystem::exists(path));
     }
@@ -307,14 +307,14 @@ TEST(RbxWriter, ManyStepsCrossTheWriteBufferAndBlockReadsStayInOrder)
         const double values[2] = {s * 0.5, static_cast<double>(s)};
         ASSERT_TRUE(writer.WriteStep(static_cast<double>(s), values));
     }
-    ASSERT_TRUE(writer.Close()) << writer.Error();
+    ASSERT_TRUE(writer.Close()) << writer.status().problem().Describe();
 
     rbx::CRbxReader reader;
-    ASSERT_TRUE(reader.Open(path, rbx::VerifyChecksum::AtEnd)) << reader.Error();
+    ASSERT_TRUE(reader.Open(path, rbx::VerifyChecksum::AtEnd)) << reader.status().problem().Describe();
     std::vector<double> times(7777), values(2 * 7777);
     std::size_t total = 0, got = 0;
     do {
-        ASSERT_TRUE(reader.ReadSteps(times.size(), times.data(), values.data(), got)) << reader.Error();
+        ASSERT_TRUE(reader.ReadSteps(times.size(), times.data(), values.data(), got)) << reader.status().problem().Describe();
         for (std::size_t i = 0; i < got; ++i) {
             ASSERT_EQ(times[i], static_cast<double>(total + i));
             ASSERT_EQ(values[2 * i + 1], static_cast<double>(total + i));

@@ -52,9 +52,9 @@ std::string OpenFailure(const std::string& path)
 {
     WorkbookReader reader;
     if (!reader.Open(path))
-        return reader.Error();
+        return reader.status().problem().message;
     if (!reader.ReadRows(1, [](int, const std::vector<RowCell>&) { return true; }))
-        return reader.Error();
+        return reader.status().problem().message;
     return "";
 }
 
@@ -72,7 +72,7 @@ TEST(OtherWriters, XlwtWorkbookOf65536RowsReadsWholeThroughItsDifatChain)
     ASSERT_GE(Load32(reinterpret_cast<const unsigned char*>(bytes.data()) + 72), 1u) << "the file needs a DIFAT sector";
 
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(path)) << reader.Error();
+    ASSERT_TRUE(reader.Open(path)) << reader.status().problem().message;
     int rows = 0;
     std::vector<RowCell> last;
     ASSERT_TRUE(reader.ReadRows(1, [&](int row, const std::vector<RowCell>& cells) {
@@ -80,7 +80,7 @@ TEST(OtherWriters, XlwtWorkbookOf65536RowsReadsWholeThroughItsDifatChain)
         rows = row;
         last = cells;
         return true;
-    })) << reader.Error();
+    })) << reader.status().problem().message;
     EXPECT_EQ(rows, 65536);
     ASSERT_EQ(last.size(), 12u);
     EXPECT_EQ(last[0].text, "2020/02/15 12:15:00"); // 65,535 minutes on
@@ -165,14 +165,14 @@ book.save(sys.argv[1])
     EXPECT_EQ(sheet->UsedRange()->ColumnCount(), 4);
 
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(path)) << reader.Error();
+    ASSERT_TRUE(reader.Open(path)) << reader.status().problem().message;
     std::vector<std::string> marked;
     ASSERT_TRUE(reader.ReadRows(1, [&](int row, const std::vector<RowCell>& cells) {
         for (const RowCell& cell : cells)
             if (cell.formulaWithoutResult)
                 marked.push_back(std::to_string(row) + ":" + std::to_string(cell.column));
         return true;
-    })) << reader.Error();
+    })) << reader.status().problem().message;
     EXPECT_EQ(marked, (std::vector<std::string>{"2:4", "3:4", "4:4"}));
 }
 
@@ -192,12 +192,12 @@ book.save(sys.argv[1])
                                               pytools::Quote(path));
     ASSERT_EQ(made.status, 0) << made.output;
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(path)) << reader.Error();
+    ASSERT_TRUE(reader.Open(path)) << reader.status().problem().message;
     std::vector<RowCell> row;
     ASSERT_TRUE(reader.ReadRows(1, [&](int, const std::vector<RowCell>& cells) {
         row = cells;
         return true;
-    })) << reader.Error();
+    })) << reader.status().problem().message;
     ASSERT_EQ(row.size(), 2u);
     EXPECT_EQ(row[1].value.type, Variant::Text);
     EXPECT_EQ(row[1].text, "");

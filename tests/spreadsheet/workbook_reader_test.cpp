@@ -21,7 +21,7 @@ std::vector<Row> ReadAll(WorkbookReader& reader, int sheet)
     EXPECT_TRUE(reader.ReadRows(sheet, [&](int row, const std::vector<RowCell>& cells) {
         rows.push_back({row, cells});
         return true;
-    })) << reader.Error();
+    })) << reader.status().problem().message;
     return rows;
 }
 
@@ -45,7 +45,7 @@ std::string MakeTwoSheetWorkbook()
 TEST(WorkbookReader, ListsSheetsAndStreamsRowsWithValuesAndTexts)
 {
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(MakeTwoSheetWorkbook())) << reader.Error();
+    ASSERT_TRUE(reader.Open(MakeTwoSheetWorkbook())) << reader.status().problem().message;
     ASSERT_EQ(reader.SheetCount(), 2);
     EXPECT_EQ(reader.SheetNames()[1], "Second");
 
@@ -78,7 +78,7 @@ TEST(WorkbookReader, StopsWhenTheCallbackSaysSo)
 TEST(WorkbookReader, ReadsXlsAlike)
 {
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(DataFile("stamps.xls"))) << reader.Error();
+    ASSERT_TRUE(reader.Open(DataFile("stamps.xls"))) << reader.status().problem().message;
     EXPECT_EQ(reader.SheetNames(), std::vector<std::string>{"Stamps"});
     std::vector<Row> rows = ReadAll(reader, 1);
     ASSERT_EQ(rows.size(), 4u);
@@ -90,18 +90,18 @@ TEST(WorkbookReader, FailuresNameTheFileAndTheSheet)
 {
     WorkbookReader reader;
     EXPECT_FALSE(reader.Open(DataFile("bomb.xlsx")));
-    EXPECT_NE(reader.Error().find("bomb.xlsx"), std::string::npos);
+    EXPECT_NE(reader.status().problem().message.find("bomb.xlsx"), std::string::npos);
     EXPECT_EQ(reader.SheetCount(), 0);
 
     ASSERT_TRUE(reader.Open(DataFile("series.xls")));
     EXPECT_FALSE(reader.ReadRows(3, [](int, const std::vector<RowCell>&) { return true; }));
-    EXPECT_NE(reader.Error().find("no sheet 3"), std::string::npos) << reader.Error();
+    EXPECT_NE(reader.status().problem().message.find("no sheet 3"), std::string::npos) << reader.status().problem().message;
 }
 
 TEST(WorkbookReader, SheetNamesOfAnXlsxPackageAreDecoded)
 {
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(DataFile("features.xlsx"))) << reader.Error();
+    ASSERT_TRUE(reader.Open(DataFile("features.xlsx"))) << reader.status().problem().message;
     EXPECT_EQ(reader.SheetNames(), (std::vector<std::string>{"Data & more", "Second"}));
     std::vector<Row> rows = ReadAll(reader, 2);
     ASSERT_EQ(rows.size(), 1u);
@@ -112,13 +112,13 @@ TEST(WorkbookReader, SheetNamesOfAnXlsxPackageAreDecoded)
 TEST(WorkbookReader, NumbersGetTheirTextsOnlyInTheTextColumns)
 {
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(MakeTwoSheetWorkbook())) << reader.Error();
+    ASSERT_TRUE(reader.Open(MakeTwoSheetWorkbook())) << reader.status().problem().message;
     const std::vector<bool> onlyFirst = {false, true};
     std::vector<Row> rows;
     ASSERT_TRUE(reader.ReadRows(1, [&](int row, const std::vector<RowCell>& cells) {
         rows.push_back({row, cells});
         return true;
-    }, &onlyFirst)) << reader.Error();
+    }, &onlyFirst)) << reader.status().problem().message;
     ASSERT_EQ(rows.size(), 4u);
     EXPECT_EQ(rows[0].cells[1].text, "Flow"); // texts always come with their text
     EXPECT_EQ(rows[1].cells[0].text, "2021/05/17 12:00");

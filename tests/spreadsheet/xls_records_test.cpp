@@ -68,14 +68,14 @@ TEST_F(RecordsWorkbook, FormulaCellsGiveTheirLastResult)
 TEST(XlsRecords, AnEmptyFormulaResultIsMarkedAsMissing)
 {
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(DataFile("records.xls"))) << reader.Error();
+    ASSERT_TRUE(reader.Open(DataFile("records.xls"))) << reader.status().problem().message;
     std::vector<int> marked;
     ASSERT_TRUE(reader.ReadRows(1, [&](int row, const std::vector<RowCell>& cells) {
         for (const RowCell& cell : cells)
             if (cell.formulaWithoutResult)
                 marked.push_back(row * 100 + cell.column);
         return true;
-    })) << reader.Error();
+    })) << reader.status().problem().message;
     EXPECT_EQ(marked, std::vector<int>{405}); // E4; A4 to D4 hold results
 }
 
@@ -90,14 +90,14 @@ TEST_F(RecordsWorkbook, FormattedBlanksWidenTheUsedRangeButAnEmbeddedChartDoesNo
 TEST(XlsSheets, ChartSheetsAreNotWorksheetsAndHiddenSheetsAre)
 {
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(DataFile("records.xls"))) << reader.Error();
+    ASSERT_TRUE(reader.Open(DataFile("records.xls"))) << reader.status().problem().message;
     EXPECT_EQ(reader.SheetNames(), (std::vector<std::string>{"Data", "Verborgen ä"}));
     int rows = 0;
     ASSERT_TRUE(reader.ReadRows(2, [&](int row, const std::vector<RowCell>& cells) {
         EXPECT_EQ(row, 1);
         EXPECT_EQ(cells.at(0).text, "1");
         return ++rows > 0;
-    })) << reader.Error();
+    })) << reader.status().problem().message;
     EXPECT_EQ(rows, 1);
 }
 
@@ -113,13 +113,13 @@ TEST(XlsDates, The1904SystemShiftsDateCellsOnly)
 TEST(XlsExcel5, ByteTextsReadInTheirCodePage)
 {
     WorkbookReader reader;
-    ASSERT_TRUE(reader.Open(DataFile("biff5.xls"))) << reader.Error();
+    ASSERT_TRUE(reader.Open(DataFile("biff5.xls"))) << reader.status().problem().message;
     EXPECT_EQ(reader.SheetNames(), std::vector<std::string>{"Größe"});
     std::vector<std::string> texts;
     ASSERT_TRUE(reader.ReadRows(1, [&](int, const std::vector<RowCell>& cells) {
         texts.push_back(cells.at(0).text);
         return true;
-    })) << reader.Error();
+    })) << reader.status().problem().message;
     EXPECT_EQ(texts, (std::vector<std::string>{"€ Größe", "2.3"})); // "0.0" rounds half up
 }
 
@@ -144,9 +144,9 @@ TEST(XlsDamage, EachFaultIsNamedWithTheFile)
         WorkbookReader reader;
         std::string message;
         if (!reader.Open(DataFile(c.file)))
-            message = reader.Error();
+            message = reader.status().problem().message;
         else if (!reader.ReadRows(1, [](int, const std::vector<RowCell>&) { return true; }))
-            message = reader.Error();
+            message = reader.status().problem().message;
         EXPECT_NE(message.find(c.file), std::string::npos) << c.file << ": " << message;
         EXPECT_NE(message.find(c.why), std::string::npos) << c.file << ": " << message;
     }

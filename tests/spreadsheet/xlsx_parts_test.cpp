@@ -16,9 +16,13 @@ namespace {
 
 class RecordingSink : public ImportSink {
 public:
-    void AddSheet(const std::string&) override {}
-    void AddCell(int, const ImportedCell& cell) override { cells.push_back(cell); }
-    void EndSheet(int) override {}
+    bool AddSheet(const std::string&) override { return true; }
+    bool AddCell(int, const ImportedCell& cell) override
+    {
+        cells.push_back(cell);
+        return true;
+    }
+    bool EndSheet(int) override { return true; }
     std::vector<ImportedCell> cells;
 };
 

@@ -101,9 +101,9 @@ TEST(TemplateReport, OpensTheKindTheRootNames)
         const char* delimiter;
     } cases[] = {{"e.xml", "excel", 3, "Tab"}, {"a.xml", "ascii", 1, "Comma"}, {"nested.xml", "excel", 6, "Tab"}};
     for (const Case& c : cases) {
-        CString error;
-        tmplfile::OpenedTemplate opened = tmplfile::OpenTemplateFile(folder.File(c.file), error);
-        ASSERT_TRUE(opened.spec) << error;
+        tmplfile::OpenedTemplate opened;
+        const sys::Status status = tmplfile::OpenTemplateFile(folder.File(c.file), opened);
+        ASSERT_TRUE(opened.spec) << status.problem().Describe();
         EXPECT_STREQ(opened.layout->kind, c.kind);
         EXPECT_EQ(opened.spec->m_DataDesc.m_nExcelSheet, c.sheet);
         EXPECT_EQ(opened.spec->m_strDelimiter, c.delimiter);
@@ -123,8 +123,9 @@ TEST(TemplateReport, FilesThatAreNoTemplatesGiveAReason)
                  {"other.xml", "not a template file"},
                  {"broken.xml", "ExcelSheet must be a whole number"}};
     for (const Case& c : cases) {
-        CString error;
-        EXPECT_FALSE(tmplfile::OpenTemplateFile(folder.File(c.file), error).spec) << c.file;
+        tmplfile::OpenedTemplate opened;
+        const CString error = tmplfile::OpenTemplateFile(folder.File(c.file), opened).problem().Describe();
+        EXPECT_FALSE(opened.spec) << c.file;
         EXPECT_NE(error.find(c.reason), std::string::npos) << error;
         EXPECT_NE(error.find(c.file), std::string::npos) << error;
     }

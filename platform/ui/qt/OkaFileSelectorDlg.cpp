@@ -25,7 +25,7 @@ bool ReadRbxItemRows(const CString& path, std::vector<CRbxItemRow>& rows, CStrin
     rbx::CRbxReader reader;
     // Only the header is needed; the data are checked when they are read.
     if (!reader.Open(path, rbx::VerifyChecksum::AtEnd)) {
-        error = reader.Error();
+        error = reader.status().problem().Describe();
         return false;
     }
     for (const rbx::ItemInfo& item : reader.Header().items)

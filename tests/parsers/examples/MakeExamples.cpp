@@ -130,7 +130,7 @@ bool WriteRiverRbx(const std::string& path)
 
     rbx::CRbxWriter writer;
     if (!writer.Open(path, definition)) {
-        std::fprintf(stderr, "make_parser_examples: %s\n", writer.Error().c_str());
+        std::fprintf(stderr, "make_parser_examples: %s\n", writer.status().problem().Describe().c_str());
         return false;
     }
     for (int hour = 0; hour < kHours; ++hour) {
@@ -139,7 +139,7 @@ bool WriteRiverRbx(const std::string& path)
             break;
     }
     if (!writer.Close()) {
-        std::fprintf(stderr, "make_parser_examples: %s\n", writer.Error().c_str());
+        std::fprintf(stderr, "make_parser_examples: %s\n", writer.status().problem().Describe().c_str());
         return false;
     }
     return true;

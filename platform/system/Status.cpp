@@ -1,6 +1,6 @@
-#include "converter/Problem.h"
+#include "platform/system/Status.h"
 
-namespace converter {
+namespace sys {
 
 std::string Problem::Describe() const
 {
@@ -14,4 +14,4 @@ std::string Problem::Describe() const
     return text + message;
 }
 
-} // namespace converter
+} // namespace sys

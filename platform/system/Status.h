@@ -1,9 +1,12 @@
 #pragma once
-// What went wrong while converting a file: which file, where in it, and what was expected.
+// What went wrong while reading or writing a file: which file, where in it, and what was expected.
+// Every reader and writer returns a Status; only the edges whose form is fixed (a parser's int
+// operation with its message box, the engine's checks, the exported functions) turn it into
+// something else.
 #include <memory>
 #include <string>
 
-namespace converter {
+namespace sys {
 
 struct Problem {
     std::string file;
@@ -48,4 +51,4 @@ private:
     std::unique_ptr<Problem> m_problem;
 };
 
-} // namespace converter
+} // namespace sys

@@ -1,5 +1,6 @@
-// The fast field splitter against NextField itself, call for call.
-#include "converter/FieldSplitter.h"
+// The field splitter (plain lines by PlainFields, the rest by the field rule) against the template's
+// NextField, call for call.
+#include "delimited/FieldSplitter.h"
 #include "templates/AsciiSpecification.h"
 #include "platform/ui/UserInterface.h"
 
@@ -33,7 +34,7 @@ Expected ThroughNextField(const CSpecification& spec, const std::string& line)
 void ExpectSameSplit(const CSpecification& spec, const std::string& line)
 {
     const Expected expected = ThroughNextField(spec, line);
-    converter::FieldSplitter splitter(spec);
+    delimited::FieldSplitter splitter(spec.GetDialect());
     splitter.Split(line);
     const auto& calls = splitter.Calls();
     ASSERT_EQ(calls.size(), expected.texts.size()) << "line [" << line << "]";
@@ -115,7 +116,7 @@ TEST(FieldSplitter, AgreesWithNextFieldOnLongLines)
 TEST(FieldSplitter, LeadingDelimitersCutShiftTheLine)
 {
     CAsciiSpecification spec = Spec("Comma", 0, 1);
-    converter::FieldSplitter splitter(spec);
+    delimited::FieldSplitter splitter(spec.GetDialect());
     splitter.Split(",,a,b");
     EXPECT_EQ(splitter.Line(), "a,b");
     EXPECT_EQ(splitter.Offset(), 2);
