@@ -195,32 +195,9 @@ bool ReadSetup(const std::string& file, converter::JobSetup& setup)
     return read.ok();
 }
 
-// A dry run writes nothing, so it needs neither the log nor the watch over part files.
-int DryRun(const Arguments& arguments)
+// The conversion itself, after the setup is read and before any thread starts.
+int Convert(const converter::JobSetup& setup, const Arguments& arguments)
 {
-    ui::SilentUserInterface silent;
-    ui::SetProcessUserInterface(&silent);
-    try {
-        converter::JobSetup setup;
-        if (!ReadSetup(arguments.setupFile, setup))
-            return converter::kExitSetup;
-        return converter::DryRunJob(setup, stdout, arguments.json, arguments.threads, arguments.share, arguments.shares);
-    } catch (const std::exception& e) {
-        std::fprintf(stderr, "Velmora: stopped: %s\n", text::EscapeControls(e.what()).c_str());
-        return converter::kExitSetup;
-    }
-}
-
-} // namespace
-
-int main(int argc, char** argv)
-{
-    Arguments arguments;
-    if (const int status = ReadArguments(argc, argv, arguments); status >= 0)
-        return status;
-    if (arguments.dryRun)
-        return DryRun(arguments);
-
     // Blocked before any thread starts, so every thread inherits it and only sigwait takes them.
     const sigset_t waited = WaitedSignals();
     ::pthread_sigmask(SIG_BLOCK, &waited, nullptr);
@@ -231,6 +208,18 @@ int main(int argc, char** argv)
         files.rlim_cur = files.rlim_max;
         ::setrlimit(RLIMIT_NOFILE, &files);
     }
+    std::unique_ptr<converter::ConversionLog> log = OpenLog(setup);
+    return RunUntilStopped(setup, *log, {arguments.threads, arguments.quiet ? nullptr : stderr, arguments.share, arguments.shares},
+                           waited);
+}
+
+} // namespace
+
+int main(int argc, char** argv)
+{
+    Arguments arguments;
+    if (const int status = ReadArguments(argc, argv, arguments); status >= 0)
+        return status;
 
     // The engine runs unattended: nothing it calls may wait for a person.
     ui::SilentUserInterface silent;
@@ -239,10 +228,10 @@ int main(int argc, char** argv)
         converter::JobSetup setup;
         if (!ReadSetup(arguments.setupFile, setup))
             return converter::kExitSetup;
-        std::unique_ptr<converter::ConversionLog> log = OpenLog(setup);
-        return RunUntilStopped(setup, *log,
-                               {arguments.threads, arguments.quiet ? nullptr : stderr, arguments.share, arguments.shares},
-                               waited);
+        // A dry run writes nothing: it needs neither the log nor the watch over part files.
+        if (arguments.dryRun)
+            return converter::DryRunJob(setup, stdout, arguments.json, arguments.threads, arguments.share, arguments.shares);
+        return Convert(setup, arguments);
     } catch (const std::exception& e) {
         std::fprintf(stderr, "Velmora: stopped: %s\n", text::EscapeControls(e.what()).c_str());
         return converter::kExitSetup;
