@@ -150,12 +150,17 @@ FileCheck& Refuse(FileCheck& check, FileCheck::Verdict verdict, const std::strin
     return check;
 }
 
+std::string Count(std::uint64_t n, const char* one, const char* many)
+{
+    return std::to_string(n) + " " + (n == 1 ? one : many);
+}
+
 // What the writer of the output would refuse of a file that reads: its own limits.
 std::string WriterRefusal(const FileJob& job, const FileCheck& check)
 {
     if (job.outputFormat == sys::FileFormat::Rbx0 && check.repeatedStamps + check.decreasingStamps > 0)
         return "an rbx0 file needs rising time stamps, and " +
-               std::to_string(check.repeatedStamps + check.decreasingStamps) + " do not rise";
+               Count(check.repeatedStamps + check.decreasingStamps, "does not rise", "do not rise");
     if (job.outputFormat != sys::FileFormat::Excel)
         return {};
     const bool xls = text::EqualsNoCase(sys::FileExtension(job.output), ".xls");
@@ -216,9 +221,10 @@ FileCheck Check(const FileJob& job)
     if (!reader->status())
         return Refuse(check, check.rows == 0 && throughTemplate ? FileCheck::Verdict::Skipped : FileCheck::Verdict::Fails,
                       reader->status().problem().Describe());
+    // The rows themselves are listed below the file's line.
     if (check.rejectedCount > 0)
         return Refuse(check, faultBeforeFirstRow && throughTemplate ? FileCheck::Verdict::Skipped : FileCheck::Verdict::Fails,
-                      check.rejected.front().Describe());
+                      Count(check.rejectedCount, "row does not read", "rows do not read"));
     if (const std::string refusal = WriterRefusal(job, check); !refusal.empty())
         return Refuse(check, FileCheck::Verdict::Fails, refusal);
     return check;
@@ -294,11 +300,6 @@ Totals Sum(const std::vector<FileCheck>& checks)
         totals.decreases += check.decreaseCount;
     }
     return totals;
-}
-
-std::string Count(std::uint64_t n, const char* one, const char* many)
-{
-    return std::to_string(n) + " " + (n == 1 ? one : many);
 }
 
 std::string FileJson(const FileCheck& check)
