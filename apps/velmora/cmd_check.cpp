@@ -320,4 +320,4 @@ int Check(int argc, char** argv)
 
 } // namespace
 
-VELMORA_REGISTER_COMMAND("check", "check a stored setup against its files, as the wizard would", Check)
+VELMORA_REGISTER_COMMAND("check", "check a stored setup against its files, as the wizard would; --all reads every file (a dry run)", Check)
