@@ -110,7 +110,8 @@ bool DefineTemplate(const std::string& path, CEngine& engine, SetupOutcome& outc
 bool SelectItems(const SetupRequest& request, CEngine& engine, SetupOutcome& outcome)
 {
     ItemSelection selection = LoadItemSelection(&engine);
-    if (request.items) {
+    // With no items read, the page's own check (2300) refuses whatever was asked.
+    if (request.items && !selection.names.empty()) {
         selection.ticked.assign(selection.names.size(), false);
         for (unsigned item : *request.items) {
             if (item >= selection.names.size())
