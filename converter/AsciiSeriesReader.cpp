@@ -387,7 +387,10 @@ bool AsciiSeriesReader::Next(Row& row)
             if (ReadDataLineFused(line, row))
                 return true;
         }
-        return ReadDataLine(line, row);
+        if (ReadDataLine(line, row))
+            return true;
+        if (!PassOverFault())
+            return false;
     }
     m_status = m_lines.status();
     return false;

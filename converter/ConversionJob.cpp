@@ -190,6 +190,17 @@ std::string DescribeReport(const FileReport& report)
            "  no output written; " + (output.empty() ? std::string("-") : output) + " left as it was\n";
 }
 
+bool InShare(const std::string& input, unsigned share, unsigned shares)
+{
+    // FNV-1a of the name without its folder: the same on every machine and in every build.
+    std::uint64_t hash = 14695981039346656037ull;
+    for (unsigned char c : sys::FileTitle(input)) {
+        hash ^= c;
+        hash *= 1099511628211ull;
+    }
+    return shares > 0 && hash % shares == share - 1;
+}
+
 int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
 {
     const std::string problem = CheckJobSetup(setup);
@@ -199,7 +210,8 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
               Escaped(setup.inputType == 2 ? "folder " + setup.inputFolder : "file " + setup.inputFile) + " -> " +
               sys::FormatInfo(out).name + " " +
               Escaped(setup.inputType == 2 ? "folder " + setup.outputFolder : "file " + setup.outputFile) + "; template " +
-              (setup.templateName.empty() ? "(defaults)" : Escaped(setup.templateName)) + "; items " + Join(setup.items));
+              (setup.templateName.empty() ? "(defaults)" : Escaped(setup.templateName)) + "; items " + Join(setup.items) +
+              (options.shares ? "; share " + std::to_string(options.share) + " of " + std::to_string(options.shares) : ""));
     if (!problem.empty()) {
         log.Write("setup error: " + Escaped(problem) + "\nresult: nothing converted; exit status 3");
         return kExitSetup;
@@ -214,7 +226,10 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
 
     // Every output is known and judged before the first is written.
     const RunPlan runPlan(setup, LogPathFor(setup.logFile));
-    const std::vector<PlannedFile>& plan = runPlan.Files();
+    std::vector<PlannedFile> plan;
+    for (const PlannedFile& file : runPlan.Files())
+        if (options.shares == 0 || InShare(file.input, options.share, options.shares))
+            plan.push_back(file);
     for (const std::string& folder : runPlan.OutputFolders())
         for (const std::string& leftover : OutputFile::RemoveStaleTemporaries(folder))
             log.Write("note: removed " + Escaped(leftover) + ", left by a run that was stopped");
@@ -268,11 +283,14 @@ int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options)
     for (const FileReport& report : reports)
         converted += report.converted ? 1 : 0;
     const size_t failed = reports.size() - converted;
-    const int exitCode = (failed == 0 && !reports.empty()) ? kExitOk : kExitSomeFailed;
+    // A share may hold none of the files; the folder as a whole is judged by the other shares.
+    const bool nothingToDo = reports.empty() && options.shares == 0;
+    const int exitCode = (failed == 0 && !nothingToDo) ? kExitOk : kExitSomeFailed;
     std::string summary = "result: " + std::to_string(converted) + " converted, " + std::to_string(failed) +
                           " skipped or failed";
     if (reports.empty())
-        summary += "; the folder holds no " + std::string(sys::FormatInfo(in).name) + " file";
+        summary += options.shares ? "; this share holds none of the " + std::to_string(runPlan.Files().size()) + " files"
+                                  : "; the folder holds no " + std::string(sys::FormatInfo(in).name) + " file";
     if (setup.inputType == 2 && failed > 0)
         summary += "; " + res::LoadString(res::IDS_FOLDER_FILES_SKIPPED);
     log.Write(summary + "; exit status " + std::to_string(exitCode));

@@ -67,7 +67,14 @@ private:
 struct JobOptions {
     unsigned threads = 0;     // 0: one per core
     std::FILE* progress = nullptr; // progress lines for long runs; null for none
+    unsigned share = 0;       // convert only share `share` (from 1) of `shares`; 0: every file
+    unsigned shares = 0;
 };
+
+// True when `input` belongs to share `share` (from 1) of `shares`. The file's name alone decides
+// (a hash of it), so every run of a batch, on any machine, puts each file into the same one share
+// however the folder is listed and whatever else it holds.
+bool InShare(const std::string& input, unsigned share, unsigned shares);
 
 // Runs the whole setup and returns the exit status.
 int RunJob(const JobSetup& setup, ConversionLog& log, const JobOptions& options = {});

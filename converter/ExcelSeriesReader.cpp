@@ -305,10 +305,14 @@ bool ExcelSeriesReader::NextSheetRow(SheetRow& sheetRow)
 
 bool ExcelSeriesReader::Next(Row& row)
 {
-    if (NextRow(row))
-        return true;
-    NoteFormulaCells();
-    return false;
+    while (!NextRow(row)) {
+        if (!m_valuesFailed || !PassOverFault()) {
+            NoteFormulaCells();
+            return false;
+        }
+        m_valuesFailed = false;
+    }
+    return true;
 }
 
 bool ExcelSeriesReader::NextRow(Row& row)
@@ -343,8 +347,10 @@ bool ExcelSeriesReader::NextRow(Row& row)
     case StampRead::Failed:
         return false;
     }
-    if (!ReadValues(sheetRow, row))
+    if (!ReadValues(sheetRow, row)) {
+        m_valuesFailed = true;
         return false;
+    }
     ++m_rowsRead;
     return true;
 }

@@ -74,6 +74,7 @@ private:
     long m_rowNumber = 0; // the sheet row last read
     std::uint64_t m_rowsRead = 0;
     bool m_dataEnded = false;
+    bool m_valuesFailed = false; // the last row's values did not read
     std::vector<std::string> m_formulaCells; // the first few, by address
     std::uint64_t m_formulaCellCount = 0;
     bool m_formulaNoted = false;

@@ -33,7 +33,29 @@ public:
     const std::vector<size_t>& Selection() const { return m_selection; }
     const sys::Status& status() const { return m_status; }
 
+    // Lets Next pass over a data row that does not read (a value that is no number, a line of
+    // another shape) instead of stopping there: the row's problem is kept in Rejected() and the
+    // reading goes on. Dry runs report every such row of a file; a conversion keeps this off.
+    void PassOverFaultyRows(bool on) { m_passOverFaults = on; }
+    // The rows passed over, the first kKeptRejections of them; RejectedCount() counts all.
+    const std::vector<sys::Problem>& Rejected() const { return m_rejected; }
+    std::uint64_t RejectedCount() const { return m_rejectedCount; }
+    static constexpr size_t kKeptRejections = 1000;
+
 protected:
+    // After a data row failed with m_status: true, with the problem kept and the status cleared,
+    // when rows that do not read are passed over.
+    bool PassOverFault()
+    {
+        if (!m_passOverFaults || m_status.ok())
+            return false;
+        if (m_rejected.size() < kKeptRejections)
+            m_rejected.push_back(m_status.problem());
+        ++m_rejectedCount;
+        m_status = sys::Status::Ok();
+        return true;
+    }
+
     bool Fail(const std::string& file, long line, const std::string& message, int column = 0)
     {
         m_status = sys::Status::Fail(file, line, message, column);
@@ -44,6 +66,11 @@ protected:
     std::vector<size_t> m_selection;
     sys::Status m_status;
     std::vector<std::string> m_notes;
+
+private:
+    bool m_passOverFaults = false;
+    std::vector<sys::Problem> m_rejected;
+    std::uint64_t m_rejectedCount = 0;
 };
 
 } // namespace converter

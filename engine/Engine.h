@@ -28,6 +28,8 @@ public:
     // Writes the setup into a temporary file under target "VELMORA", runs the engine program on
     // it, deletes the file; returns the program's result.
     int LaunchEngine();
+    // The same with `options` handed to the engine program after its flag ("--threads", "4").
+    int LaunchEngine(const std::vector<CString>& options);
     // The name of the temporary setup file: the setup name with blanks turned into underscores,
     // followed by ".wpx". What could make it more than one name inside the temporary folder is
     // made safe too: separators, control characters and leading dots become underscores, and a

@@ -47,7 +47,9 @@ int CEngine::RunTool(int silent)
     return result;
 }
 
-int CEngine::LaunchEngine()
+int CEngine::LaunchEngine() { return LaunchEngine({}); }
+
+int CEngine::LaunchEngine(const std::vector<CString>& options)
 {
     WPXHANDLE document = wpxCreate();
     wpxAddTarget(document, "VELMORA");
@@ -62,5 +64,5 @@ int CEngine::LaunchEngine()
         std::fprintf(stderr, "Velmora: %s\n", text::EscapeControls(file.status().problem().message).c_str());
         return kNoSetupFile;
     }
-    return RunEngine(kEngineProgram, file.Path(), 1);
+    return RunEngine(kEngineProgram, file.Path(), 1, options);
 }

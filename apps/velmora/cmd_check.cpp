@@ -1,10 +1,12 @@
-// velmora check DOC: holds the setup stored in a parameter document against the real files, the way
-// the wizard does before it lets the user go on, and prints one verdict per check.
+// velmora check DOC [--all] [--json]: holds the setup stored in a parameter document against the real
+// files, the way the wizard does before it lets the user go on, and prints one verdict per check;
+// with --all it also reads every input file as a run would (a dry run) and reports on each.
+#include "apps/velmora/CommandLineSetup.h"
 #include "apps/velmora/Commands.h"
 #include "converter/ConversionJob.h"
+#include "converter/DryRun.h"
 #include "converter/RunPlan.h"
 #include "engine/Engine.h"
-#include "platform/bridge/BridgeVerdict.h"
 #include "platform/system/FileFormat.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
@@ -27,7 +29,7 @@ CString Quoted(const CString& path) { return "\"" + path + "\""; }
 void PrintHelp()
 {
     std::printf(
-        "Usage: velmora check DOC\n\n"
+        "Usage: velmora check DOC [--all] [--json]\n\n"
         "Runs the checks the setup wizard runs on the setup stored in parameter document DOC and prints\n"
         "one line per check, \"PASS <check>: <message>\" or \"FAIL <check>: <message>\":\n"
         "  input     the input file exists and has an extension its format accepts, or the input\n"
@@ -41,7 +43,15 @@ void PrintHelp()
         "            inputs, or anything but a regular file, and this user may write it (the log too\n"
         "            must not be a file the run reads)\n"
         "Checks that depend on a failed one are reported as failed too.\n\n"
-        "Exit status: 0 when every check passes, 1 when one fails or DOC holds no setup, 2 for bad usage.\n");
+        "--all     then reads every input file of the setup with its template, as a run would, and writes\n"
+        "          nothing: per file a line \"ok FILE: ROWS rows, FIRST to LAST\" (or FAIL, SKIP with the\n"
+        "          reason) and below it each row that does not read (FILE:LINE:COLUMN: rejected: why),\n"
+        "          the missing steps of an equidistant series, stamps that repeat or go back, and values\n"
+        "          of Accumulated items that decrease; then a summary line \"dry run: ...\".\n"
+        "--json    one JSON object {\"checks\": [{\"name\", \"passed\", \"message\"}], and with --all\n"
+        "          \"files\" and \"summary\"}.\n\n"
+        "Exit status: 0 when every check passes (and with --all every file would convert), 1 when one\n"
+        "fails, a file would not convert or DOC holds no setup, 2 for bad usage.\n");
 }
 
 // Reads the setup of a host document (target, "Setup", sections) or of an engine file (target,
@@ -91,15 +101,6 @@ void BindPreviewFile(CEngine& engine)
         engine.SetPreviewFile(first);
 }
 
-CString BridgeReason(const CEngine& engine, const CString& templatePath)
-{
-    CString bridgeName;
-    CEngine::GetBridgeName(engine.m_nInputFormat, bridgeName);
-    const bridge::Verdict verdict =
-        bridge::Judge({bridgeName, "TemplateFilePath=" + templatePath, engine.m_strInputFile, false});
-    return verdict.reason.empty() ? CString("the bridge component rejects the file") : verdict.reason;
-}
-
 CheckResult CheckTemplate(CEngine& engine)
 {
     const int option = engine.m_nTemplateOption;
@@ -118,7 +119,7 @@ CheckResult CheckTemplate(CEngine& engine)
     if (!message.empty())
         return {"template", false, message + " (" + Quoted(templatePath) + ")"};
     if (engine.m_nInputType == 1)
-        message = BridgeReason(engine, templatePath);
+        message = host::BridgeRefusal(engine, templatePath);
     return {"template", false, message};
 }
 
@@ -222,20 +223,71 @@ std::vector<CheckResult> RunChecks(CEngine& engine, const std::string& document)
     return results;
 }
 
+std::string ChecksJson(const std::vector<CheckResult>& results)
+{
+    std::string out = "\"checks\":[";
+    for (size_t i = 0; i < results.size(); ++i) {
+        out += i ? ",{\"name\":" : "{\"name\":";
+        text::AppendJsonString(out, results[i].name);
+        out += results[i].passed ? ",\"passed\":true,\"message\":" : ",\"passed\":false,\"message\":";
+        text::AppendJsonString(out, results[i].message);
+        out += "}";
+    }
+    return out + "]";
+}
+
+// The dry run of --all: every input file read as the engine program would read it.
+int DryRun(const CEngine& engine, const std::string& document, bool json, std::string& jsonOut)
+{
+    std::vector<converter::FileCheck> files;
+    std::string setupError;
+    if (!converter::CheckJobFiles(JobSetupOf(engine, document), 0, 0, 0, files, setupError)) {
+        if (json) {
+            jsonOut += ",\"setupError\":";
+            text::AppendJsonString(jsonOut, setupError);
+        } else {
+            std::printf("dry run: the setup cannot run: %s\n", text::EscapeControls(setupError).c_str());
+        }
+        return host::kFailed;
+    }
+    if (json) {
+        const std::string report = converter::ChecksJson(files);
+        jsonOut += "," + report.substr(1, report.rfind('}') - 1);
+    } else {
+        for (const converter::FileCheck& file : files)
+            std::fputs(converter::DescribeCheck(file).c_str(), stdout);
+        std::fputs(converter::DescribeChecks(files).c_str(), stdout);
+    }
+    return converter::DryRunStatus(files, false) == converter::kExitOk ? host::kSuccess : host::kFailed;
+}
+
 int Check(int argc, char** argv)
 {
     if (host::WantsHelp(argc, argv)) {
         PrintHelp();
         return host::kSuccess;
     }
-    if (argc != 2)
-        return host::UsageError("check", argc < 2 ? "no parameter document given" : "more than one argument");
-    if (argv[1][0] == '-')
-        return host::UsageError("check", std::string("unknown option ") + argv[1]);
+    const char* path = nullptr;
+    bool all = false, json = false;
+    for (int i = 1; i < argc; ++i) {
+        const std::string arg = argv[i];
+        if (arg == "--all")
+            all = true;
+        else if (arg == "--json")
+            json = true;
+        else if (arg[0] == '-')
+            return host::UsageError("check", "unknown option " + arg);
+        else if (path)
+            return host::UsageError("check", "more than one parameter document given");
+        else
+            path = argv[i];
+    }
+    if (!path)
+        return host::UsageError("check", "no parameter document given");
 
     WPXHANDLE document = nullptr;
     CString error;
-    if (!wpxRead(argv[1], &document, &error)) {
+    if (!wpxRead(path, &document, &error)) {
         std::fprintf(stderr, "velmora check: %s\n", text::EscapeControls(error).c_str());
         return host::kFailed;
     }
@@ -246,19 +298,26 @@ int Check(int argc, char** argv)
         std::fprintf(stderr,
                      "velmora check: %s: no setup; expected a target holding a section \"Setup\" or the sections "
                      "INPUT, TEMPLATE and OUTPUT\n",
-                     text::EscapeControls(argv[1]).c_str());
+                     text::EscapeControls(path).c_str());
         return host::kFailed;
     }
     bool allPassed = true;
-    for (const CheckResult& result : RunChecks(engine, argv[1])) {
-        // Names from the setup and the files are shown escaped: one line a check, whatever they hold.
-        std::printf("%s %s: %s\n", result.passed ? "PASS" : "FAIL", result.name,
-                    text::EscapeControls(result.message).c_str());
+    const std::vector<CheckResult> results = RunChecks(engine, path);
+    for (const CheckResult& result : results) {
         allPassed = allPassed && result.passed;
+        // Names from the setup and the files are shown escaped: one line a check, whatever they hold.
+        if (!json)
+            std::printf("%s %s: %s\n", result.passed ? "PASS" : "FAIL", result.name,
+                        text::EscapeControls(result.message).c_str());
     }
+    std::string jsonOut = "{" + ChecksJson(results);
+    if (all && DryRun(engine, path, json, jsonOut) != host::kSuccess)
+        allPassed = false;
+    if (json)
+        std::printf("%s}\n", jsonOut.c_str());
     return allPassed ? host::kSuccess : host::kFailed;
 }
 
 } // namespace
 
-VELMORA_REGISTER_COMMAND("check", "check a stored setup against its files, as the wizard would", Check)
+VELMORA_REGISTER_COMMAND("check", "check a stored setup against its files, as the wizard would; --all reads every file (a dry run)", Check)

@@ -1,6 +1,7 @@
-// velmora template show FILE [--json] | new --format ascii|excel OUT: looks into template files and
-// writes new ones with the defaults.
+// velmora template show FILE [--json] | new --format ascii|excel OUT | guess FILE ...: looks into
+// template files, writes new ones with the defaults, and proposes one for a data file.
 #include "apps/velmora/Commands.h"
+#include "apps/velmora/TemplateGuessCommand.h"
 #include "templates/TemplateFileLayout.h"
 #include "templates/TemplateReport.h"
 
@@ -15,13 +16,15 @@ namespace {
 void PrintHelp()
 {
     std::printf("Usage: velmora template show FILE [--json]\n"
-                "       velmora template new --format ascii|excel OUT\n\n"
+                "       velmora template new --format ascii|excel OUT\n"
+                "       velmora template guess FILE [--format ascii|excel] [-o T.xml] [--explain] [--json]\n\n"
                 "show  loads template FILE as the kind its root element names (ASCII or Excel) and prints\n"
                 "      every value by its file key, then the item definitions. With --json the same as\n"
                 "      one JSON object {\"kind\", \"values\", \"items\"}.\n"
-                "new   writes a template of the given kind holding the defaults to OUT (UTF-16).\n\n"
-                "Exit status: 0 on success, 1 when FILE cannot be loaded or OUT cannot be written,\n"
-                "2 for bad usage.\n");
+                "new   writes a template of the given kind holding the defaults to OUT (UTF-16).\n");
+    host::PrintTemplateGuessHelp();
+    std::printf("\nExit status: 0 on success, 1 when FILE cannot be loaded (or guessed) or OUT cannot be\n"
+                "written, 2 for bad usage.\n");
 }
 
 int Show(const std::vector<std::string>& args)
@@ -93,16 +96,18 @@ int Template(int argc, char** argv)
         return host::kSuccess;
     }
     if (argc < 2)
-        return host::UsageError("template", "missing sub-command: show or new");
+        return host::UsageError("template", "missing sub-command: show, new or guess");
     std::vector<std::string> args(argv + 2, argv + argc);
     if (std::strcmp(argv[1], "show") == 0)
         return Show(args);
     if (std::strcmp(argv[1], "new") == 0)
         return New(args);
-    return host::UsageError("template", std::string("unknown sub-command '") + argv[1] + "'; use show or new");
+    if (std::strcmp(argv[1], "guess") == 0)
+        return host::RunTemplateGuess(args);
+    return host::UsageError("template", std::string("unknown sub-command '") + argv[1] + "'; use show, new or guess");
 }
 
 } // namespace
 
-VELMORA_REGISTER_COMMAND("template", "show a template file's values, or write a new template with the defaults",
+VELMORA_REGISTER_COMMAND("template", "show a template file's values, write a new one, or guess one from a data file",
                          Template)

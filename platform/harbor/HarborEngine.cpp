@@ -129,18 +129,27 @@ CString CHarborEngine::FindEngineProgram(const CString& program)
 
 int CHarborEngine::RunEngine(CString program, CString setupFile, int flag)
 {
+    return RunEngine(std::move(program), std::move(setupFile), flag, {});
+}
+
+int CHarborEngine::RunEngine(CString program, CString setupFile, int flag, const std::vector<CString>& options)
+{
     CString path = FindEngineProgram(program);
     if (path.empty())
         return kProgramNotFound;
     CString flagText = std::to_string(flag);
-    char* argv[] = {path.data(), setupFile.data(), flagText.data(), nullptr};
+    std::vector<CString> texts = options;
+    std::vector<char*> argv = {path.data(), setupFile.data(), flagText.data()};
+    for (CString& option : texts)
+        argv.push_back(option.data());
+    argv.push_back(nullptr);
     const pid_t host = ::getpid();
     sigset_t all, hostMask;
     sigfillset(&all);
     ::pthread_sigmask(SIG_SETMASK, &all, &hostMask);
     const pid_t child = ::fork();
     if (child == 0)
-        ExecEngine(path.c_str(), argv, host, hostMask);
+        ExecEngine(path.c_str(), argv.data(), host, hostMask);
     ::pthread_sigmask(SIG_SETMASK, &hostMask, nullptr);
     if (child < 0)
         return kCannotStart;

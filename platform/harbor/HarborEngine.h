@@ -4,6 +4,8 @@
 // starting the tool's engine program and judging a file name.
 #include "platform/system/Types.h"
 
+#include <vector>
+
 class COkaFileSelectorDlg; // the rbx0 file selector; tools may narrow what it offers
 
 class CHarborEngine {
@@ -35,6 +37,8 @@ public:
     // Returns its exit status: 0 on success, nonzero when it failed, could not be started or was
     // killed by a signal. Where the program is looked for is described in docs/harbor.md.
     static int RunEngine(CString program, CString setupFile, int flag);
+    // The same with `options` after the flag (the engine program's own options, such as "--threads").
+    static int RunEngine(CString program, CString setupFile, int flag, const std::vector<CString>& options);
     // Nonzero when `name` can name a file to create or read (rule in docs/harbor.md).
     static int IsValidFileName(CString name);
 

@@ -42,6 +42,8 @@ public:
 
     // What the sheet displays for `cell`, for one read without its text.
     std::string DisplayedText(const RowCell& cell) const { return m_styles.Format(cell.style).Render(cell.value); }
+    // True when the cell's number format shows numbers as dates or times.
+    bool ShowsDateTime(const RowCell& cell) const { return m_styles.Format(cell.style).IsDateTime(); }
 
     // How the last Open or ReadRows ended.
     const sys::Status& status() const { return m_status; }
