@@ -1,6 +1,6 @@
 #include "converter/AsciiSeriesReader.h"
 
-#include "parsers/HeaderCells.h"
+#include "templates/HeaderCells.h"
 #include "platform/system/Text.h"
 #include "platform/units/Units.h"
 #include "resources/StringTable.h"

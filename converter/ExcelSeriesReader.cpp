@@ -1,8 +1,8 @@
 #include "converter/ExcelSeriesReader.h"
 
-#include "parsers/HeaderCells.h"
-#include "platform/spreadsheet/CellAddress.h"
-#include "platform/spreadsheet/WorkbookReader.h"
+#include "templates/HeaderCells.h"
+#include "formats/workbook/CellAddress.h"
+#include "formats/workbook/WorkbookReader.h"
 #include "platform/system/Text.h"
 #include "resources/StringTable.h"
 #include "templates/Specification.h"

@@ -2,7 +2,7 @@
 
 #include "converter/SheetLayout.h"
 #include "converter/StampText.h"
-#include "platform/spreadsheet/LittleEndian.h"
+#include "formats/workbook/LittleEndian.h"
 #include "platform/system/Text.h"
 
 #include <cmath>

@@ -3,7 +3,7 @@
 #include "converter/NumberText.h"
 #include "converter/SheetLayout.h"
 #include "converter/StampText.h"
-#include "converter/XlsxParts.h"
+#include "formats/xlsx/XlsxParts.h"
 
 #include <algorithm>
 #include <charconv>
@@ -92,9 +92,9 @@ sys::Status XlsxSeriesWriter::WritePackageParts(const HeaderCells& cells, const 
         {"_rels/.rels", xlsx::PackageRelationships()},
         {"docProps/core.xml", xlsx::CoreProperties(title)},
         {"docProps/app.xml", xlsx::AppProperties()},
-        {"xl/workbook.xml", xlsx::Workbook()},
+        {"xl/workbook.xml", xlsx::Workbook(sheet_layout::kSheetName)},
         {"xl/_rels/workbook.xml.rels", xlsx::WorkbookRelationships()},
-        {"xl/styles.xml", xlsx::Styles()},
+        {"xl/styles.xml", xlsx::Styles(sheet_layout::kStampFormat)},
         {"xl/sharedStrings.xml", xlsx::SharedStrings(cells.strings, cells.references)},
     };
     for (const auto& [name, text] : parts)

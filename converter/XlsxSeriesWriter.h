@@ -3,7 +3,7 @@
 // shared strings. The sheet's XML is built in a buffer and deflated into the package as the buffer
 // fills, so memory stays the same whatever the row count.
 #include "converter/SeriesWriter.h"
-#include "converter/ZipWriter.h"
+#include "formats/xlsx/ZipWriter.h"
 
 #include <string>
 #include <vector>

@@ -1,7 +1,7 @@
 #include "parsers/AsciiFilePreviewParser.h"
 
 #include "parsers/FieldCursor.h"
-#include "parsers/HeaderCells.h"
+#include "templates/HeaderCells.h"
 #include "parsers/FileException.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"

@@ -1,6 +1,6 @@
 #include "parsers/ExcelFilePreviewParser.h"
 
-#include "parsers/HeaderCells.h"
+#include "templates/HeaderCells.h"
 #include "platform/system/DateFormat.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"

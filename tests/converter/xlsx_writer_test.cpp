@@ -6,7 +6,7 @@
 #include "converter/ConversionJob.h"
 #include "converter/Converter.h"
 #include "converter/StampText.h"
-#include "converter/XlsxParts.h"
+#include "formats/xlsx/XlsxParts.h"
 #include "converter/XlsxSeriesWriter.h"
 #include "platform/spreadsheet/Spreadsheet.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"

@@ -2,8 +2,8 @@
 // checked by unpacking with zlib and by Python's zipfile; write failures with their cause.
 #include "TestFiles.h"
 #include "ZipContents.h"
-#include "converter/ZipWriter.h"
-#include "platform/rbx/Crc32.h"
+#include "formats/xlsx/ZipWriter.h"
+#include "checksums/Crc32.h"
 
 #include <gtest/gtest.h>
 
@@ -157,7 +157,7 @@ TEST(ZipWriter, ChecksumIsZlibsOnEveryLengthAndAlignment)
     for (size_t offset : {0, 1, 3, 7})
         for (size_t length : {0, 1, 15, 16, 63, 64, 65, 127, 128, 1000, 65537, 99990}) {
             const auto* data = reinterpret_cast<const Bytef*>(bytes.data() + offset);
-            EXPECT_EQ(rbx::Crc32(0, data, length), crc32(0, data, static_cast<uInt>(length)))
+            EXPECT_EQ(checksum::Crc32(0, data, length), crc32(0, data, static_cast<uInt>(length)))
                 << "offset " << offset << " length " << length;
         }
 }

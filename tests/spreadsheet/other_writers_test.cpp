@@ -4,10 +4,10 @@
 #include "TestWorkbooks.h"
 #include "tests/tools/PythonTools.h"
 
-#include "converter/CompoundFileWriter.h"
-#include "platform/spreadsheet/LittleEndian.h"
+#include "formats/xls/CompoundFileWriter.h"
+#include "formats/workbook/LittleEndian.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
-#include "platform/spreadsheet/WorkbookReader.h"
+#include "formats/workbook/WorkbookReader.h"
 
 #include <gtest/gtest.h>
 

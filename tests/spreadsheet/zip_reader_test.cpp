@@ -2,8 +2,8 @@
 // every kind of damage to the packed data or the directory is caught by name.
 #include "TestWorkbooks.h"
 
-#include "converter/ZipWriter.h"
-#include "platform/spreadsheet/ZipReader.h"
+#include "formats/xlsx/ZipWriter.h"
+#include "formats/xlsx/ZipReader.h"
 
 #include <gtest/gtest.h>
 
