@@ -5,8 +5,8 @@
 // size after each benchmark (it only grows, so run one benchmark per process to read it alone:
 // --benchmark_filter=...).
 #include "formats/workbook/NumberFormat.h"
-#include "platform/spreadsheet/SpreadsheetApplication.h"
 #include "formats/workbook/WorkbookReader.h"
+#include "platform/spreadsheet/SpreadsheetApplication.h"
 
 #include <benchmark/benchmark.h>
 #include <xlsxwriter.h>

@@ -2,8 +2,8 @@
 // stored records. The first byte: bit 0 repairs the checksums (so mutations reach the header and
 // data checks), bits 1-7 pick the items to select (none: every item; else out of order, repeated
 // and past the last item).
-#include "converter/RbxSeriesReader.h"
 #include "checksums/Crc32.h"
+#include "converter/RbxSeriesReader.h"
 #include "platform/rbx/RbxHeaderCodec.h"
 
 #include <cstdint>

@@ -3,8 +3,8 @@
 // file's content. A failure is a Status whose message reads as automation words it ("Cannot open
 // <path>: <why>"). Inside, the two readers give up by throwing OpenError's AutomationError, which
 // ImportWorkbook turns into the Status; it never leaves the reading.
-#include "formats/workbook/NumberFormat.h"
 #include "formats/workbook/CellValue.h"
+#include "formats/workbook/NumberFormat.h"
 #include "platform/system/Status.h"
 
 #include <cstdint>

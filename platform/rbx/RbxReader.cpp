@@ -3,8 +3,8 @@
 #include "checksums/Crc32.h"
 #include "platform/rbx/RbxBytes.h"
 #include "platform/rbx/RbxHeaderCodec.h"
-#include "platform/system/Text.h"
 #include "platform/system/FileSystem.h"
+#include "platform/system/Text.h"
 
 #include <algorithm>
 #include <cerrno>

@@ -4,12 +4,12 @@
 #include "TestFiles.h"
 #include "tests/tools/PythonTools.h"
 
+#include "checksums/Crc32.h"
 #include "converter/Converter.h"
 #include "converter/StampText.h"
 #include "converter/XlsSeriesWriter.h"
-#include "checksums/Crc32.h"
-#include "formats/xls/CompoundFile.h"
 #include "formats/workbook/WorkbookReader.h"
+#include "formats/xls/CompoundFile.h"
 #include "templates/Specification.h"
 
 #include <gtest/gtest.h>

@@ -2,8 +2,8 @@
 #include "RbxTestFiles.h"
 
 #include "checksums/Crc32.h"
-#include "platform/rbx/RbxBytes.h"
 #include "platform/rbx/Rbx.h"
+#include "platform/rbx/RbxBytes.h"
 #include "platform/rbx/RbxHeaderCodec.h"
 #include "platform/rbx/RbxReader.h"
 

@@ -4,10 +4,10 @@
 #include "TestWorkbooks.h"
 #include "tests/tools/PythonTools.h"
 
-#include "formats/xls/CompoundFileWriter.h"
 #include "formats/workbook/LittleEndian.h"
-#include "platform/spreadsheet/SpreadsheetApplication.h"
 #include "formats/workbook/WorkbookReader.h"
+#include "formats/xls/CompoundFileWriter.h"
+#include "platform/spreadsheet/SpreadsheetApplication.h"
 
 #include <gtest/gtest.h>
 

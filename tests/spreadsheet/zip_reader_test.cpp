@@ -2,8 +2,8 @@
 // every kind of damage to the packed data or the directory is caught by name.
 #include "TestWorkbooks.h"
 
-#include "formats/xlsx/ZipWriter.h"
 #include "formats/xlsx/ZipReader.h"
+#include "formats/xlsx/ZipWriter.h"
 
 #include <gtest/gtest.h>
 

@@ -1,9 +1,9 @@
 // The zip package writer: entries whole and streamed, the rewritable head of a streamed entry,
 // checked by unpacking with zlib and by Python's zipfile; write failures with their cause.
-#include "TestFiles.h"
-#include "ZipContents.h"
-#include "formats/xlsx/ZipWriter.h"
 #include "checksums/Crc32.h"
+#include "formats/xlsx/ZipWriter.h"
+#include "tests/converter/TestFiles.h"
+#include "tests/converter/ZipContents.h"
 
 #include <gtest/gtest.h>
 
