@@ -27,7 +27,7 @@ private:
     sys::Status WriteHeaderRows(const SeriesHeader& header);
     sys::Status Flush(bool always);
 
-    CompoundFileWriter m_file;
+    sheet::CompoundFileWriter m_file;
     std::string m_path;
     std::string m_title;
     std::string m_records;             // records not yet handed to the file

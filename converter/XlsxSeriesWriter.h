@@ -28,7 +28,7 @@ private:
     sys::Status FlushSheet();
     std::string LastCell() const;
 
-    ZipWriter m_zip;
+    sheet::ZipWriter m_zip;
     std::string m_path;
     // "<c r=\"B" per column from A, in fixed-size slots so copying one needs no length.
     struct CellOpening {

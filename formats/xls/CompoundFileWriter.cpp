@@ -5,7 +5,7 @@
 #include <algorithm>
 #include <cctype>
 
-namespace converter {
+namespace sheet {
 
 namespace {
 
@@ -265,4 +265,4 @@ sys::Status CompoundFileWriter::WriteHeader(const Layout& layout)
     return m_file.WriteAt(0, header, sizeof header);
 }
 
-} // namespace converter
+} // namespace sheet

@@ -13,7 +13,7 @@
 #include <string_view>
 #include <vector>
 
-namespace converter {
+namespace sheet {
 
 class CompoundFileWriter {
 public:
@@ -54,7 +54,7 @@ private:
     sys::Status WriteDifat(const Layout& layout);
     sys::Status WriteHeader(const Layout& layout);
 
-    BufferedFile m_file;
+    sys::BufferedFile m_file;
 };
 
-} // namespace converter
+} // namespace sheet

@@ -4,7 +4,7 @@
 
 #include <ctime>
 
-namespace converter::xlsx {
+namespace sheet::package {
 
 namespace {
 
@@ -196,4 +196,4 @@ std::string SheetTail()
            "</worksheet>";
 }
 
-} // namespace converter::xlsx
+} // namespace sheet::package

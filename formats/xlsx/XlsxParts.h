@@ -4,7 +4,7 @@
 #include <string_view>
 #include <vector>
 
-namespace converter::xlsx {
+namespace sheet::package {
 
 // `text` as XML character data, safe inside elements and quoted attributes. Text that is not UTF-8
 // is read as Windows-1252 (text::ToUtf8); control characters XML 1.0 cannot carry become blanks.
@@ -31,4 +31,4 @@ std::string SharedStrings(const std::vector<std::string>& strings, size_t refere
 std::string SheetHead(const std::string& lastCell);
 std::string SheetTail();
 
-} // namespace converter::xlsx
+} // namespace sheet::package

@@ -9,7 +9,7 @@
 #include <cstring>
 #include <ctime>
 
-namespace converter {
+namespace sheet {
 
 namespace {
 
@@ -258,4 +258,4 @@ sys::Status ZipWriter::Close()
     return Failed(m_file.Close());
 }
 
-} // namespace converter
+} // namespace sheet

@@ -16,7 +16,7 @@
 
 typedef struct z_stream_s z_stream;
 
-namespace converter {
+namespace sheet {
 
 class ZipWriter {
 public:
@@ -65,7 +65,7 @@ private:
     sys::Status Failed(sys::Status status);
     sys::Status Fail(const std::string& message);
 
-    BufferedFile m_file;
+    sys::BufferedFile m_file;
     std::unique_ptr<z_stream> m_zip;
     bool m_zipReady = false;
     std::vector<Entry> m_entries;
@@ -79,4 +79,4 @@ private:
     bool m_failed = false;
 };
 
-} // namespace converter
+} // namespace sheet

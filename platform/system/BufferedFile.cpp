@@ -6,7 +6,7 @@
 #include <fcntl.h>
 #include <unistd.h>
 
-namespace converter {
+namespace sys {
 
 BufferedFile::BufferedFile(size_t bufferBytes) : m_buffer(std::max<size_t>(bufferBytes, 1)) {}
 
@@ -118,4 +118,4 @@ sys::Status BufferedFile::Close()
     return flushed;
 }
 
-} // namespace converter
+} // namespace sys

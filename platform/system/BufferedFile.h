@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-namespace converter {
+namespace sys {
 
 class BufferedFile {
 public:
@@ -49,4 +49,4 @@ private:
     std::uint64_t m_written = 0;
 };
 
-} // namespace converter
+} // namespace sys

@@ -38,7 +38,7 @@ std::string Noise(std::size_t size)
 std::string WrittenPackage(const std::string& small, const std::string& large)
 {
     const std::string path = sheettest::TempFile("written.zip");
-    converter::ZipWriter writer;
+    sheet::ZipWriter writer;
     EXPECT_TRUE(writer.Open(path).ok());
     EXPECT_TRUE(writer.AddEntry("small.xml", small).ok());
     EXPECT_TRUE(writer.BeginEntry("large.xml").ok());

@@ -11,7 +11,7 @@
 #include <filesystem>
 #include <random>
 
-using namespace converter;
+using namespace sheet;
 
 namespace {
 
