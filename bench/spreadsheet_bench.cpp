@@ -4,9 +4,9 @@
 // row reader; and rendering number formats. Memory is reported as the process's peak resident
 // size after each benchmark (it only grows, so run one benchmark per process to read it alone:
 // --benchmark_filter=...).
-#include "platform/spreadsheet/NumberFormat.h"
+#include "formats/workbook/NumberFormat.h"
+#include "formats/workbook/WorkbookReader.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
-#include "platform/spreadsheet/WorkbookReader.h"
 
 #include <benchmark/benchmark.h>
 #include <xlsxwriter.h>

@@ -4,10 +4,10 @@
 // the same sink. The unpacking and the XML reading are also measured apart: unpacking the sheet
 // part in 64 KiB chunks, and reading the unpacked sheet from memory in 64 KiB chunks.
 // Run: build/bin/xlsx_library_bench --benchmark_repetitions=5 --benchmark_report_aggregates_only=true
-#include "platform/spreadsheet/WorkbookImport.h"
-#include "platform/spreadsheet/XlsxPartReaders.h"
-#include "platform/spreadsheet/XmlScanner.h"
-#include "platform/spreadsheet/ZipReader.h"
+#include "formats/workbook/WorkbookImport.h"
+#include "formats/xlsx/XlsxPartReaders.h"
+#include "formats/xlsx/XmlScanner.h"
+#include "formats/xlsx/ZipReader.h"
 
 #include <benchmark/benchmark.h>
 #include <expat.h>

@@ -1,9 +1,9 @@
 #include "converter/AsciiSeriesReader.h"
 
-#include "parsers/HeaderCells.h"
 #include "platform/system/Text.h"
 #include "platform/units/Units.h"
 #include "resources/StringTable.h"
+#include "templates/HeaderCells.h"
 #include "templates/Specification.h"
 
 #include <algorithm>

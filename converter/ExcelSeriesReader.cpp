@@ -1,10 +1,10 @@
 #include "converter/ExcelSeriesReader.h"
 
-#include "parsers/HeaderCells.h"
-#include "platform/spreadsheet/CellAddress.h"
-#include "platform/spreadsheet/WorkbookReader.h"
+#include "formats/workbook/CellAddress.h"
+#include "formats/workbook/WorkbookReader.h"
 #include "platform/system/Text.h"
 #include "resources/StringTable.h"
+#include "templates/HeaderCells.h"
 #include "templates/Specification.h"
 
 #include <algorithm>

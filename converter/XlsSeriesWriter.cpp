@@ -2,7 +2,7 @@
 
 #include "converter/SheetLayout.h"
 #include "converter/StampText.h"
-#include "platform/spreadsheet/LittleEndian.h"
+#include "formats/workbook/LittleEndian.h"
 #include "platform/system/Text.h"
 
 #include <cmath>
@@ -372,7 +372,7 @@ sys::Status XlsSeriesWriter::Finish()
         return flushed;
     if (sys::Status dimensions = m_file.Patch(m_dimensionsAt, Dimensions(m_rows, m_columns)); !dimensions)
         return dimensions;
-    std::vector<CompoundFileWriter::Stream> others;
+    std::vector<sheet::CompoundFileWriter::Stream> others;
     if (!m_title.empty())
         others.push_back({"\x05SummaryInformation", SummaryInformation(m_title)});
     return m_file.Close("Workbook", others);

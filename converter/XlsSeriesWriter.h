@@ -7,8 +7,8 @@
 // The format holds 65,536 rows and 256 columns a sheet: more items fail at Begin, before anything
 // is written, more rows at the row that does not fit. A text cell holds at most 255 characters;
 // longer header texts are cut there.
-#include "converter/CompoundFileWriter.h"
 #include "converter/SeriesWriter.h"
+#include "formats/xls/CompoundFileWriter.h"
 
 #include <string>
 
@@ -27,7 +27,7 @@ private:
     sys::Status WriteHeaderRows(const SeriesHeader& header);
     sys::Status Flush(bool always);
 
-    CompoundFileWriter m_file;
+    sheet::CompoundFileWriter m_file;
     std::string m_path;
     std::string m_title;
     std::string m_records;             // records not yet handed to the file

@@ -3,7 +3,7 @@
 #include "converter/NumberText.h"
 #include "converter/SheetLayout.h"
 #include "converter/StampText.h"
-#include "converter/XlsxParts.h"
+#include "formats/xlsx/XlsxParts.h"
 
 #include <algorithm>
 #include <charconv>
@@ -73,7 +73,7 @@ sys::Status XlsxSeriesWriter::Begin(const std::string& path, const SeriesHeader&
     m_sheet.resize(kSheetBufferBytes);
     m_cellOpenings.clear();
     for (unsigned column = 1; column <= header.items.size() + 1; ++column) {
-        const std::string opening = "<c r=\"" + xlsx::ColumnName(column);
+        const std::string opening = "<c r=\"" + sheet::package::ColumnName(column);
         CellOpening slot{};
         std::memcpy(slot.text, opening.data(), opening.size());
         slot.length = opening.size();
@@ -88,20 +88,20 @@ sys::Status XlsxSeriesWriter::Begin(const std::string& path, const SeriesHeader&
 sys::Status XlsxSeriesWriter::WritePackageParts(const HeaderCells& cells, const std::string& title)
 {
     const std::pair<const char*, std::string> parts[] = {
-        {"[Content_Types].xml", xlsx::ContentTypes()},
-        {"_rels/.rels", xlsx::PackageRelationships()},
-        {"docProps/core.xml", xlsx::CoreProperties(title)},
-        {"docProps/app.xml", xlsx::AppProperties()},
-        {"xl/workbook.xml", xlsx::Workbook()},
-        {"xl/_rels/workbook.xml.rels", xlsx::WorkbookRelationships()},
-        {"xl/styles.xml", xlsx::Styles()},
-        {"xl/sharedStrings.xml", xlsx::SharedStrings(cells.strings, cells.references)},
+        {"[Content_Types].xml", sheet::package::ContentTypes()},
+        {"_rels/.rels", sheet::package::PackageRelationships()},
+        {"docProps/core.xml", sheet::package::CoreProperties(title)},
+        {"docProps/app.xml", sheet::package::AppProperties()},
+        {"xl/workbook.xml", sheet::package::Workbook(sheet_layout::kSheetName)},
+        {"xl/_rels/workbook.xml.rels", sheet::package::WorkbookRelationships()},
+        {"xl/styles.xml", sheet::package::Styles(sheet_layout::kStampFormat)},
+        {"xl/sharedStrings.xml", sheet::package::SharedStrings(cells.strings, cells.references)},
     };
     for (const auto& [name, text] : parts)
         if (sys::Status added = m_zip.AddEntry(name, text); !added)
             return added;
     // The used range is not known before the last row: a placeholder of the same length for now.
-    return m_zip.BeginEntry("xl/worksheets/sheet1.xml", xlsx::SheetHead(LastCell()));
+    return m_zip.BeginEntry("xl/worksheets/sheet1.xml", sheet::package::SheetHead(LastCell()));
 }
 
 sys::Status XlsxSeriesWriter::WriteHeaderRows(const HeaderCells& cells)
@@ -198,16 +198,16 @@ sys::Status XlsxSeriesWriter::Write(const Row& row)
 
 std::string XlsxSeriesWriter::LastCell() const
 {
-    return xlsx::ColumnName(static_cast<unsigned>(m_cellOpenings.size())) + std::to_string(m_row);
+    return sheet::package::ColumnName(static_cast<unsigned>(m_cellOpenings.size())) + std::to_string(m_row);
 }
 
 sys::Status XlsxSeriesWriter::Finish()
 {
     if (sys::Status flushed = FlushSheet(); !flushed)
         return flushed;
-    if (sys::Status tail = m_zip.Append(xlsx::SheetTail()); !tail)
+    if (sys::Status tail = m_zip.Append(sheet::package::SheetTail()); !tail)
         return tail;
-    if (sys::Status ended = m_zip.EndEntry(xlsx::SheetHead(LastCell())); !ended)
+    if (sys::Status ended = m_zip.EndEntry(sheet::package::SheetHead(LastCell())); !ended)
         return ended;
     return m_zip.Close();
 }

@@ -3,7 +3,7 @@
 // shared strings. The sheet's XML is built in a buffer and deflated into the package as the buffer
 // fills, so memory stays the same whatever the row count.
 #include "converter/SeriesWriter.h"
-#include "converter/ZipWriter.h"
+#include "formats/xlsx/ZipWriter.h"
 
 #include <string>
 #include <vector>
@@ -28,7 +28,7 @@ private:
     sys::Status FlushSheet();
     std::string LastCell() const;
 
-    ZipWriter m_zip;
+    sheet::ZipWriter m_zip;
     std::string m_path;
     // "<c r=\"B" per column from A, in fixed-size slots so copying one needs no length.
     struct CellOpening {

@@ -1,6 +1,6 @@
 // Feeds arbitrary bytes to the rbx0 reader and the rbx calls. With the first byte odd, the checksums
 // are repaired first, so that mutations get past them into the header and data checks.
-#include "platform/rbx/Crc32.h"
+#include "checksums/Crc32.h"
 #include "platform/rbx/Rbx.h"
 #include "platform/rbx/RbxHeaderCodec.h"
 #include "platform/rbx/RbxReader.h"
@@ -22,10 +22,10 @@ void RepairChecksums(std::vector<unsigned char>& bytes)
     std::memcpy(&headerSize, bytes.data() + rbx::layout::kHeaderSize, 4);
     if (headerSize < rbx::kFixedHeaderSize || headerSize > bytes.size())
         return;
-    const std::uint32_t dataCrc = rbx::Crc32(0, bytes.data() + headerSize, bytes.size() - headerSize);
+    const std::uint32_t dataCrc = checksum::Crc32(0, bytes.data() + headerSize, bytes.size() - headerSize);
     std::memcpy(bytes.data() + rbx::layout::kDataChecksum, &dataCrc, 4);
     std::memset(bytes.data() + rbx::layout::kHeaderChecksum, 0, 4);
-    const std::uint32_t headerCrc = rbx::Crc32(0, bytes.data(), headerSize);
+    const std::uint32_t headerCrc = checksum::Crc32(0, bytes.data(), headerSize);
     std::memcpy(bytes.data() + rbx::layout::kHeaderChecksum, &headerCrc, 4);
 }
 

@@ -2,8 +2,8 @@
 // stored records. The first byte: bit 0 repairs the checksums (so mutations reach the header and
 // data checks), bits 1-7 pick the items to select (none: every item; else out of order, repeated
 // and past the last item).
+#include "checksums/Crc32.h"
 #include "converter/RbxSeriesReader.h"
-#include "platform/rbx/Crc32.h"
 #include "platform/rbx/RbxHeaderCodec.h"
 
 #include <cstdint>
@@ -23,10 +23,10 @@ void RepairChecksums(std::vector<unsigned char>& bytes)
     std::memcpy(&headerSize, bytes.data() + rbx::layout::kHeaderSize, 4);
     if (headerSize < rbx::kFixedHeaderSize || headerSize > bytes.size())
         return;
-    const std::uint32_t dataCrc = rbx::Crc32(0, bytes.data() + headerSize, bytes.size() - headerSize);
+    const std::uint32_t dataCrc = checksum::Crc32(0, bytes.data() + headerSize, bytes.size() - headerSize);
     std::memcpy(bytes.data() + rbx::layout::kDataChecksum, &dataCrc, 4);
     std::memset(bytes.data() + rbx::layout::kHeaderChecksum, 0, 4);
-    const std::uint32_t headerCrc = rbx::Crc32(0, bytes.data(), headerSize);
+    const std::uint32_t headerCrc = checksum::Crc32(0, bytes.data(), headerSize);
     std::memcpy(bytes.data() + rbx::layout::kHeaderChecksum, &headerCrc, 4);
 }
 

@@ -1,7 +1,7 @@
 // Feeds arbitrary bytes to the spreadsheet application as a workbook file and walks it the way
 // the Excel parser does (sheets, used range, the texts of the first 20 rows). With the first
 // byte 'F' the rest is a number format code instead, rendered over a few values.
-#include "platform/spreadsheet/NumberFormat.h"
+#include "formats/workbook/NumberFormat.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
 
 #include <cstdint>

@@ -1,7 +1,7 @@
 // Feeds arbitrary bytes to the .xlsx part readers without a zip around them. The first byte
 // picks the part (sheet, shared strings or styles) and how the source is cut into reads; the
 // sheet reader works against a small string table and a date style in the 1904 date system.
-#include "platform/spreadsheet/XlsxPartReaders.h"
+#include "formats/xlsx/XlsxPartReaders.h"
 
 #include <algorithm>
 #include <cstdint>

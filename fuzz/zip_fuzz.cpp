@@ -1,6 +1,6 @@
 // Feeds arbitrary bytes to the zip package reader as a file and unpacks every part it lists,
 // in odd-sized chunks, under small limits so hostile sizes are refused quickly.
-#include "platform/spreadsheet/ZipReader.h"
+#include "formats/xlsx/ZipReader.h"
 
 #include <cstdint>
 #include <cstdio>

@@ -1,7 +1,7 @@
 #include "guess/ItemGuess.h"
 
 #include "guess/CellKinds.h"
-#include "parsers/HeaderCells.h"
+#include "templates/HeaderCells.h"
 #include "platform/system/Text.h"
 #include "platform/units/Units.h"
 

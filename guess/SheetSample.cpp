@@ -1,6 +1,6 @@
 #include "guess/SheetSample.h"
 
-#include "platform/spreadsheet/WorkbookReader.h"
+#include "formats/workbook/WorkbookReader.h"
 
 namespace guess {
 namespace {

@@ -1,13 +1,13 @@
 #include "parsers/AsciiFilePreviewParser.h"
 
 #include "parsers/FieldCursor.h"
-#include "parsers/HeaderCells.h"
 #include "parsers/FileException.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
 #include "platform/system/TextLineReader.h"
 #include "platform/units/Units.h"
 #include "resources/StringTable.h"
+#include "templates/HeaderCells.h"
 #include "templates/Specification.h"
 
 #include <algorithm>

@@ -1,11 +1,11 @@
 #include "parsers/ExcelFilePreviewParser.h"
 
-#include "parsers/HeaderCells.h"
 #include "platform/system/DateFormat.h"
 #include "platform/system/FileSystem.h"
 #include "platform/system/Text.h"
 #include "platform/ui/UserInterface.h"
 #include "resources/StringTable.h"
+#include "templates/HeaderCells.h"
 
 #include <algorithm>
 

@@ -1,6 +1,6 @@
 #include "platform/rbx/RbxHeaderCodec.h"
 
-#include "platform/rbx/Crc32.h"
+#include "checksums/Crc32.h"
 #include "platform/rbx/RbxBytes.h"
 #include "platform/system/OleDateTime.h"
 #include "platform/system/Text.h"
@@ -31,10 +31,10 @@ CString GetFixedText(const unsigned char* data, std::size_t offset, std::size_t 
 // Over the whole header, its own field counted as zero bytes.
 std::uint32_t HeaderChecksum(const unsigned char* data, std::size_t size)
 {
-    std::uint32_t crc = Crc32(0, data, layout::kHeaderChecksum);
+    std::uint32_t crc = checksum::Crc32(0, data, layout::kHeaderChecksum);
     const unsigned char zero[4] = {0, 0, 0, 0};
-    crc = Crc32(crc, zero, 4);
-    return Crc32(crc, data + layout::kHeaderChecksum + 4, size - layout::kHeaderChecksum - 4);
+    crc = checksum::Crc32(crc, zero, 4);
+    return checksum::Crc32(crc, data + layout::kHeaderChecksum + 4, size - layout::kHeaderChecksum - 4);
 }
 
 bool DigitsAt(const CString& s, std::size_t pos, std::size_t count, int& value)

@@ -1,10 +1,10 @@
 #include "platform/rbx/RbxReader.h"
 
-#include "platform/rbx/Crc32.h"
+#include "checksums/Crc32.h"
 #include "platform/rbx/RbxBytes.h"
 #include "platform/rbx/RbxHeaderCodec.h"
-#include "platform/system/Text.h"
 #include "platform/system/FileSystem.h"
+#include "platform/system/Text.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -146,7 +146,7 @@ bool CRbxReader::VerifyDataChecksum()
         const std::size_t n = static_cast<std::size_t>(std::min<std::uint64_t>(left, chunk.size()));
         if (std::fread(chunk.data(), 1, n, s.file.get()) != n)
             return Fail("cannot read the data");
-        crc = Crc32(crc, chunk.data(), n);
+        crc = checksum::Crc32(crc, chunk.data(), n);
         left -= n;
     }
     if (crc != s.header.dataChecksum)
@@ -184,7 +184,7 @@ bool CRbxReader::ReadRecords(std::size_t count, unsigned char* records)
         return false;
     s.stepsRead += count;
     if (s.verifyAtEnd) {
-        s.crc = Crc32(s.crc, records, bytesWanted);
+        s.crc = checksum::Crc32(s.crc, records, bytesWanted);
         if (s.stepsRead == s.header.axis.steps && s.crc != s.header.dataChecksum)
             return Fail("the data checksum does not match (the data are damaged)");
     }

@@ -1,6 +1,6 @@
 #include "platform/rbx/RbxWriter.h"
 
-#include "platform/rbx/Crc32.h"
+#include "checksums/Crc32.h"
 #include "platform/rbx/RbxHeaderCodec.h"
 #include "platform/rbx/RbxValueCodec.h"
 #include "platform/system/Text.h"
@@ -238,7 +238,7 @@ bool CRbxWriter::FlushBuffer()
     State& s = *m_state;
     if (s.used == 0)
         return true;
-    s.crc = Crc32(s.crc, s.buffer.get(), s.used);
+    s.crc = checksum::Crc32(s.crc, s.buffer.get(), s.used);
     const bool ok = std::fwrite(s.buffer.get(), 1, s.used, s.file.get()) == s.used;
     s.used = 0;
     return ok || Fail(std::string("cannot write the data: ") + std::strerror(errno));

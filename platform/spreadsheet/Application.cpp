@@ -1,7 +1,7 @@
 // The object model over WorkbookModel: every object keeps the application (and its workbook)
 // alive through shared state, and fails with AutomationError once the application has quit or the
 // workbook has been closed, as a disconnected automation object does.
-#include "platform/spreadsheet/CellAddress.h"
+#include "formats/workbook/CellAddress.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
 
 #include "platform/system/FileSystem.h"

@@ -1,7 +1,7 @@
 #pragma once
 // A workbook as the object model serves it: per sheet the used range over the whole sheet, and
 // the cells of its first rows (all rows when the caller asks for them and they fit the budget).
-#include "platform/spreadsheet/WorkbookImport.h"
+#include "formats/workbook/WorkbookImport.h"
 
 #include <map>
 #include <memory>

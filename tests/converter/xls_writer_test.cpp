@@ -4,12 +4,12 @@
 #include "TestFiles.h"
 #include "tests/tools/PythonTools.h"
 
+#include "checksums/Crc32.h"
 #include "converter/Converter.h"
 #include "converter/StampText.h"
 #include "converter/XlsSeriesWriter.h"
-#include "platform/rbx/Crc32.h"
-#include "platform/spreadsheet/CompoundFile.h"
-#include "platform/spreadsheet/WorkbookReader.h"
+#include "formats/workbook/WorkbookReader.h"
+#include "formats/xls/CompoundFile.h"
 #include "templates/Specification.h"
 
 #include <gtest/gtest.h>
@@ -180,7 +180,7 @@ print("workbook", len(book), zlib.crc32(book))
     sheet::CompoundFile ours(path);
     const std::vector<unsigned char> stream = ours.Read(*ours.Find("Workbook"));
     EXPECT_EQ(streams.output, "difat 3\nworkbook " + std::to_string(stream.size()) + " " +
-                                  std::to_string(rbx::Crc32(0, stream.data(), stream.size())) + "\n");
+                                  std::to_string(checksum::Crc32(0, stream.data(), stream.size())) + "\n");
 
     sheet::WorkbookReader reader;
     ASSERT_TRUE(reader.Open(path)) << reader.status().problem().message;

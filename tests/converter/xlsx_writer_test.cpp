@@ -6,8 +6,8 @@
 #include "converter/ConversionJob.h"
 #include "converter/Converter.h"
 #include "converter/StampText.h"
-#include "converter/XlsxParts.h"
 #include "converter/XlsxSeriesWriter.h"
+#include "formats/xlsx/XlsxParts.h"
 #include "platform/spreadsheet/Spreadsheet.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
 #include "templates/Specification.h"
@@ -353,7 +353,7 @@ TEST(XlsxWriter, TextsBecomeWellFormedXmlCharacters)
         {"\xEF\xBF\xBE\xEF\xBF\xBF\xEF\xBF\xBD", "  \xEF\xBF\xBD"}, // U+FFFE, U+FFFF are no characters
     };
     for (const auto& [text, xml] : cases)
-        EXPECT_EQ(xlsx::XmlText(text), xml) << text;
+        EXPECT_EQ(sheet::package::XmlText(text), xml) << text;
 }
 
 TEST(XlsxWriter, ColumnNamesRunFromAToXFD)
@@ -361,5 +361,5 @@ TEST(XlsxWriter, ColumnNamesRunFromAToXFD)
     const std::pair<unsigned, const char*> cases[] = {{1, "A"},    {26, "Z"},    {27, "AA"},  {52, "AZ"},
                                                       {53, "BA"},  {702, "ZZ"},  {703, "AAA"}, {16384, "XFD"}};
     for (const auto& [column, name] : cases)
-        EXPECT_EQ(xlsx::ColumnName(column), name) << column;
+        EXPECT_EQ(sheet::package::ColumnName(column), name) << column;
 }

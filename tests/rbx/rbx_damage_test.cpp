@@ -1,9 +1,9 @@
 // Damaged and hostile files: every one gives an error naming the file, none crashes or reads on.
 #include "RbxTestFiles.h"
 
-#include "platform/rbx/Crc32.h"
-#include "platform/rbx/RbxBytes.h"
+#include "checksums/Crc32.h"
 #include "platform/rbx/Rbx.h"
+#include "platform/rbx/RbxBytes.h"
 #include "platform/rbx/RbxHeaderCodec.h"
 #include "platform/rbx/RbxReader.h"
 
@@ -44,7 +44,7 @@ protected:
     {
         std::memcpy(bytes.data() + offset, &value, sizeof(T));
         std::memset(bytes.data() + rbx::layout::kHeaderChecksum, 0, 4);
-        const std::uint32_t crc = rbx::Crc32(0, bytes.data(), headerSize);
+        const std::uint32_t crc = checksum::Crc32(0, bytes.data(), headerSize);
         std::memcpy(bytes.data() + rbx::layout::kHeaderChecksum, &crc, 4);
     }
 
@@ -170,7 +170,7 @@ TEST_F(DamagedFile, TimesThatGoBackAreCaughtEvenWithAMatchingChecksum)
     const std::uint32_t record = rbx::bytes::Get<std::uint32_t>(bytes.data() + rbx::layout::kRecordSize);
     const double back = -5.0;
     std::memcpy(bytes.data() + headerSize + 2 * record, &back, sizeof back);
-    const std::uint32_t dataCrc = rbx::Crc32(0, bytes.data() + headerSize, bytes.size() - headerSize);
+    const std::uint32_t dataCrc = checksum::Crc32(0, bytes.data() + headerSize, bytes.size() - headerSize);
     ForgeHeaderField<std::uint32_t>(rbx::layout::kDataChecksum, dataCrc);
     std::string error;
     EXPECT_FALSE(ReadsCleanly(Damaged(), rbx::VerifyChecksum::Auto, &error));

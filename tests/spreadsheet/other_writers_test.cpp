@@ -4,10 +4,10 @@
 #include "TestWorkbooks.h"
 #include "tests/tools/PythonTools.h"
 
-#include "converter/CompoundFileWriter.h"
-#include "platform/spreadsheet/LittleEndian.h"
+#include "formats/workbook/LittleEndian.h"
+#include "formats/workbook/WorkbookReader.h"
+#include "formats/xls/CompoundFileWriter.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
-#include "platform/spreadsheet/WorkbookReader.h"
 
 #include <gtest/gtest.h>
 
@@ -100,7 +100,7 @@ TEST(OtherWriters, XlwtWorkbookOf65536RowsReadsWholeThroughItsDifatChain)
 TEST(OtherWriters, EveryFaultOfADifatChainIsNamed)
 {
     const std::string base = TempFile("difat-base.xls");
-    converter::CompoundFileWriter writer;
+    sheet::CompoundFileWriter writer;
     ASSERT_TRUE(writer.Open(base));
     const std::string block(1 << 20, 'x');
     for (int i = 0; i < 8; ++i) // 8 MiB: 16,384 sectors, 130 table sectors, one DIFAT sector

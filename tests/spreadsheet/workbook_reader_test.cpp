@@ -1,7 +1,7 @@
 // Streaming whole sheets row by row, as the conversion engine reads workbooks.
 #include "TestWorkbooks.h"
 
-#include "platform/spreadsheet/WorkbookReader.h"
+#include "formats/workbook/WorkbookReader.h"
 
 #include <gtest/gtest.h>
 

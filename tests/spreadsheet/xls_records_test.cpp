@@ -3,9 +3,9 @@
 // results, 1904 dates, Excel 5.0 byte texts, and damage that must be named.
 #include "TestWorkbooks.h"
 
-#include "platform/spreadsheet/BiffStream.h"
+#include "formats/workbook/WorkbookReader.h"
+#include "formats/xls/BiffStream.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
-#include "platform/spreadsheet/WorkbookReader.h"
 
 #include <gtest/gtest.h>
 

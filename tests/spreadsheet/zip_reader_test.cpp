@@ -2,8 +2,8 @@
 // every kind of damage to the packed data or the directory is caught by name.
 #include "TestWorkbooks.h"
 
-#include "converter/ZipWriter.h"
-#include "platform/spreadsheet/ZipReader.h"
+#include "formats/xlsx/ZipReader.h"
+#include "formats/xlsx/ZipWriter.h"
 
 #include <gtest/gtest.h>
 
@@ -38,7 +38,7 @@ std::string Noise(std::size_t size)
 std::string WrittenPackage(const std::string& small, const std::string& large)
 {
     const std::string path = sheettest::TempFile("written.zip");
-    converter::ZipWriter writer;
+    sheet::ZipWriter writer;
     EXPECT_TRUE(writer.Open(path).ok());
     EXPECT_TRUE(writer.AddEntry("small.xml", small).ok());
     EXPECT_TRUE(writer.BeginEntry("large.xml").ok());
