@@ -18,7 +18,7 @@
 
 #include <xlsxwriter.h>
 
-using checktest::TempFolder;
+using checktest::ScratchFolder;
 
 namespace {
 
@@ -96,7 +96,7 @@ int FormatOfBridge(const char* bridgeName)
 }
 
 // What the engine does with the same files: convert to rbx0 and report success.
-bool EngineConverts(int format, const std::string& file, const std::string& templatePath, const TempFolder& scratch)
+bool EngineConverts(int format, const std::string& file, const std::string& templatePath, const ScratchFolder& scratch)
 {
     sys::Status status;
     const auto inputFormat = static_cast<sys::FileFormat>(format);
@@ -108,7 +108,7 @@ bool EngineConverts(int format, const std::string& file, const std::string& temp
     job.input = file;
     job.spec = spec.get();
     job.outputFormat = sys::FileFormat::Rbx0;
-    job.output = scratch / "engine-output.rbx0";
+    job.output = scratch.File("engine-output.rbx0");
     const bool converted = converter::ConvertFile(job).converted;
     std::filesystem::remove(job.output);
     return converted;
@@ -143,16 +143,16 @@ protected:
         EXPECT_EQ(verdict.reason.empty(), expected) << verdict.reason;
     }
 
-    TempFolder scratch;
+    ScratchFolder scratch;
     ui::ScriptedUserInterface screen;
     ui::ScopedUserInterface watching{screen};
-    std::string asciiFile = scratch / "gauge.txt";
-    std::string rbxFile = scratch / "gauge.rbx0";
-    std::string excelFile = scratch / "gauge.xlsx";
-    std::string asciiTemplate = scratch / "ascii.xml";
-    std::string asciiMisfit = scratch / "ascii-comma.xml";
-    std::string excelTemplate = scratch / "excel.xml";
-    std::string excelMisfit = scratch / "excel-sheet5.xml";
+    std::string asciiFile = scratch.File("gauge.txt");
+    std::string rbxFile = scratch.File("gauge.rbx0");
+    std::string excelFile = scratch.File("gauge.xlsx");
+    std::string asciiTemplate = scratch.File("ascii.xml");
+    std::string asciiMisfit = scratch.File("ascii-comma.xml");
+    std::string excelTemplate = scratch.File("excel.xml");
+    std::string excelMisfit = scratch.File("excel-sheet5.xml");
 };
 
 } // namespace
@@ -179,7 +179,7 @@ TEST_F(BridgeVerdictTest, RbxFileThatReadsAndOneThatIsTruncated)
 {
     ExpectAgreement(1, rbxFile, asciiTemplate, true);
     const auto size = std::filesystem::file_size(rbxFile);
-    const std::string truncated = scratch / "truncated.rbx0";
+    const std::string truncated = scratch.File("truncated.rbx0");
     std::filesystem::copy_file(rbxFile, truncated);
     std::filesystem::resize_file(truncated, size / 2);
     ExpectAgreement(1, truncated, asciiTemplate, false);
@@ -203,10 +203,10 @@ TEST_F(BridgeVerdictTest, UnknownBridgeMissingFileOrUnloadableTemplateGiveFalse)
     } cases[] = {
         {"unknown bridge", "CSV Bridge", asciiTemplate, asciiFile},
         {"bridge name in other case", "ascii timeseries bridge (general)", asciiTemplate, asciiFile},
-        {"missing data file", kBridgeNames[2], asciiTemplate, scratch / "missing.txt"},
+        {"missing data file", kBridgeNames[2], asciiTemplate, scratch.File("missing.txt")},
         {"empty data file name", kBridgeNames[2], asciiTemplate, ""},
         {"template that does not load", kBridgeNames[2], garbage, asciiFile},
-        {"missing template", kBridgeNames[2], scratch / "missing.xml", asciiFile},
+        {"missing template", kBridgeNames[2], scratch.File("missing.xml"), asciiFile},
         {"no template", kBridgeNames[2], "", asciiFile},
         {"excel template that does not load", kBridgeNames[3], garbage, excelFile},
     };
@@ -227,7 +227,7 @@ TEST_F(BridgeVerdictTest, ReasonNamesTheFileAndWhatWasExpected)
 
 TEST_F(BridgeVerdictTest, FolderScanPassesOverHiddenFiles)
 {
-    const std::string hidden = scratch / ".gauge.txt";
+    const std::string hidden = scratch.File(".gauge.txt");
     std::filesystem::copy_file(asciiFile, hidden);
     EXPECT_EQ(Ask(kBridgeNames[2], asciiTemplate, hidden, bridge::kSingleFile).value, bridge::kVerdictTrue);
     EXPECT_EQ(Ask(kBridgeNames[2], asciiTemplate, hidden, bridge::kFolderScan).value, bridge::kVerdictFalse);

@@ -1,13 +1,11 @@
 #pragma once
-// Shared pieces of the setup-check tests: a scratch folder, environment switches and a bridge
+// Shared pieces of the setup-check tests: scratch folders, environment switches and a bridge
 // component that records what it is asked and answers as told.
 #include "platform/bridge/BridgeComponent.h"
 #include "platform/system/Types.h"
 #include "tests/support/ScopedEnv.h"
+#include "tests/support/ScratchFolder.h"
 
-#include <cstdlib>
-#include <filesystem>
-#include <fstream>
 #include <functional>
 #include <optional>
 #include <stdexcept>
@@ -16,43 +14,7 @@
 
 namespace checktest {
 
-class TempFolder {
-public:
-    TempFolder()
-    {
-        std::string pattern = (std::filesystem::temp_directory_path() / "velmora-check-XXXXXX").string();
-        if (!::mkdtemp(pattern.data()))
-            throw std::runtime_error("cannot create a scratch folder");
-        m_path = pattern;
-    }
-    ~TempFolder()
-    {
-        std::error_code ignored;
-        std::filesystem::permissions(m_path, std::filesystem::perms::owner_all, ignored);
-        std::filesystem::remove_all(m_path, ignored);
-    }
-    TempFolder(const TempFolder&) = delete;
-    TempFolder& operator=(const TempFolder&) = delete;
-
-    const std::string& Path() const { return m_path; }
-    std::string operator/(const std::string& name) const { return m_path + "/" + name; }
-
-    std::string Write(const std::string& name, const std::string& bytes) const
-    {
-        const std::string path = *this / name;
-        std::ofstream(path, std::ios::binary) << bytes;
-        return path;
-    }
-    std::string MakeFolder(const std::string& name) const
-    {
-        const std::string path = *this / name;
-        std::filesystem::create_directories(path);
-        return path;
-    }
-
-private:
-    std::string m_path;
-};
+using testsupport::ScratchFolder;
 
 // Sets (or, with nullopt, removes) an environment variable for the lifetime of the object.
 using ScopedEnv = testsupport::ScopedEnv;

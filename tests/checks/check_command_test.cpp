@@ -6,34 +6,22 @@
 #include "converter/RbxSeriesWriter.h"
 #include "resources/StringTable.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/ShellCommand.h"
 
 #include <gtest/gtest.h>
 
-#include <sys/wait.h>
+#include <filesystem>
 
 using checktest::ScopedEnv;
-using checktest::TempFolder;
+using checktest::ScratchFolder;
 
 namespace {
 
-struct Outcome {
-    int status = -1;
-    std::string output;
-};
+using Outcome = testsupport::ShellRun;
 
 Outcome RunVelmora(const std::string& arguments)
 {
-    const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora " + arguments + " 2>/dev/null";
-    Outcome outcome;
-    FILE* pipe = ::popen(command.c_str(), "r");
-    if (!pipe)
-        return outcome;
-    char buffer[512];
-    while (size_t n = std::fread(buffer, 1, sizeof buffer, pipe))
-        outcome.output.append(buffer, n);
-    const int raw = ::pclose(pipe);
-    outcome.status = WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
-    return outcome;
+    return testsupport::RunShell(std::string(VELMORA_BIN_DIR) + "/velmora " + arguments + " 2>/dev/null");
 }
 
 void WriteGauge(converter::SeriesWriter& writer, const std::string& path)
@@ -84,7 +72,7 @@ protected:
         scratch.MakeFolder("out");
         setup.file = gauge;
         setup.templateName = fitting;
-        setup.outputFile = scratch / "out/gauge.rbx0";
+        setup.outputFile = scratch.File("out/gauge.rbx0");
     }
 
     Outcome Check(const StoredSetup& s)
@@ -93,11 +81,11 @@ protected:
         return RunVelmora("check " + doc);
     }
 
-    TempFolder scratch;
-    std::string gauge = scratch / "gauge.txt";
-    std::string gaugeRbx = scratch / "gauge.rbx0";
-    std::string fitting = scratch / "gauge.xml";
-    std::string misfit = scratch / "comma.xml";
+    ScratchFolder scratch;
+    std::string gauge = scratch.File("gauge.txt");
+    std::string gaugeRbx = scratch.File("gauge.rbx0");
+    std::string fitting = scratch.File("gauge.xml");
+    std::string misfit = scratch.File("comma.xml");
     StoredSetup setup;
 };
 
@@ -111,9 +99,9 @@ bool HasLine(const std::string& output, const std::string& start)
 TEST_F(CheckCommand, AFittingSingleFileSetupPassesEveryCheck)
 {
     const Outcome outcome = Check(setup);
-    EXPECT_EQ(outcome.status, 0) << outcome.output;
+    EXPECT_EQ(outcome.status, 0) << outcome.out;
     for (const char* line : {"PASS input: ", "PASS template: ", "PASS preview: ", "PASS output: "})
-        EXPECT_TRUE(HasLine(outcome.output, line)) << line << "\n" << outcome.output;
+        EXPECT_TRUE(HasLine(outcome.out, line)) << line << "\n" << outcome.out;
 }
 
 TEST_F(CheckCommand, ATemplateThatDoesNotFitFailsWithTheReason)
@@ -121,10 +109,10 @@ TEST_F(CheckCommand, ATemplateThatDoesNotFitFailsWithTheReason)
     setup.templateName = misfit;
     const Outcome outcome = Check(setup);
     EXPECT_EQ(outcome.status, 1);
-    EXPECT_TRUE(HasLine(outcome.output, "PASS input: ")) << outcome.output;
-    EXPECT_TRUE(HasLine(outcome.output, "FAIL template: " + gauge)) << outcome.output;
-    EXPECT_TRUE(HasLine(outcome.output, "FAIL preview: not tried")) << outcome.output;
-    EXPECT_TRUE(HasLine(outcome.output, "PASS output: ")) << outcome.output;
+    EXPECT_TRUE(HasLine(outcome.out, "PASS input: ")) << outcome.out;
+    EXPECT_TRUE(HasLine(outcome.out, "FAIL template: " + gauge)) << outcome.out;
+    EXPECT_TRUE(HasLine(outcome.out, "FAIL preview: not tried")) << outcome.out;
+    EXPECT_TRUE(HasLine(outcome.out, "PASS output: ")) << outcome.out;
 }
 
 TEST_F(CheckCommand, AFolderPassesWhenOneOfItsFilesFits)
@@ -134,18 +122,18 @@ TEST_F(CheckCommand, AFolderPassesWhenOneOfItsFilesFits)
     setup.type = 2;
     setup.file.clear();
     setup.folder = folder;
-    setup.outputFolder = scratch / "out";
+    setup.outputFolder = scratch.File("out");
     EXPECT_EQ(Check(setup).status, 0);
 
     setup.templateName = misfit;
     const Outcome outcome = Check(setup);
     EXPECT_EQ(outcome.status, 1);
-    EXPECT_TRUE(HasLine(outcome.output, "FAIL template: " + res::LoadString(res::IDS_TEMPLATE_NO_MATCH) + " (\"" +
+    EXPECT_TRUE(HasLine(outcome.out, "FAIL template: " + res::LoadString(res::IDS_TEMPLATE_NO_MATCH) + " (\"" +
                                             misfit + "\")"))
-        << outcome.output;
+        << outcome.out;
 
-    setup.outputFolder = scratch / "missing";
-    EXPECT_TRUE(HasLine(Check(setup).output,
+    setup.outputFolder = scratch.File("missing");
+    EXPECT_TRUE(HasLine(Check(setup).out,
                         "FAIL output: " + res::LoadString(res::IDS_FOLDER_INVALID) + " (\"" + setup.outputFolder + "\")"));
 }
 
@@ -159,14 +147,14 @@ TEST_F(CheckCommand, FailingOutputAndTemplateChecksNameTheirFile)
         std::string templateName;
         std::string line;
     } cases[] = {
-        {"an output of another format", scratch / "out/gauge.txt", fitting,
-         "FAIL output: " + res::LoadString(res::IDS_FILE_INVALID) + " (\"" + scratch / "out/gauge.txt" + "\")"},
-        {"an output in a missing folder", scratch / "none/gauge.rbx0", fitting,
-         "FAIL output: " + res::LoadString(res::IDS_FILE_INVALID) + " (\"" + scratch / "none/gauge.rbx0" + "\")"},
+        {"an output of another format", scratch.File("out/gauge.txt"), fitting,
+         "FAIL output: " + res::LoadString(res::IDS_FILE_INVALID) + " (\"" + scratch.File("out/gauge.txt") + "\")"},
+        {"an output in a missing folder", scratch.File("none/gauge.rbx0"), fitting,
+         "FAIL output: " + res::LoadString(res::IDS_FILE_INVALID) + " (\"" + scratch.File("none/gauge.rbx0") + "\")"},
         {"an output in a folder that is a file", notFolder + "/gauge.rbx0", fitting,
          "FAIL output: " + res::LoadString(res::IDS_FILE_INVALID) + " (\"" + notFolder + "/gauge.rbx0\")"},
-        {"a template in a missing folder", scratch / "out/gauge.rbx0", scratch / "none/t.xml",
-         "FAIL template: the template \"" + scratch / "none/t.xml" + "\" does not load"},
+        {"a template in a missing folder", scratch.File("out/gauge.rbx0"), scratch.File("none/t.xml"),
+         "FAIL template: the template \"" + scratch.File("none/t.xml") + "\" does not load"},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.what);
@@ -175,25 +163,25 @@ TEST_F(CheckCommand, FailingOutputAndTemplateChecksNameTheirFile)
         s.templateName = c.templateName;
         const Outcome outcome = Check(s);
         EXPECT_EQ(outcome.status, 1);
-        EXPECT_TRUE(HasLine(outcome.output, c.line)) << outcome.output;
+        EXPECT_TRUE(HasLine(outcome.out, c.line)) << outcome.out;
     }
 }
 
 TEST_F(CheckCommand, InputProblemsUseTheWizardsTexts)
 {
     StoredSetup missing = setup;
-    missing.file = scratch / "missing.txt";
+    missing.file = scratch.File("missing.txt");
     Outcome outcome = Check(missing);
     EXPECT_EQ(outcome.status, 1);
-    EXPECT_TRUE(HasLine(outcome.output, "FAIL input: " + res::LoadString(res::IDS_FILE_INVALID))) << outcome.output;
-    EXPECT_TRUE(HasLine(outcome.output, "FAIL template: not tried")) << outcome.output;
+    EXPECT_TRUE(HasLine(outcome.out, "FAIL input: " + res::LoadString(res::IDS_FILE_INVALID))) << outcome.out;
+    EXPECT_TRUE(HasLine(outcome.out, "FAIL template: not tried")) << outcome.out;
 
     ScopedEnv absent("VELMORA_SPREADSHEET", "absent");
     StoredSetup excel = setup;
     excel.format = 3;
     excel.file = scratch.Write("book.xlsx", "x");
     outcome = Check(excel);
-    EXPECT_TRUE(HasLine(outcome.output, "FAIL input: " + res::LoadString(res::IDS_EXCEL_MISSING))) << outcome.output;
+    EXPECT_TRUE(HasLine(outcome.out, "FAIL input: " + res::LoadString(res::IDS_EXCEL_MISSING))) << outcome.out;
 }
 
 TEST_F(CheckCommand, RbxInputHasNoTemplateCheckAndManualTemplatesAreNotHeldAgainstTheFile)
@@ -203,15 +191,15 @@ TEST_F(CheckCommand, RbxInputHasNoTemplateCheckAndManualTemplatesAreNotHeldAgain
     rbx.file = gaugeRbx;
     rbx.templateName.clear();
     Outcome outcome = Check(rbx);
-    EXPECT_EQ(outcome.status, 0) << outcome.output;
-    EXPECT_EQ(outcome.output.find("template:"), std::string::npos) << outcome.output;
+    EXPECT_EQ(outcome.status, 0) << outcome.out;
+    EXPECT_EQ(outcome.out.find("template:"), std::string::npos) << outcome.out;
 
     StoredSetup manual = setup;
     manual.option = 3;
     manual.templateName.clear();
     outcome = Check(manual);
-    EXPECT_EQ(outcome.status, 0) << outcome.output;
-    EXPECT_TRUE(HasLine(outcome.output, "PASS template: ")) << outcome.output;
+    EXPECT_EQ(outcome.status, 0) << outcome.out;
+    EXPECT_TRUE(HasLine(outcome.out, "PASS template: ")) << outcome.out;
 }
 
 TEST_F(CheckCommand, ReadsTheEngineFileLayoutToo)
@@ -222,8 +210,8 @@ TEST_F(CheckCommand, ReadsTheEngineFileLayoutToo)
     doc.erase(doc.rfind(" end\nend"), 5);
     doc.replace(doc.find("OkaToolbox"), 10, "VELMORA");
     const Outcome outcome = RunVelmora("check " + scratch.Write("engine.wpx", doc));
-    EXPECT_EQ(outcome.status, 0) << doc << outcome.output;
-    EXPECT_TRUE(HasLine(outcome.output, "PASS template: ")) << outcome.output;
+    EXPECT_EQ(outcome.status, 0) << doc << outcome.out;
+    EXPECT_TRUE(HasLine(outcome.out, "PASS template: ")) << outcome.out;
 }
 
 TEST_F(CheckCommand, UsageAndUnreadableDocuments)
@@ -232,7 +220,7 @@ TEST_F(CheckCommand, UsageAndUnreadableDocuments)
     EXPECT_EQ(RunVelmora("check a b").status, 2);
     EXPECT_EQ(RunVelmora("check --frobnicate").status, 2);
     EXPECT_EQ(RunVelmora("check --help").status, 0);
-    EXPECT_EQ(RunVelmora("check " + scratch / "missing.wpx").status, 1);
+    EXPECT_EQ(RunVelmora("check " + scratch.File("missing.wpx")).status, 1);
     const std::string empty = scratch.Write("empty.wpx", "wpx 1\nwpx end\n");
     EXPECT_EQ(RunVelmora("check " + empty).status, 1);
 }

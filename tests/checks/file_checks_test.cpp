@@ -6,12 +6,14 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
+
 using checktest::ScopedEnv;
-using checktest::TempFolder;
+using checktest::ScratchFolder;
 
 TEST(FolderExists, AnswersAlikeWithAndWithoutTrailingSeparator)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     const std::string folder = scratch.MakeFolder("data");
     const std::string file = scratch.Write("plain.txt", "x");
     CEngine engine;
@@ -19,8 +21,8 @@ TEST(FolderExists, AnswersAlikeWithAndWithoutTrailingSeparator)
     EXPECT_EQ(engine.FolderExists(folder + "/"), 1);
     EXPECT_EQ(engine.FolderExists(file), 0);
     EXPECT_EQ(engine.FolderExists(file + "/"), 0);
-    EXPECT_EQ(engine.FolderExists(scratch / "missing"), 0);
-    EXPECT_EQ(engine.FolderExists(scratch / "missing/"), 0);
+    EXPECT_EQ(engine.FolderExists(scratch.File("missing")), 0);
+    EXPECT_EQ(engine.FolderExists(scratch.File("missing/")), 0);
 }
 
 TEST(FolderExists, RefusesPathsShorterThanTwoOrLongerThan260Characters)
@@ -56,7 +58,7 @@ class AsciiAndRbxExtension : public testing::TestWithParam<ExtensionCase> {};
 
 TEST_P(AsciiAndRbxExtension, FollowsTheFormatRule)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     const ExtensionCase& c = GetParam();
     const std::string path = scratch.Write(c.name, "2021/01/01 00:00:00\t1\n");
     CEngine engine;
@@ -74,7 +76,7 @@ INSTANTIATE_TEST_SUITE_P(
 
 TEST(CheckFileExtension, TakesTheExtensionFromTheLastPathElementOnly)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     const std::string folder = scratch.MakeFolder("dotted.folder");
     std::ofstream(folder + "/readme") << "plain text";
     CEngine engine;
@@ -84,7 +86,7 @@ TEST(CheckFileExtension, TakesTheExtensionFromTheLastPathElementOnly)
 
 TEST(CheckFileExtension, DatNeverPassesWhateverItHolds)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     const std::string path = scratch.Write("values.dat", "Date\tA\n2021/01/01\t1\n");
     CEngine engine;
     CString message;
@@ -94,7 +96,7 @@ TEST(CheckFileExtension, DatNeverPassesWhateverItHolds)
 
 TEST(CheckFileExtension, ExtensionlessFileWithZeroByteFails)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     const std::string path = scratch.Write("binary", std::string("ab\0cd", 5));
     CEngine engine;
     CString message;
@@ -146,7 +148,7 @@ TEST(CheckFileExtension, ExcelVersionIsAskedAnewEachTime)
 
 TEST(IsTextFile, ZeroByteCountsOnlyWithinTheFirst40960Bytes)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     CEngine engine;
     std::string lateZero(40960, 'a');
     lateZero += '\0';
@@ -160,10 +162,10 @@ TEST(IsTextFile, ZeroByteCountsOnlyWithinTheFirst40960Bytes)
 
 TEST(IsTextFile, RefusesEmptyPathEmptyFileMissingFileAndFolder)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     CEngine engine;
     EXPECT_EQ(engine.IsTextFile(""), 0);
     EXPECT_EQ(engine.IsTextFile(scratch.Write("empty", "")), 0);
-    EXPECT_EQ(engine.IsTextFile(scratch / "missing"), 0);
+    EXPECT_EQ(engine.IsTextFile(scratch.File("missing")), 0);
     EXPECT_EQ(engine.IsTextFile(scratch.MakeFolder("sub")), 0);
 }

@@ -7,13 +7,14 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 using checktest::RecordingBridge;
 using checktest::ScopedEnv;
-using checktest::TempFolder;
+using checktest::ScratchFolder;
 
 namespace {
 
@@ -23,7 +24,7 @@ class WithRecordingBridge : public testing::Test {
 protected:
     RecordingBridge recorder;
     bridge::ScopedComponentFactory factory{recorder.Factory()};
-    TempFolder scratch;
+    ScratchFolder scratch;
     CEngine engine;
 };
 
@@ -103,7 +104,7 @@ TEST_F(WithRecordingBridge, FindMatchingFileTakesTheFileTheBridgeAcceptsInAFolde
     for (const auto& call : recorder.calls) {
         EXPECT_EQ(call.folderScan, kScanTrue);
         EXPECT_EQ(call.parameters, "TemplateFilePath=/t.xml");
-        EXPECT_NE(call.file, scratch / "d.xls") << "files with a refused extension never reach the bridge";
+        EXPECT_NE(call.file, scratch.File("d.xls")) << "files with a refused extension never reach the bridge";
     }
 
     recorder.verdict = [](const checktest::BridgeCall&) { return bridge::kVerdictFalse; };
@@ -116,7 +117,7 @@ TEST_F(WithRecordingBridge, FindMatchingFileSkipsHiddenUnexaminableAndFolderEntr
 {
     scratch.Write(".hidden.txt", "x");
     scratch.MakeFolder("folder.txt");
-    ASSERT_EQ(::symlink((scratch / "gone.txt").c_str(), (scratch / "dangling.txt").c_str()), 0);
+    ASSERT_EQ(::symlink((scratch.File("gone.txt")).c_str(), (scratch.File("dangling.txt")).c_str()), 0);
     CString match = "stale";
     EXPECT_EQ(engine.FindMatchingFile(scratch.Path(), match, 2, ""), 0);
     EXPECT_EQ(match, "");
@@ -127,7 +128,7 @@ TEST_F(WithRecordingBridge, FindMatchingFileSkipsHiddenUnexaminableAndFolderEntr
 // Under an account that reads every file, the check runs in a child process with a plain user's rights.
 TEST(FindMatchingFile, SkipsReadProtectedFiles)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     ::chmod(scratch.Path().c_str(), 0755);
     const std::string locked = scratch.MakeFolder("locked");
     const std::string open = scratch.MakeFolder("open");
@@ -245,10 +246,10 @@ class VerifyOutputTable : public testing::TestWithParam<OutputCase> {};
 TEST_P(VerifyOutputTable, JudgesFileOrFolderByTheInputType)
 {
     ScopedEnv version("VELMORA_SPREADSHEET_VERSION", "16.0");
-    TempFolder scratch;
+    ScratchFolder scratch;
     scratch.MakeFolder("out");
     const OutputCase& c = GetParam();
-    auto under = [&](const char* name) { return *name ? scratch / name : std::string(); };
+    auto under = [&](const char* name) { return *name ? scratch.File(name) : std::string(); };
     CEngine engine;
     engine.m_nInputType = c.inputType;
     CString message;
@@ -267,11 +268,11 @@ INSTANTIATE_TEST_SUITE_P(
 
 TEST(VerifyOutput, ExcelOutputNeedsASuitableSpreadsheet)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     ScopedEnv version("VELMORA_SPREADSHEET_VERSION", "11.0");
     CEngine engine;
     CString message;
-    EXPECT_EQ(engine.VerifyOutput(3, scratch / "a.xls", "", "", message), 1);
-    EXPECT_EQ(engine.VerifyOutput(3, scratch / "a.xlsx", "", "", message), 0);
+    EXPECT_EQ(engine.VerifyOutput(3, scratch.File("a.xls"), "", "", message), 1);
+    EXPECT_EQ(engine.VerifyOutput(3, scratch.File("a.xlsx"), "", "", message), 0);
     EXPECT_EQ(message, res::LoadString(res::IDS_FILE_INVALID));
 }

@@ -13,8 +13,10 @@
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
+
 using checktest::ScopedEnv;
-using checktest::TempFolder;
+using checktest::ScratchFolder;
 
 namespace {
 
@@ -332,16 +334,16 @@ TEST(ParseInputFile, AnExceptionClearsTheParsedFlagAPlainFailureLeavesIt)
 
 TEST(LoadTemplate, LoadsOnceRecordsTheNameAndRefreshesTheWorkingCopy)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     CAsciiSpecification stored;
     stored.m_DataDesc.m_nStartRow = 7;
-    const std::string path = scratch / "rain.xml";
+    const std::string path = scratch.File("rain.xml");
     ASSERT_EQ(stored.Save(path), 1);
 
     CEngine engine;
     EXPECT_EQ(engine.LoadTemplate(path), 0) << "no template object";
     engine.SetInput(1, 2, "/d/a.txt", "");
-    engine.m_strWorkTemplate = scratch / "work.xml";
+    engine.m_strWorkTemplate = scratch.File("work.xml");
     engine.SetTemplate(1, path);
     engine.m_strTemplateName.clear();
     EXPECT_EQ(engine.LoadTemplate(path), 1);
@@ -350,28 +352,28 @@ TEST(LoadTemplate, LoadsOnceRecordsTheNameAndRefreshesTheWorkingCopy)
     EXPECT_EQ(engine.m_pSpecification->m_bLoaded, 1);
 
     CAsciiSpecification copy;
-    ASSERT_EQ(copy.Load(scratch / "work.xml"), 1) << "the working copy was written";
+    ASSERT_EQ(copy.Load(scratch.File("work.xml")), 1) << "the working copy was written";
     EXPECT_EQ(copy.m_DataDesc.m_nStartRow, 7);
 
     engine.m_pSpecification->m_DataDesc.m_nStartRow = 8; // edited on a page
     EXPECT_EQ(engine.LoadTemplate(path), 1);
     EXPECT_EQ(engine.m_pSpecification->m_DataDesc.m_nStartRow, 8) << "an already loaded file is not read again";
 
-    EXPECT_EQ(engine.LoadTemplate(scratch / "missing.xml"), 0);
+    EXPECT_EQ(engine.LoadTemplate(scratch.File("missing.xml")), 0);
     EXPECT_EQ(engine.m_strTemplateName, path);
 }
 
 TEST(MakeWorkTemplateName, TakesTheFirstFreeNameInTheTemporaryFolder)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     ScopedEnv tmp("TMPDIR", scratch.Path());
     const std::string first = MakeWorkTemplateName();
-    EXPECT_EQ(first, scratch / "VelmoraTemplate.xml");
+    EXPECT_EQ(first, scratch.File("VelmoraTemplate.xml"));
     scratch.Write("VelmoraTemplate.xml", "");
-    EXPECT_EQ(MakeWorkTemplateName(), scratch / "VelmoraTemplate_0.xml");
+    EXPECT_EQ(MakeWorkTemplateName(), scratch.File("VelmoraTemplate_0.xml"));
     scratch.Write("VelmoraTemplate_0.xml", "");
     scratch.Write("VelmoraTemplate_1.xml", "");
-    EXPECT_EQ(MakeWorkTemplateName(), scratch / "VelmoraTemplate_2.xml");
+    EXPECT_EQ(MakeWorkTemplateName(), scratch.File("VelmoraTemplate_2.xml"));
 }
 
 TEST(MakeWorkTemplateName, FallsBackToTheCurrentFolderWhenTheTemporaryOneDoesNotFit)

@@ -95,7 +95,7 @@ TEST_F(OtherWritersTest, PreviewAndEngineEndTheDataAtTheSameRow)
 {
     if (!pytools::Has("openpyxl"))
         GTEST_SKIP() << "/usr/bin/python3 with openpyxl is not available";
-    const pytools::Result made = pytools::Run(kEndOfDataSheets, pytools::Quote(m_folder));
+    const pytools::Result made = pytools::Run(kEndOfDataSheets, testsupport::ShellQuote(m_folder));
     ASSERT_EQ(made.status, 0) << made.output;
 
     struct Case {
@@ -155,7 +155,7 @@ for i in range(14):
     s.append([datetime.datetime(2021, 1, 1, i), i, 2, "=B%d+C%d" % (i + 3, i + 3)])
 book.save(sys.argv[1])
 )",
-                                              pytools::Quote(m_folder + "sums.xlsx"));
+                                              testsupport::ShellQuote(m_folder + "sums.xlsx"));
     ASSERT_EQ(made.status, 0) << made.output;
 
     CExcelSpecification spec;
@@ -243,7 +243,7 @@ for system in (1900, 1904):
         sheet.write(i + 2, 1, i)
     book.save("%sxlwt-%d.xls" % (folder, system))
 )",
-                                              pytools::Quote(m_folder));
+                                              testsupport::ShellQuote(m_folder));
     ASSERT_EQ(made.status, 0) << made.output;
     const std::string all = "V[m]:Instantaneous\nDate\tV\n"
                             "1900/01/01 12:00:00\t0\n1900/02/28 00:00:00\t1\n1900/03/01 06:00:00\t2\n"
@@ -360,7 +360,7 @@ for r in range(2, 65536):
         sheet.flush_row_data()
 book.save(folder + "large.xls")
 )",
-                                              pytools::Quote(in));
+                                              testsupport::ShellQuote(in));
     ASSERT_EQ(made.status, 0) << made.output;
     // A copy of the large workbook whose DIFAT chain points out of the file.
     std::ifstream large(in + "large.xls", std::ios::binary);

@@ -1,38 +1,21 @@
 // `velmora preview --format excel` on workbooks written here, as a user would run it.
 #include "XlsxFile.h"
 #include "templates/ExcelSpecification.h"
+#include "tests/support/ShellCommand.h"
 
 #include <gtest/gtest.h>
 
-#include <array>
-#include <cstdio>
-#include <sys/wait.h>
 
 namespace {
 
-struct CommandRun {
-    int status = -1;
-    std::string out;
-};
+using testsupport::ShellRun;
 
-CommandRun Preview(const std::string& arguments, const std::string& environment = "")
+ShellRun Preview(const std::string& arguments, const std::string& environment = "")
 {
-    const std::string command =
-        environment + " " + std::string(VELMORA_BIN_DIR) + "/velmora preview " + arguments + " 2>&1";
-    CommandRun run;
-    FILE* pipe = ::popen(command.c_str(), "r");
-    if (!pipe)
-        return run;
-    std::array<char, 4096> buffer;
-    size_t got;
-    while ((got = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0)
-        run.out.append(buffer.data(), got);
-    const int status = ::pclose(pipe);
-    run.status = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-    return run;
+    return testsupport::RunShell(environment + " " + std::string(VELMORA_BIN_DIR) + "/velmora preview " + arguments + " 2>&1");
 }
 
-bool Has(const CommandRun& run, const std::string& piece) { return run.out.find(piece) != std::string::npos; }
+bool Has(const ShellRun& run, const std::string& piece) { return run.out.find(piece) != std::string::npos; }
 
 class ExcelPreviewCommand : public ::testing::Test {
 protected:
@@ -71,7 +54,7 @@ protected:
 
 TEST_F(ExcelPreviewCommand, JsonOfAParsedWorkbook)
 {
-    const CommandRun run = Preview(Arguments("--items 1 --json"));
+    const ShellRun run = Preview(Arguments("--items 1 --json"));
     ASSERT_EQ(run.status, 0) << run.out;
     EXPECT_TRUE(Has(run, "{\"ok\":true,")) << run.out;
     EXPECT_TRUE(Has(run, "\"itemNames\":[\"DateTime\",\"Level\",\"Flow\"]")) << run.out;
@@ -83,7 +66,7 @@ TEST_F(ExcelPreviewCommand, JsonOfAParsedWorkbook)
 
 TEST_F(ExcelPreviewCommand, AbsentApplicationFailsWithoutMessages)
 {
-    const CommandRun run = Preview(Arguments("--json"), "VELMORA_SPREADSHEET=absent");
+    const ShellRun run = Preview(Arguments("--json"), "VELMORA_SPREADSHEET=absent");
     EXPECT_EQ(run.status, 1);
     EXPECT_TRUE(Has(run, "{\"ok\":false,\n\"messages\":[]")) << run.out;
 }

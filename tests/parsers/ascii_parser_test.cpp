@@ -33,7 +33,7 @@ protected:
         return content;
     }
 
-    parsertest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     ui::ScriptedUserInterface ui;
     ui::ScopedUserInterface scope{ui};
     CAsciiSpecification spec;
@@ -422,7 +422,7 @@ TEST_F(AsciiParserTest, FormatThatSpansNoFieldEndsTheParse)
 
 TEST_F(AsciiParserTest, MissingFileOrTemplateFailsSilently)
 {
-    parser.SetFile(folder.Path("absent.txt"));
+    parser.SetFile(folder.File("absent.txt"));
     int count = 7;
     CStringList list;
     EXPECT_EQ(parser.GetItemCount(count), 0);
@@ -444,7 +444,7 @@ TEST_F(AsciiParserTest, MissingFileOrTemplateFailsSilently)
 
 TEST_F(AsciiParserTest, UnreadableFileRaisesTheFileException)
 {
-    parser.SetFile(folder.Path("")); // the folder exists but cannot be read as a file
+    parser.SetFile(folder.File("")); // the folder exists but cannot be read as a file
     EXPECT_THROW(parser.Parse(""), CFileException);
     CString line;
     EXPECT_THROW(parser.ReadLine(1, line), CFileException);

@@ -1,17 +1,18 @@
 // Files whose items are all 64-bit floating point have their records made straight from the step's
 // values: they must be the files the general packing makes, gaps as each item's delete value.
-#include "RbxTestFiles.h"
+#include "tests/support/RbxFiles.h"
 #include "platform/rbx/RbxReader.h"
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <cmath>
 #include <cstring>
 #include <random>
 
 namespace {
 
-using namespace rbxtest;
+using namespace testsupport;
 
 rbx::ItemInfo Profile(const std::string& name, std::uint32_t elements, double deleteValue)
 {
@@ -23,7 +24,7 @@ rbx::ItemInfo Profile(const std::string& name, std::uint32_t elements, double de
 
 TEST(RbxWriter, DoubleRecordsAreTheRecordsOfTheGeneralPacking)
 {
-    TempFolder folder;
+    ScratchFolder folder;
     const auto definition =
         Definition({Item("A", rbx::kFloat64, -999.0), Profile("P", 3, -1e300), Item("B", rbx::kFloat64, 7.5)});
     const std::size_t values = 5;
@@ -69,7 +70,7 @@ TEST(RbxWriter, DoubleRecordsAreTheRecordsOfTheGeneralPacking)
 
 TEST(RbxWriter, AFailedDoubleStepStopsTheFile)
 {
-    TempFolder folder;
+    ScratchFolder folder;
     const std::string path = folder.File("failed.rbx0");
     rbx::CRbxWriter writer;
     ASSERT_TRUE(writer.Open(path, Definition({Item("A", rbx::kFloat64)}, false)));

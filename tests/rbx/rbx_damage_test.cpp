@@ -1,5 +1,5 @@
 // Damaged and hostile files: every one gives an error naming the file, none crashes or reads on.
-#include "RbxTestFiles.h"
+#include "tests/support/RbxFiles.h"
 
 #include "platform/rbx/Crc32.h"
 #include "platform/rbx/RbxBytes.h"
@@ -9,7 +9,7 @@
 
 #include <cstring>
 
-using namespace rbxtest;
+using namespace testsupport;
 
 namespace {
 
@@ -32,7 +32,7 @@ protected:
     void SetUp() override
     {
         path = folder.File("good.rbx0");
-        WriteFile(path, Definition({Item("Level", rbx::kFloat32), Item("Flow", rbx::kInt32)}), {0, 60, 120},
+        WriteRbxFile(path, Definition({Item("Level", rbx::kFloat32), Item("Flow", rbx::kInt32)}), {0, 60, 120},
                   {{1.5, 10}, {2.5, 20}, {3.5, 30}});
         bytes = ReadBytes(path);
         headerSize = rbx::bytes::Get<std::uint32_t>(bytes.data() + rbx::layout::kHeaderSize);
@@ -55,7 +55,7 @@ protected:
         return damaged;
     }
 
-    TempFolder folder;
+    ScratchFolder folder;
     std::string path;
     std::vector<unsigned char> bytes;
     std::uint32_t headerSize = 0;

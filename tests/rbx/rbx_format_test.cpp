@@ -1,10 +1,10 @@
 // The bytes on disk stay what docs/rbx0-format.md shows, and the axis calls answer per axis type.
-#include "RbxTestFiles.h"
+#include "tests/support/RbxFiles.h"
 
 #include "platform/rbx/Rbx.h"
 #include "platform/rbx/RbxReader.h"
 
-using namespace rbxtest;
+using namespace testsupport;
 
 namespace {
 
@@ -22,9 +22,9 @@ rbx::FileDefinition GaugeDefinition()
 // Files written by earlier builds must stay readable, and new files must not drift from the layout.
 TEST(RbxFormat, TheWriterProducesTheDocumentedExampleByteForByte)
 {
-    TempFolder folder;
+    ScratchFolder folder;
     const std::string path = folder.File("gauge.rbx0");
-    WriteFile(path, GaugeDefinition(), {0.0, 3600.0}, {{1.25}, {1.5}});
+    WriteRbxFile(path, GaugeDefinition(), {0.0, 3600.0}, {{1.25}, {1.5}});
     const auto golden = ReadBytes(std::string(VELMORA_TEST_DATA) + "/rbx/gauge.rbx0");
     ASSERT_EQ(golden.size(), 178u);
     EXPECT_EQ(ReadBytes(path), golden);
@@ -59,7 +59,7 @@ TEST(RbxCalls, EachAxisCallAnswersOnlyForItsAxisType)
         {true, {0, 2, 4}, 3, 2.0},
         {true, {0, 1.5, 4}, 4, 4.0},
     };
-    TempFolder folder;
+    ScratchFolder folder;
     for (const Case& c : cases) {
         SCOPED_TRACE(c.axisType);
         const std::string path = folder.File("axis.rbx0");
@@ -68,7 +68,7 @@ TEST(RbxCalls, EachAxisCallAnswersOnlyForItsAxisType)
         definition.timeUnitText = "hour";
         definition.startOffset = 0.5;
         definition.startIndex = 7;
-        WriteFile(path, definition, c.times, {{1}, {2}, {3}});
+        WriteRbxFile(path, definition, c.times, {{1}, {2}, {3}});
 
         rbxHeader* header = nullptr;
         rbxFile* file = nullptr;
@@ -107,7 +107,7 @@ TEST(RbxCalls, EachAxisCallAnswersOnlyForItsAxisType)
 
 TEST(RbxCalls, ItemInfoSkipsNullOutputsAndGivesPerItemDeleteValues)
 {
-    TempFolder folder;
+    ScratchFolder folder;
     const std::string path = folder.File("items.rbx0");
     rbx::ItemInfo rain = Item("Rain", rbx::kInt16, -1);
     rain.itemTypeKey = 103;
@@ -115,7 +115,7 @@ TEST(RbxCalls, ItemInfoSkipsNullOutputsAndGivesPerItemDeleteValues)
     rain.unitKey = 1002;
     rain.unitText = "mm";
     rain.valueType = rbx::kStepAccumulated;
-    WriteFile(path, Definition({Item("Level", rbx::kFloat32, -999), rain}), {0}, {{1, 2}});
+    WriteRbxFile(path, Definition({Item("Level", rbx::kFloat32, -999), rain}), {0}, {{1, 2}});
 
     rbxHeader* header = nullptr;
     rbxFile* file = nullptr;

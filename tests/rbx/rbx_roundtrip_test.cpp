@@ -1,6 +1,6 @@
 // Write-then-read round trips: every data type under every time axis kind, through the C++ reader
 // and the C-style calls.
-#include "RbxTestFiles.h"
+#include "tests/support/RbxFiles.h"
 
 #include "platform/rbx/Rbx.h"
 #include "platform/rbx/RbxReader.h"
@@ -8,8 +8,9 @@
 #include <cmath>
 #include <cstdint>
 #include <cstring>
+#include <filesystem>
 
-using namespace rbxtest;
+using namespace testsupport;
 
 namespace {
 
@@ -47,13 +48,13 @@ class RoundTrip : public ::testing::TestWithParam<std::tuple<TypeCase, AxisCase>
 TEST_P(RoundTrip, ReaderGivesBackHeaderTimesAndValues)
 {
     const auto& [type, axis] = GetParam();
-    TempFolder folder;
+    ScratchFolder folder;
     const std::string path = folder.File("roundtrip.rbx0");
     std::vector<std::vector<double>> rows;
     for (std::size_t s = 0; s < type.values.size(); ++s)
         rows.push_back({type.values[s], type.values[(s + 1) % type.values.size()]});
     auto definition = Definition({Item("Level", type.dataType, 1.0), Item("Second", type.dataType, 1.0)}, axis.calendar);
-    WriteFile(path, definition, axis.times, rows);
+    WriteRbxFile(path, definition, axis.times, rows);
 
     rbx::CRbxReader reader;
     ASSERT_TRUE(reader.Open(path)) << reader.status().problem().Describe();
@@ -92,11 +93,11 @@ INSTANTIATE_TEST_SUITE_P(AllTypesAllAxes, RoundTrip, ::testing::Combine(::testin
 // The C-style calls read the same files value by value in the item's own type.
 TEST(RbxCalls, ReadValuesOneByOneInTheirOwnTypes)
 {
-    TempFolder folder;
+    ScratchFolder folder;
     const std::string path = folder.File("mixed.rbx0");
     auto definition = Definition({Item("F", rbx::kFloat32, 0), Item("U", rbx::kUInt32, 0), Item("S", rbx::kInt16, 0),
                                   Item("C", rbx::kChar, 0), Item("I", rbx::kInteger, 0)});
-    WriteFile(path, definition, {0.0, 60.0}, {{2.5, 3000000000.0, -3.0, 'x', -5.0}, {7.0, 1.0, 2.0, 'y', 1e15}});
+    WriteRbxFile(path, definition, {0.0, 60.0}, {{2.5, 3000000000.0, -3.0, 'x', -5.0}, {7.0, 1.0, 2.0, 'y', 1e15}});
 
     ASSERT_EQ(rbxInitSystem(), 0);
     rbxHeader* header = nullptr;
@@ -175,12 +176,12 @@ TEST(RbxWriter, DecidesTheAxisKindFromTheSteps)
         {"last step differs", true, {0, 10, 20, 30, 41}, rbx::kNonEquidistantCalendar, 41.0},
         {"rounding noise is still equal", false, {0.0, 0.1, 0.2, 0.30000000000000004}, rbx::kEquidistantRelative, 0.1},
     };
-    TempFolder folder;
+    ScratchFolder folder;
     for (const Case& c : cases) {
         SCOPED_TRACE(c.what);
         const std::string path = folder.File("axis.rbx0");
         std::vector<std::vector<double>> rows(c.times.size(), {1.0});
-        WriteFile(path, Definition({Item("A", rbx::kFloat32)}, c.calendar), c.times, rows);
+        WriteRbxFile(path, Definition({Item("A", rbx::kFloat32)}, c.calendar), c.times, rows);
         rbx::CRbxReader reader;
         ASSERT_TRUE(reader.Open(path)) << reader.status().problem().Describe();
         EXPECT_EQ(reader.Header().axis.type, c.axisType);
@@ -191,7 +192,7 @@ TEST(RbxWriter, DecidesTheAxisKindFromTheSteps)
 
 TEST(RbxWriter, CalendarStampsCountFromTheFirstStampInTheAxisUnit)
 {
-    TempFolder folder;
+    ScratchFolder folder;
     const std::string path = folder.File("stamps.rbx0");
     auto definition = Definition({Item("A", rbx::kFloat64)});
     definition.calendarStart.reset();
@@ -218,9 +219,9 @@ TEST(RbxWriter, CalendarStampsCountFromTheFirstStampInTheAxisUnit)
 
 TEST(RbxWriter, DifferentDeleteValuesMakeAPerItemFileAndNaNStoresTheDeleteValue)
 {
-    TempFolder folder;
+    ScratchFolder folder;
     const std::string path = folder.File("deletes.rbx0");
-    WriteFile(path, Definition({Item("A", rbx::kFloat32, -1e-35), Item("B", rbx::kInt32, -9999)}), {0.0},
+    WriteRbxFile(path, Definition({Item("A", rbx::kFloat32, -1e-35), Item("B", rbx::kInt32, -9999)}), {0.0},
               {{NAN, NAN}});
     rbx::CRbxReader reader;
     ASSERT_TRUE(reader.Open(path)) << reader.status().problem().Describe();
@@ -252,7 +253,7 @@ TEST(RbxWriter, RejectsWhatTheFormatCannotHoldAndLeavesNoFileBehind)
         {"unknown data type", {Item("A", 9)}, {}, {}, "unknown data type 9"},
         {"delete value beyond int16", {Item("A", rbx::kInt16, 1e6)}, {}, {}, "delete value"},
     };
-    TempFolder folder;
+    ScratchFolder folder;
     for (const Case& c : cases) {
         SCOPED_TRACE(c.what);
         const std::string path = folder.File("bad.rbx0");
@@ -271,12 +272,12 @@ TEST(RbxWriter, RejectsWhatTheFormatCannotHoldAndLeavesNoFileBehind)
 
 TEST(RbxWriter, ProfileItemsCarryAllTheirValuesPerStep)
 {
-    TempFolder folder;
+    ScratchFolder folder;
     const std::string path = folder.File("profile.rbx0");
     auto profile = Item("Profile", rbx::kFloat64);
     profile.axisType = rbx::kProfileItem;
     profile.elementCount = 3;
-    WriteFile(path, Definition({Item("A", rbx::kInt32), profile}), {0.0, 1.0}, {{1, 10, 11, 12}, {2, 20, 21, 22}});
+    WriteRbxFile(path, Definition({Item("A", rbx::kInt32), profile}), {0.0, 1.0}, {{1, 10, 11, 12}, {2, 20, 21, 22}});
 
     rbxHeader* header = nullptr;
     rbxFile* file = nullptr;
@@ -298,7 +299,7 @@ TEST(RbxWriter, ProfileItemsCarryAllTheirValuesPerStep)
 
 TEST(RbxWriter, ManyStepsCrossTheWriteBufferAndBlockReadsStayInOrder)
 {
-    TempFolder folder;
+    ScratchFolder folder;
     const std::string path = folder.File("long.rbx0");
     rbx::CRbxWriter writer;
     ASSERT_TRUE(writer.Open(path, Definition({Item("A", rbx::kFloat64), Item("B", rbx::kInt32)}, false)));

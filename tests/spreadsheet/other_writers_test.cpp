@@ -65,7 +65,7 @@ TEST(OtherWriters, XlwtWorkbookOf65536RowsReadsWholeThroughItsDifatChain)
     if (!pytools::Has("xlwt"))
         GTEST_SKIP() << "/usr/bin/python3 with xlwt is not available";
     const std::string path = TempFile("xlwt-65536.xls");
-    const pytools::Result made = pytools::Run(kXlwtRows, pytools::Quote(path) + " 65536 12");
+    const pytools::Result made = pytools::Run(kXlwtRows, testsupport::ShellQuote(path) + " 65536 12");
     ASSERT_EQ(made.status, 0) << made.output;
     const std::string bytes = ReadBytes(path);
     ASSERT_GE(bytes.size(), 512u);
@@ -154,7 +154,7 @@ for i in range(3):
     sheet.append([datetime.datetime(2021, 1, 1, i), i, 2, "=B%d+C%d" % (i + 2, i + 2)])
 book.save(sys.argv[1])
 )",
-                                              pytools::Quote(path));
+                                              testsupport::ShellQuote(path));
     ASSERT_EQ(made.status, 0) << made.output;
 
     auto app = StartApplication(ApplicationSettings());
@@ -189,7 +189,7 @@ sheet.write(0, 0, 1.5)
 sheet.write(0, 1, xlwt.Formula("A1*2"))
 book.save(sys.argv[1])
 )",
-                                              pytools::Quote(path));
+                                              testsupport::ShellQuote(path));
     ASSERT_EQ(made.status, 0) << made.output;
     WorkbookReader reader;
     ASSERT_TRUE(reader.Open(path)) << reader.status().problem().message;

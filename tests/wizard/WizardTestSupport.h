@@ -18,7 +18,7 @@
 namespace wizardtest {
 
 using checktest::ScopedEnv;
-using checktest::TempFolder;
+using checktest::ScratchFolder;
 
 // The three items every input holds.
 inline const char* const kItemNames[] = {"Level", "Flow", "Rain"};
@@ -69,11 +69,11 @@ inline void WriteWorkbook(const std::string& path)
 // Input files of every format: one single file each, a folder of two each, and a template for
 // ASCII and one for Excel. The temporary folder of the process is a scratch folder of its own.
 struct Inputs {
-    explicit Inputs(const TempFolder& scratch)
-        : temp(scratch.MakeFolder("tmp") + "/"), asciiFile(scratch / "gauge.txt"), rbxFile(scratch / "gauge.rbx0"),
-          excelFile(scratch / "gauge.xlsx"), asciiFolder(scratch.MakeFolder("ascii") + "/"),
+    explicit Inputs(const ScratchFolder& scratch)
+        : temp(scratch.MakeFolder("tmp") + "/"), asciiFile(scratch.File("gauge.txt")), rbxFile(scratch.File("gauge.rbx0")),
+          excelFile(scratch.File("gauge.xlsx")), asciiFolder(scratch.MakeFolder("ascii") + "/"),
           rbxFolder(scratch.MakeFolder("rbx") + "/"), excelFolder(scratch.MakeFolder("excel") + "/"),
-          asciiTemplate(scratch / "ascii.xml"), excelTemplate(scratch / "excel.xml"), output(scratch.MakeFolder("out") + "/")
+          asciiTemplate(scratch.File("ascii.xml")), excelTemplate(scratch.File("excel.xml")), output(scratch.MakeFolder("out") + "/")
     {
         converter::AsciiSeriesWriter ascii;
         WriteSeries(ascii, asciiFile);

@@ -65,8 +65,8 @@ protected:
     // Runs `program` of ours with `arguments` (each quoted).
     ProgramRun Run(const std::string& program, const std::vector<std::string>& arguments)
     {
-        const std::string out = scratch / "program.out";
-        const std::string err = scratch / "program.err";
+        const std::string out = scratch.File("program.out");
+        const std::string err = scratch.File("program.err");
         std::string command = "'" VELMORA_BIN_DIR "/" + program + "'";
         for (const std::string& argument : arguments)
             command += " '" + argument + "'";
@@ -89,14 +89,14 @@ protected:
         EXPECT_TRUE(std::filesystem::is_empty(inputs.temp)) << road << ": the wizard left a working file";
         if (result != kFinished || !GetModuleWpxHandle())
             return std::string();
-        const std::string document = scratch / (road + ".wpx");
+        const std::string document = scratch.File(road + ".wpx");
         EXPECT_EQ(wpxWrite(ModuleWpxDocument(), document), 1);
         const ProgramRun run = Run("velmora", {"run", document});
         EXPECT_TRUE(run.ok) << road << ": " << run.err;
         return run.err;
     }
 
-    wizardtest::TempFolder scratch;
+    wizardtest::ScratchFolder scratch;
     wizardtest::Inputs inputs{scratch};
     ui::ScriptedUserInterface screen;
     ui::ScopedUserInterface watching{screen};

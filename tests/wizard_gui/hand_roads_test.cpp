@@ -99,7 +99,7 @@ TEST_F(HandRoads, AsciiWithTabsDateAndTimeInOneColumnAndADeleteValue)
         SaveAndFinish(d, road, inputs.output + "tab.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    ExpectLines(TemplateShown(scratch / "data/template.xml"),
+    ExpectLines(TemplateShown(scratch.File("data/template.xml")),
                 {"Delimiter: \"Tab\"", "DecimalSeparator: \"Dot\"", "DateTimeOption: 0", "DateTimeFormat: \"YYYY/MM/DD HH:mm:ss\"",
                  "ItemDescriptionRow: 2", "UnitTypeRow: 1", "StartRow: 3", "DeleteValueCheck: 1", "DeleteValueRadio: 0",
                  "DeleteValue: \"-999\"", "SelItems: 0,1,2"});
@@ -126,7 +126,7 @@ TEST_F(HandRoads, AsciiWithBlanksDecimalCommasAndDateAndTimeInTwoColumns)
         SaveAndFinish(d, road, inputs.output + "space.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    ExpectLines(TemplateShown(scratch / "data/template.xml"),
+    ExpectLines(TemplateShown(scratch.File("data/template.xml")),
                 {"Delimiter: \"Space\"", "IgnoreConsecutiveDelimiters: 1", "DecimalSeparator: \"Comma\"",
                  "DateTimeFormat: \"YYYY-MM-DD HH:mm:ss\"", "DeleteValueCheck: 0"});
     ExpectLines(guitest::ReadFile(inputs.output + "space.txt"),
@@ -160,7 +160,7 @@ TEST_F(HandRoads, AsciiWithSemicolonsOneDateForAllRowsAndTheDeleteValueInARow)
         SaveAndFinish(d, road, inputs.output + "semicolon.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    ExpectLines(TemplateShown(scratch / "data/template.xml"),
+    ExpectLines(TemplateShown(scratch.File("data/template.xml")),
                 {"Delimiter: \"Semi Colon\"", "DecimalSeparator: \"Comma\"", "DateTimeOption: 1", "GlobalDate: \"2021-05-01\"",
                  "TimeCol: 1", "StartRow: 4", "DeleteValueCheck: 1", "DeleteValueRadio: 1", "DeleteValueRow: 3"});
     ExpectLines(guitest::ReadFile(inputs.output + "semicolon.txt"),
@@ -202,7 +202,7 @@ TEST_F(HandRoads, AsciiWithNamesTypesUnitsAndValueTypesDefinedInTheGrid)
         SaveAndFinish(d, road, inputs.output + "grid.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    const std::string shown = TemplateShown(scratch / "data/template.xml");
+    const std::string shown = TemplateShown(scratch.File("data/template.xml"));
     ExpectLines(shown, {"ItemTitleOption: 1", "UnitTypeOption: 2", "UnitOption: 2", "ValueTypeOption: 2", "StartRow: 1"});
     ExpectLines(shown, {"  1: title \"Level\", type \"Water Level\", unit \"meter\", value type \"Instantaneous\"",
                         "  2: title \"Flow\", type \"Discharge\", unit \"cubic meter per second\", value type \"Accumulated\""});
@@ -236,7 +236,7 @@ TEST_F(HandRoads, ExcelWithTheDateAndTimeTextsReadByTheFormat)
 {
     const std::string road = "excel-by-hand";
     scratch.MakeFolder("data");
-    const std::string file = scratch / "data/stamps.xlsx";
+    const std::string file = scratch.File("data/stamps.xlsx");
     WriteTextStampWorkbook(file);
     const std::string said = RunRoad(road, [&](Driver& d) {
         Describe(d, road, 3, file);
@@ -250,7 +250,7 @@ TEST_F(HandRoads, ExcelWithTheDateAndTimeTextsReadByTheFormat)
         SaveAndFinish(d, road, inputs.output + "excel.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    const std::string shown = TemplateShown(scratch / "data/template.xml");
+    const std::string shown = TemplateShown(scratch.File("data/template.xml"));
     ExpectLines(shown, {"Kind: excel", "UseDTFormat: 1", "DateTimeFormat: \"YYYY-MM-DD|HH:mm:ss\"", "UseTFormat: 0"});
     ExpectLines(guitest::ReadFile(inputs.output + "excel.txt"),
                 {"Date\tLevel\tRain", "2021/03/01 00:30:00\t1.5\t0", "2021/03/01 02:30:00\t3.5\t0.5"});
@@ -288,7 +288,7 @@ TEST_F(HandRoads, AnAsciiTemplateChangedAndSavedOverItselfAfterTheQuestion)
 TEST_F(HandRoads, AnExcelTemplateChangedAndSavedUnderANewName)
 {
     const std::string road = "excel-modified";
-    const std::string newTemplate = scratch / "excel-hourly.xml";
+    const std::string newTemplate = scratch.File("excel-hourly.xml");
     const std::string before = guitest::ReadFile(inputs.excelTemplate);
     const std::string said = RunRoad(road, [&](Driver& d) {
         Describe(d, road, 3, inputs.excelFile, inputs.excelTemplate);

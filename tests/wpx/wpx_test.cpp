@@ -1,4 +1,6 @@
 #include "platform/wpx/Wpx.h"
+#include "tests/support/Files.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <gtest/gtest.h>
 
@@ -13,27 +15,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// A private folder for the files one test writes.
-class ScratchFolder {
-public:
-    ScratchFolder()
-    {
-        std::string pattern = (fs::temp_directory_path() / "wpx_test_XXXXXX").string();
-        m_path = ::mkdtemp(pattern.data());
-    }
-    ~ScratchFolder() { fs::remove_all(m_path); }
-    std::string File(const std::string& name) const { return (fs::path(m_path) / name).string(); }
-    const std::string& Path() const { return m_path; }
-
-private:
-    std::string m_path;
-};
-
-void WriteText(const std::string& path, const std::string& text)
-{
-    std::ofstream out(path, std::ios::binary);
-    out << text;
-}
+using testsupport::ScratchFolder;
 
 // Everything the reading calls can see of a keyword list, as one line per entry.
 void Dump(WPXHANDLE container, int depth, std::string& out);
@@ -149,7 +131,7 @@ TEST(WpxRead, RelativeFileNamesAreAnchoredAtTheDocumentsFolder)
 {
     ScratchFolder scratch;
     fs::create_directory(scratch.File("docs"));
-    WriteText(scratch.File("docs/setup.wpx"), "wpx 1\n"
+    testsupport::WriteFile(scratch.File("docs/setup.wpx"), "wpx 1\n"
                                               "target \"T\"\n"
                                               "  File = file \"data/in.csv\", file \"\", file \"/abs/x\", file \"../up.txt\"\n"
                                               "  Text = \"data/in.csv\"\n"
@@ -317,7 +299,7 @@ TEST(WpxRead, MissingFileFolderDeviceAndHugeFileAreRefused)
     EXPECT_EQ(doc, nullptr);
     EXPECT_EQ(wpxRead("/dev/zero", &doc, &error), 0) << "an endless device is not read";
     EXPECT_NE(error.find("/dev/zero: is not a regular file"), std::string::npos) << error;
-    WriteText(scratch.File("huge.wpx"), "wpx 1\n");
+    testsupport::WriteFile(scratch.File("huge.wpx"), "wpx 1\n");
     fs::resize_file(scratch.File("huge.wpx"), (64u << 20) + 1); // sparse: costs no disk
     EXPECT_EQ(wpxRead(scratch.File("huge.wpx"), &doc, &error), 0);
     EXPECT_NE(error.find("larger than 64 MiB"), std::string::npos) << error;

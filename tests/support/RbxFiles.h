@@ -1,34 +1,17 @@
 #pragma once
-// Small rbx0 files for the tests: a temporary folder per test, a writer call that fills a file from
-// tables, and raw byte access for damaging files.
+// Small rbx0 files for the tests: a writer call that fills a file from tables, and raw byte access
+// for damaging files.
 #include "platform/rbx/RbxWriter.h"
+#include "tests/support/Files.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <gtest/gtest.h>
 
-#include <filesystem>
-#include <fstream>
-#include <iterator>
-#include <unistd.h>
+#include <string>
+#include <string_view>
 #include <vector>
 
-namespace rbxtest {
-
-class TempFolder {
-public:
-    TempFolder()
-    {
-        const auto* info = ::testing::UnitTest::GetInstance()->current_test_info();
-        m_path = std::filesystem::temp_directory_path()
-            / (std::string("velmora_rbx_") + info->test_suite_name() + "_" + info->name() + "_" + std::to_string(::getpid()));
-        std::filesystem::remove_all(m_path);
-        std::filesystem::create_directories(m_path);
-    }
-    ~TempFolder() { std::filesystem::remove_all(m_path); }
-    std::string File(const std::string& name) const { return (m_path / name).string(); }
-
-private:
-    std::filesystem::path m_path;
-};
+namespace testsupport {
 
 inline rbx::ItemInfo Item(const std::string& name, int dataType, double deleteValue = -999.0)
 {
@@ -44,7 +27,7 @@ inline rbx::ItemInfo Item(const std::string& name, int dataType, double deleteVa
 }
 
 // Writes `times` with `values` (one row of ValueCount() per step); fails the test on a writer error.
-inline void WriteFile(const std::string& path, const rbx::FileDefinition& definition, const std::vector<double>& times,
+inline void WriteRbxFile(const std::string& path, const rbx::FileDefinition& definition, const std::vector<double>& times,
                       const std::vector<std::vector<double>>& values)
 {
     rbx::CRbxWriter writer;
@@ -69,14 +52,13 @@ inline rbx::FileDefinition Definition(std::vector<rbx::ItemInfo> items, bool cal
 
 inline std::vector<unsigned char> ReadBytes(const std::string& path)
 {
-    std::ifstream in(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+    const std::string bytes = ReadFile(path);
+    return {bytes.begin(), bytes.end()};
 }
 
 inline void WriteBytes(const std::string& path, const std::vector<unsigned char>& bytes)
 {
-    std::ofstream out(path, std::ios::binary | std::ios::trunc);
-    out.write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
+    WriteFile(path, std::string_view(reinterpret_cast<const char*>(bytes.data()), bytes.size()));
 }
 
-} // namespace rbxtest
+} // namespace testsupport
