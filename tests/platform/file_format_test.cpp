@@ -1,11 +1,11 @@
 // The table of formats: numbers, names and bridge names found both ways, the extensions of each
 // format's inputs, and the text test for a file without extension.
 #include "platform/system/FileFormat.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <gtest/gtest.h>
 
 #include <filesystem>
-#include <fstream>
 #include <sys/stat.h>
 
 namespace {
@@ -54,19 +54,8 @@ TEST(FileFormats, InputExtensionsInAnyLetterCase)
 
 class TextTest : public ::testing::Test {
 protected:
-    void SetUp() override
-    {
-        std::string pattern = (std::filesystem::temp_directory_path() / "velmora-format-XXXXXX").string();
-        m_folder = ::mkdtemp(pattern.data());
-    }
-    void TearDown() override { std::filesystem::remove_all(m_folder); }
-    std::string Write(const char* name, const std::string& bytes) const
-    {
-        const std::string path = m_folder + "/" + name;
-        std::ofstream(path, std::ios::binary) << bytes;
-        return path;
-    }
-    std::string m_folder;
+    std::string Write(const char* name, const std::string& bytes) const { return m_folder.Write(name, bytes); }
+    testsupport::ScratchFolder m_folder{"velmora-format"};
 };
 
 TEST_F(TextTest, AFileWithoutExtensionIsTextWithoutAZeroInItsFirst40960Bytes)
@@ -77,9 +66,9 @@ TEST_F(TextTest, AFileWithoutExtensionIsTextWithoutAZeroInItsFirst40960Bytes)
     EXPECT_TRUE(sys::LooksLikeText(Write("late", zeroLate)));
     EXPECT_FALSE(sys::LooksLikeText(Write("inside", zeroInside)));
     EXPECT_FALSE(sys::LooksLikeText(Write("empty", "")));
-    EXPECT_FALSE(sys::LooksLikeText(m_folder));
-    EXPECT_FALSE(sys::LooksLikeText(m_folder + "/missing"));
-    const std::string fifo = m_folder + "/pipe";
+    EXPECT_FALSE(sys::LooksLikeText(m_folder.Path()));
+    EXPECT_FALSE(sys::LooksLikeText(m_folder.File("missing")));
+    const std::string fifo = m_folder.File("pipe");
     ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
     EXPECT_FALSE(sys::LooksLikeText(fifo)); // and it does not wait for a writer
 

@@ -4,32 +4,28 @@
 #include "platform/system/Text.h"
 #include "platform/system/TextFileInput.h"
 #include "platform/system/TextLineReader.h"
+#include "tests/support/ScratchFolder.h"
 #include "tests/support/ScratchLocale.h"
 #include "tests/support/Utf16.h"
 
 #include <gtest/gtest.h>
 
 #include <filesystem>
-#include <fstream>
 #include <random>
 #include <sys/stat.h>
 
 namespace {
 
-class ScratchFile {
+// One file of given bytes, alone in a scratch folder.
+class TextFile {
 public:
-    explicit ScratchFile(const std::string& bytes)
-    {
-        std::string pattern = (std::filesystem::temp_directory_path() / "velmora-text-XXXXXX").string();
-        m_folder = ::mkdtemp(pattern.data());
-        std::ofstream(Path(), std::ios::binary) << bytes;
-    }
-    ~ScratchFile() { std::filesystem::remove_all(m_folder); }
-    std::string Path() const { return m_folder + "/file.txt"; }
-    std::string Folder() const { return m_folder; }
+    explicit TextFile(const std::string& bytes) : m_path(m_folder.Write("file.txt", bytes)) {}
+    const std::string& Path() const { return m_path; }
+    const std::string& Folder() const { return m_folder.Path(); }
 
 private:
-    std::string m_folder;
+    testsupport::ScratchFolder m_folder{"velmora-text"};
+    std::string m_path;
 };
 
 using testsupport::Utf16;
@@ -64,7 +60,7 @@ TEST(TextFileInput, GivesUtf8WhateverTheFileHolds)
         {"UTF-16 big endian without a mark", Utf16(utf8, true)},
     };
     for (const auto& c : cases) {
-        ScratchFile file(c.bytes);
+        TextFile file(c.bytes);
         for (size_t chunk : {1u, 3u, 7u, 65536u}) { // the surrogate pair and the mark meet every cut
             std::string error;
             EXPECT_EQ(ReadAll(file.Path(), chunk, error), utf8) << c.label << ", chunks of " << chunk;
@@ -75,7 +71,7 @@ TEST(TextFileInput, GivesUtf8WhateverTheFileHolds)
 
 TEST(TextFileInput, OnlyTheFirstMarkIsPassedOver)
 {
-    ScratchFile file("\xEF\xBB\xBF\xEF\xBB\xBFx");
+    TextFile file("\xEF\xBB\xBF\xEF\xBB\xBFx");
     std::string error;
     EXPECT_EQ(ReadAll(file.Path(), 64, error), "\xEF\xBB\xBFx");
 }
@@ -96,7 +92,7 @@ TEST(TextFileInput, RefusesWhatItCannotReadAsText)
         {"UTF-16 ending in a high surrogate", std::string("\xFF\xFEx\0\x00\xD8", 6), "unpaired surrogate"},
     };
     for (const auto& c : cases) {
-        ScratchFile file(c.bytes);
+        TextFile file(c.bytes);
         std::string error;
         ReadAll(file.Path(), 4096, error);
         EXPECT_NE(error.find(c.messagePart), std::string::npos) << c.label << ": " << error;
@@ -105,7 +101,7 @@ TEST(TextFileInput, RefusesWhatItCannotReadAsText)
 
 TEST(TextFileInput, OpensOnlyRegularFiles)
 {
-    ScratchFile file("x");
+    TextFile file("x");
     const std::string fifo = file.Folder() + "/fifo";
     ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
     const struct {
@@ -143,7 +139,7 @@ TEST(TextLineReader, WholeLinesAndCopiedLinesAgree)
             if (l + 1 < lines || random() % 2)
                 content += random() % 3 == 0 ? "\r\n" : "\n";
         }
-        ScratchFile file(content);
+        TextFile file(content);
         sys::TextLineReader whole(sys::TextLineReader::OverlongLine::TooLong, 16);
         sys::TextLineReader copied(sys::TextLineReader::OverlongLine::TooLong, 16);
         sys::TextLineReader cut(sys::TextLineReader::OverlongLine::TooLong, 16);
@@ -185,7 +181,7 @@ TEST(TextLineReader, WholeLinesAndCopiedLinesAgree)
 // A line without a line break within the limit is refused, in either wording, however it is read.
 TEST(TextLineReader, RefusesALineWithoutABreakWithinTheLimit)
 {
-    ScratchFile file("head\n" + std::string(sys::kLongestTextLine, 'x') + "\nnext\n");
+    TextFile file("head\n" + std::string(sys::kLongestTextLine, 'x') + "\nnext\n");
     using Wording = sys::TextLineReader::OverlongLine;
     for (Wording wording : {Wording::NoLineBreak, Wording::TooLong}) {
         sys::TextLineReader whole(wording), skipped(wording);
@@ -205,7 +201,7 @@ TEST(TextLineReader, RefusesALineWithoutABreakWithinTheLimit)
         }
     }
     // One byte less is a line.
-    ScratchFile longest(std::string(sys::kLongestTextLine - 1, 'x') + "\nnext");
+    TextFile longest(std::string(sys::kLongestTextLine - 1, 'x') + "\nnext");
     sys::TextLineReader reader;
     ASSERT_TRUE(reader.Open(longest.Path()));
     std::string_view line;

@@ -19,14 +19,6 @@ using sheettest::TempFile;
 
 namespace {
 
-std::string ReadBytes(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream bytes;
-    bytes << in.rdbuf();
-    return bytes.str();
-}
-
 // Rows of 12 cells: a date, then r * 0.25 + c; 65,536 rows make a 7.5 MB file with one DIFAT sector.
 const char* kXlwtRows = R"(
 import sys, datetime, xlwt
@@ -67,7 +59,7 @@ TEST(OtherWriters, XlwtWorkbookOf65536RowsReadsWholeThroughItsDifatChain)
     const std::string path = TempFile("xlwt-65536.xls");
     const pytools::Result made = pytools::Run(kXlwtRows, testsupport::ShellQuote(path) + " 65536 12");
     ASSERT_EQ(made.status, 0) << made.output;
-    const std::string bytes = ReadBytes(path);
+    const std::string bytes = testsupport::ReadFile(path);
     ASSERT_GE(bytes.size(), 512u);
     ASSERT_GE(Load32(reinterpret_cast<const unsigned char*>(bytes.data()) + 72), 1u) << "the file needs a DIFAT sector";
 
@@ -106,7 +98,7 @@ TEST(OtherWriters, EveryFaultOfADifatChainIsNamed)
     for (int i = 0; i < 8; ++i) // 8 MiB: 16,384 sectors, 130 table sectors, one DIFAT sector
         ASSERT_TRUE(writer.Append(block));
     ASSERT_TRUE(writer.Close("Workbook"));
-    const std::string good = ReadBytes(base);
+    const std::string good = testsupport::ReadFile(base);
     const auto field = [&](const std::string& bytes, size_t at) {
         return Load32(reinterpret_cast<const unsigned char*>(bytes.data()) + at);
     };

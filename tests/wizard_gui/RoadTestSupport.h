@@ -7,22 +7,15 @@
 #include "engine/ModuleHandle.h"
 #include "platform/harbor/qt/OverviewPage.h"
 #include "platform/wpx/Wpx.h"
+#include "tests/support/Files.h"
+#include "tests/support/ShellCommand.h"
 #include "wizard/SetupGui.h"
 
-#include <cstdlib>
-#include <fstream>
-#include <sstream>
-#include <sys/wait.h>
+#include <filesystem>
 
 namespace guitest {
 
-inline std::string ReadFile(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream text;
-    text << in.rdbuf();
-    return text.str();
-}
+using testsupport::ReadFile;
 
 // What a program of ours printed on standard output, and whether it exited with 0.
 struct ProgramRun {
@@ -70,8 +63,8 @@ protected:
         std::string command = "'" VELMORA_BIN_DIR "/" + program + "'";
         for (const std::string& argument : arguments)
             command += " '" + argument + "'";
-        const int status = std::system((command + " >'" + out + "' 2>'" + err + "'").c_str());
-        return {WIFEXITED(status) && WEXITSTATUS(status) == 0, ReadFile(out), ReadFile(err)};
+        const int status = testsupport::ShellStatus(command + " >'" + out + "' 2>'" + err + "'");
+        return {status == 0, ReadFile(out), ReadFile(err)};
     }
 
     // Runs the wizard as the plug-in's entry point does, then stores the new document and runs it

@@ -3,6 +3,8 @@
 // (as an automation tool would), and the host's code writes the document back. The wizard also
 // starts as a program of its own, on a real X server and offscreen.
 #include "tests/checks/CheckTestSupport.h"
+#include "tests/support/Files.h"
+#include "tests/support/ShellCommand.h"
 #include "tests/wizard_gui/QtTestApplication.h"
 
 #include "apps/velmora/WizardDocument.h"
@@ -30,19 +32,7 @@ using checktest::ScratchFolder;
 
 constexpr int kFinished = 12325;
 
-std::string ReadFile(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream text;
-    text << in.rdbuf();
-    return text.str();
-}
-
-int Shell(const std::string& command)
-{
-    const int status = std::system(command.c_str());
-    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-}
+using testsupport::ReadFile;
 
 [[maybe_unused]] testing::Environment* const g_application =
     testing::AddGlobalTestEnvironment(new QtTestApplication("velmora-host-tests"));
@@ -153,7 +143,7 @@ TEST_F(WizardCommand, FinishWritesANewDocumentWithNamesRelativeToItsFolderThatRu
 
     // The document works from anywhere, for the host program.
     const std::string err = scratch.File("run.err");
-    EXPECT_EQ(Shell("cd / && '" VELMORA_BIN_DIR "/velmora' run '" + document + "' 2>'" + err + "' >/dev/null"), 0);
+    EXPECT_EQ(testsupport::ShellStatus("cd / && '" VELMORA_BIN_DIR "/velmora' run '" + document + "' 2>'" + err + "' >/dev/null"), 0);
     EXPECT_NE(ReadFile(err).find("Status: OK"), std::string::npos) << ReadFile(err);
     EXPECT_TRUE(std::filesystem::exists(scratch.File("docs/data/converted.txt")));
 }
@@ -189,13 +179,13 @@ TEST_F(WizardCommand, ADamagedDocumentIsReportedAndNoWizardShows)
 TEST_F(WizardCommand, WithoutADisplayTheCommandSaysSoAndWithoutADocumentHowToUseIt)
 {
     const std::string err = scratch.File("err.txt");
-    EXPECT_EQ(Shell("env -u DISPLAY -u WAYLAND_DISPLAY -u QT_QPA_PLATFORM '" VELMORA_BIN_DIR "/velmora' wizard '" + document +
+    EXPECT_EQ(testsupport::ShellStatus("env -u DISPLAY -u WAYLAND_DISPLAY -u QT_QPA_PLATFORM '" VELMORA_BIN_DIR "/velmora' wizard '" + document +
                     "' 2>'" + err + "'"),
               1);
     EXPECT_NE(ReadFile(err).find("no display"), std::string::npos) << ReadFile(err);
     EXPECT_FALSE(std::filesystem::exists(document));
-    EXPECT_EQ(Shell("'" VELMORA_BIN_DIR "/velmora' wizard 2>/dev/null"), 2);
-    EXPECT_EQ(Shell("'" VELMORA_BIN_DIR "/velmora' wizard --help >/dev/null"), 0);
+    EXPECT_EQ(testsupport::ShellStatus("'" VELMORA_BIN_DIR "/velmora' wizard 2>/dev/null"), 2);
+    EXPECT_EQ(testsupport::ShellStatus("'" VELMORA_BIN_DIR "/velmora' wizard --help >/dev/null"), 0);
 }
 
 } // namespace
