@@ -1,22 +1,19 @@
 #pragma once
-// Test workbooks written with libxlsxwriter into the temporary folder.
-#include "platform/system/FileSystem.h"
+// Test workbooks written with libxlsxwriter into a scratch folder.
+#include "tests/support/ScratchFolder.h"
 
 #include <gtest/gtest.h>
 #include <xlsxwriter.h>
 
 #include <string>
-#include <unistd.h>
 #include <vector>
 
-// Writes one .xlsx file into the temporary folder and removes it again.
+// Writes one .xlsx file into a scratch folder of its own, removed with it.
 class XlsxFile {
 public:
     explicit XlsxFile(const std::string& name)
     {
-        std::string folder;
-        sys::GetTempPath(4096, folder);
-        path = folder + "velmora_xl_" + std::to_string(::getpid()) + "_" + name + ".xlsx";
+        path = m_folder.File(name + ".xlsx");
         m_book = workbook_new(path.c_str());
         m_twoDecimals = workbook_add_format(m_book);
         format_set_num_format(m_twoDecimals, "0.00");
@@ -25,11 +22,7 @@ public:
         m_time = workbook_add_format(m_book);
         format_set_num_format(m_time, "hh:mm:ss");
     }
-    ~XlsxFile()
-    {
-        Close();
-        sys::DeleteFile(path);
-    }
+    ~XlsxFile() { Close(); }
 
     lxw_worksheet* Sheet(int number)
     {
@@ -68,6 +61,7 @@ private:
     static lxw_row_t Row(int row) { return static_cast<lxw_row_t>(row - 1); }
     static lxw_col_t Col(int column) { return static_cast<lxw_col_t>(column - 1); }
 
+    testsupport::ScratchFolder m_folder{"velmora-xl"};
     lxw_workbook* m_book = nullptr;
     std::vector<lxw_worksheet*> m_sheets;
     lxw_format* m_twoDecimals = nullptr;

@@ -4,12 +4,11 @@
 #include "parsers/ExcelFilePreviewParser.h"
 #include "platform/system/FileSystem.h"
 #include "templates/ExcelSpecification.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <gtest/gtest.h>
 
-#include <fstream>
 #include <optional>
-#include <unistd.h>
 
 namespace {
 
@@ -44,10 +43,8 @@ class ExcelStampTest : public ::testing::TestWithParam<StampCase> {};
 TEST_P(ExcelStampTest, StampOfRow)
 {
     const StampCase& c = GetParam();
-    std::string folder;
-    sys::GetTempPath(4096, folder);
-    const std::string path = folder + "velmora_stamp_" + std::to_string(::getpid()) + ".xlsx";
-    std::ofstream(path) << "x";
+    const testsupport::ScratchFolder folder("velmora-stamp");
+    const std::string path = folder.Write("stamp.xlsx", "x");
     auto app = std::make_shared<fake::Application>();
     fake::Sheet& sheet = *app->AddWorkbook(path).sheets[0];
     if (c.cells.a)
@@ -75,7 +72,6 @@ TEST_P(ExcelStampTest, StampOfRow)
     EXPECT_EQ(parser.ReadRowDateTime(3, stamp), c.result);
     EXPECT_EQ(stamp, c.stamp);
     EXPECT_TRUE(silent.boxes.empty());
-    sys::DeleteFile(path);
 }
 
 const Cells kNone {};

@@ -2,6 +2,7 @@
 // data rows, end the data at the same row, and read sheets of any size. The sheets come from
 // openpyxl (the system's Python) and libxlsxwriter.
 #include "XlsxFile.h"
+#include "tests/support/ScratchFolder.h"
 #include "tests/tools/PythonTools.h"
 
 #include "converter/ConversionJob.h"
@@ -18,13 +19,6 @@
 #include <sstream>
 
 namespace {
-
-std::string TempFolder()
-{
-    std::string folder;
-    sys::GetTempPath(4096, folder);
-    return folder + "velmora_excel_writers_" + std::to_string(::getpid()) + "/";
-}
 
 // Each sheet has the engine's layout: types, units and value types in row 1, names in row 2, data
 // from row 3: one date-time and two values a row, then what the case puts below them.
@@ -69,8 +63,6 @@ EngineRead Convert(const std::string& input, const std::string& output)
 
 class OtherWritersTest : public ::testing::Test {
 protected:
-    void SetUp() override { std::filesystem::create_directories(m_folder); }
-    void TearDown() override { std::filesystem::remove_all(m_folder); }
 
     // The data rows the preview parser shows for `path` with a new template's defaults.
     int PreviewRows(const std::string& path)
@@ -84,7 +76,8 @@ protected:
         return static_cast<int>(parser.m_vecRows.size()) - 3; // after the three header rows
     }
 
-    const std::string m_folder = TempFolder();
+    const testsupport::ScratchFolder m_scratch{"velmora-excel-writers"};
+    const std::string m_folder = m_scratch.Path() + "/";
     ui::ScriptedUserInterface m_ui;
     ui::ScopedUserInterface m_scope {m_ui};
 };

@@ -4,12 +4,11 @@
 #include "platform/system/FileSystem.h"
 #include "resources/StringTable.h"
 #include "templates/ExcelSpecification.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <fstream>
-#include <unistd.h>
 
 namespace {
 
@@ -19,12 +18,7 @@ class ExcelParserTest : public ::testing::Test {
 protected:
     void SetUp() override
     {
-        std::string folder;
-        sys::GetTempPath(4096, folder);
-        std::string name = ::testing::UnitTest::GetInstance()->current_test_info()->name();
-        std::replace(name.begin(), name.end(), '/', '_');
-        m_path = folder + "velmora_excel_" + std::to_string(::getpid()) + "_" + name + ".xlsx";
-        std::ofstream(m_path) << "workbook stand-in";
+        m_path = m_scratch.Write("book.xlsx", "workbook stand-in");
         m_app = std::make_shared<fake::Application>();
         m_book = &m_app->AddWorkbook(m_path, 2);
         // Globals for the three header rows unless a test wants them read from the sheet.
@@ -39,7 +33,6 @@ protected:
     void TearDown() override
     {
         m_parser.reset();
-        sys::DeleteFile(m_path);
     }
 
     fake::Sheet& Sheet1() { return *m_book->sheets[0]; }
@@ -67,6 +60,7 @@ protected:
         return texts;
     }
 
+    testsupport::ScratchFolder m_scratch{"velmora-excel"};
     std::string m_path;
     std::shared_ptr<fake::Application> m_app;
     fake::Workbook* m_book = nullptr;

@@ -39,7 +39,6 @@ protected:
         m_spec.m_DataDesc.m_strDeleteValue = "-999.00";
         m_template = m_file.path + ".xml";
     }
-    void TearDown() override { sys::DeleteFile(m_template); }
 
     std::string Arguments(const std::string& more)
     {

@@ -9,8 +9,7 @@ namespace sheettest {
 
 std::string TempFile(const std::string& name)
 {
-    static const testsupport::ScratchFolder folder("velmora-sheet-test");
-    return folder.File(name);
+    return testsupport::ProgramScratchFile(name);
 }
 
 std::string DataFile(const std::string& name)

@@ -46,4 +46,10 @@ std::string ScratchFolder::MakeFolder(std::string_view name) const
     return path;
 }
 
+std::string ProgramScratchFile(std::string_view name)
+{
+    static const ScratchFolder folder("velmora-program");
+    return folder.File(name);
+}
+
 } // namespace testsupport

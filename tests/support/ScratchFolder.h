@@ -27,4 +27,8 @@ private:
     std::string m_path;
 };
 
+// The path of `name` in a scratch folder the whole program shares, removed when the program ends:
+// for files made once and used by many tests or benchmarks.
+std::string ProgramScratchFile(std::string_view name);
+
 } // namespace testsupport
