@@ -2,7 +2,7 @@
 // What the wizard tests share: input files of every format with a template each, written the way
 // users get them (the engine's own writers for text and rbx0, a spreadsheet library for .xlsx),
 // and a setup record pointed at a scratch temporary folder.
-#include "tests/checks/CheckTestSupport.h"
+#include "tests/engine/CheckTestSupport.h"
 
 #include "converter/AsciiSeriesWriter.h"
 #include "converter/RbxSeriesWriter.h"

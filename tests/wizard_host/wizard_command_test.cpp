@@ -2,7 +2,7 @@
 // process's Qt application, a script drives the wizard through the object names its controls carry
 // (as an automation tool would), and the host's code writes the document back. The wizard also
 // starts as a program of its own, on a real X server and offscreen.
-#include "tests/checks/CheckTestSupport.h"
+#include "tests/engine/CheckTestSupport.h"
 #include "tests/support/Files.h"
 #include "tests/support/ShellCommand.h"
 #include "tests/wizard_gui/QtTestApplication.h"

@@ -1,6 +1,6 @@
 // `velmora check DOC` run as a program on stored setups: one verdict line per check, exit status 0
 // only when every check passes.
-#include "tests/checks/CheckTestSupport.h"
+#include "tests/engine/CheckTestSupport.h"
 
 #include "converter/AsciiSeriesWriter.h"
 #include "converter/RbxSeriesWriter.h"

@@ -1,6 +1,6 @@
 // The real bridge component: its verdict on a template and a data file must be what the conversion
 // engine does with the same files, for every input format.
-#include "tests/checks/CheckTestSupport.h"
+#include "tests/engine/CheckTestSupport.h"
 
 #include "converter/AsciiSeriesWriter.h"
 #include "converter/Converter.h"

@@ -1,6 +1,6 @@
 // The setup record's working objects (SetInput, SetTemplate, SetItems, ResetSetup) and working files
 // (preview file, working template, LoadTemplate, ParseInputFile, ReadItemNames, MakeWorkTemplateName).
-#include "tests/checks/CheckTestSupport.h"
+#include "tests/engine/CheckTestSupport.h"
 
 #include "engine/Engine.h"
 #include "parsers/AsciiFilePreviewParser.h"

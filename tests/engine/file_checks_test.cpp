@@ -1,5 +1,5 @@
 // FolderExists, CheckFileExtension and IsTextFile: the checks of a path against the file system.
-#include "tests/checks/CheckTestSupport.h"
+#include "tests/engine/CheckTestSupport.h"
 
 #include "engine/Engine.h"
 #include "resources/StringTable.h"

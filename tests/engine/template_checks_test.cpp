@@ -1,6 +1,6 @@
 // BridgeAccepts, FindMatchingFile, VerifyTemplate and VerifyOutput, with a recording bridge component
 // in place of the real one so that what the engine asks it is visible.
-#include "tests/checks/CheckTestSupport.h"
+#include "tests/engine/CheckTestSupport.h"
 
 #include "engine/Engine.h"
 #include "resources/StringTable.h"
