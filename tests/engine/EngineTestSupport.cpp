@@ -18,6 +18,16 @@ std::string WriteRecordingEngine(const ScratchFolder& folder, const std::string&
     return path;
 }
 
+void ExpectFirstChoices(const CEngine& engine)
+{
+    EXPECT_EQ(engine.m_bConstraintsApplied, 0);
+    EXPECT_EQ(engine.m_nInputType, 1);
+    EXPECT_EQ(engine.m_nInputFormat, 1);
+    EXPECT_EQ(engine.m_nTemplateOption, 1);
+    EXPECT_EQ(engine.m_nOutputFormat, 1);
+    EXPECT_EQ(engine.m_bParsed, 0);
+}
+
 WPXHANDLE UseDocument(const std::string& text)
 {
     WPXHANDLE doc = nullptr;

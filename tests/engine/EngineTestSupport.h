@@ -1,6 +1,7 @@
 #pragma once
 // Helpers the engine tests share: a small template class, an engine program stand-in that records
 // how it was started, and the module's current document.
+#include "engine/Engine.h"
 #include "platform/wpx/Wpx.h"
 #include "templates/Specification.h"
 #include "tests/support/Files.h"
@@ -31,6 +32,10 @@ public:
 // to <folder>/args.txt, copies its first argument to <folder>/setup-copy.wpx and exits with
 // $ENGINE_TEST_EXIT (0 when unset). Returns its path.
 std::string WriteRecordingEngine(const ScratchFolder& folder, const std::string& name = "engine.sh");
+
+// The choices of a setup no one has made yet: one input file, the first input and output formats,
+// a template file, nothing parsed and no constraints applied.
+void ExpectFirstChoices(const CEngine& engine);
 
 // Parses a document and makes it the module's current one; returns its handle.
 WPXHANDLE UseDocument(const std::string& text);

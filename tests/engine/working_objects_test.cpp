@@ -1,6 +1,7 @@
 // The setup record's working objects (SetInput, SetTemplate, SetItems, ResetSetup) and working files
 // (preview file, working template, LoadTemplate, ParseInputFile, ReadItemNames, MakeWorkTemplateName).
 #include "tests/engine/CheckTestSupport.h"
+#include "tests/engine/EngineTestSupport.h"
 
 #include "engine/Engine.h"
 #include "parsers/AsciiFilePreviewParser.h"
@@ -195,12 +196,7 @@ TEST(ResetSetup, RestoresDefaultsButKeepsItemsBridgesWorkTemplateAndObjects)
     CSpecification* spec = engine.m_pSpecification.get();
 
     engine.ResetSetup();
-    EXPECT_EQ(engine.m_bConstraintsApplied, 0);
-    EXPECT_EQ(engine.m_nInputType, 1);
-    EXPECT_EQ(engine.m_nInputFormat, 1);
-    EXPECT_EQ(engine.m_nTemplateOption, 1);
-    EXPECT_EQ(engine.m_nOutputFormat, 1);
-    EXPECT_EQ(engine.m_bParsed, 0);
+    enginetest::ExpectFirstChoices(engine);
     for (const CString* field : {&engine.m_strInputFile, &engine.m_strInputFolder, &engine.m_strTemplateName,
                                  &engine.m_strOutputFile, &engine.m_strOutputFolder, &engine.m_strOutputTitle,
                                  &engine.m_strPreviewFile})

@@ -18,39 +18,17 @@ namespace {
 
 using parsertest::MessageIds;
 
+using testsupport::Contains;
 using testsupport::Utf16;
 
-using testsupport::Contains;
-
-class PreviewInputTest : public ::testing::Test {
+class PreviewInputTest : public parsertest::AsciiParserFixture {
 protected:
-    PreviewInputTest()
-    {
-        parser.m_pSpecification = &spec;
-        spec.m_DataDesc.m_nUnitTypeOption = 0;
-        spec.m_DataDesc.m_nUnitOption = 0;
-        spec.m_DataDesc.m_nValueTypeOption = 0;
-    }
-
-    std::string Bind(const std::string& content)
-    {
-        const std::string path = folder.Write("data.txt", content);
-        parser.SetFile(path);
-        return path;
-    }
-
     // Names on line 1, data from line 2.
     void NamesOnLineOne()
     {
         spec.m_DataDesc.m_nItemDescriptionRow = 1;
         spec.m_DataDesc.m_nStartRow = 2;
     }
-
-    testsupport::ScratchFolder folder;
-    ui::ScriptedUserInterface ui;
-    ui::ScopedUserInterface scope{ui};
-    CAsciiSpecification spec;
-    CAsciiFilePreviewParser parser;
 };
 
 TEST_F(PreviewInputTest, ByteOrderMarksAndUtf16AreReadAsText)
