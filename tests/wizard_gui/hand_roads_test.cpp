@@ -1,6 +1,7 @@
 // The roads of the wizard that describe a file by hand or change a template, clicked through on
 // the real widgets: each ends in Finish, a template file that `velmora template show` reads back
 // with the values entered, and a document that `velmora run` converts with the expected values.
+#include "tests/support/XlsxWorkbook.h"
 #include "tests/wizard_gui/RoadTestSupport.h"
 
 #include "wizard/DataDescSettingPage.h"
@@ -214,22 +215,19 @@ TEST_F(HandRoads, AsciiWithNamesTypesUnitsAndValueTypesDefinedInTheGrid)
 // A workbook whose dates and times are texts in two cells, read with the date/time format.
 void WriteTextStampWorkbook(const std::string& path)
 {
-    lxw_workbook* workbook = workbook_new(path.c_str());
-    ASSERT_NE(workbook, nullptr);
-    lxw_worksheet* sheet = workbook_add_worksheet(workbook, nullptr);
-    worksheet_write_string(sheet, 0, 2, "Water Level[m]:Instantaneous", nullptr);
-    worksheet_write_string(sheet, 0, 3, "Rainfall[mm]:Accumulated", nullptr);
+    testsupport::XlsxWorkbook book(path);
+    book.Text(1, 3, "Water Level[m]:Instantaneous");
+    book.Text(1, 4, "Rainfall[mm]:Accumulated");
     const char* names[] = {"Date", "Time", "Level", "Rain"};
-    for (lxw_col_t column = 0; column < 4; ++column)
-        worksheet_write_string(sheet, 1, column, names[column], nullptr);
+    for (int column = 1; column <= 4; ++column)
+        book.Text(2, column, names[column - 1]);
     for (int step = 0; step < 3; ++step) {
-        const auto row = static_cast<lxw_row_t>(2 + step);
-        worksheet_write_string(sheet, row, 0, "2021-03-01", nullptr);
-        worksheet_write_string(sheet, row, 1, ("0" + std::to_string(step) + ":30:00").c_str(), nullptr);
-        worksheet_write_number(sheet, row, 2, 1.5 + step, nullptr);
-        worksheet_write_number(sheet, row, 3, 0.25 * step, nullptr);
+        book.Text(3 + step, 1, "2021-03-01");
+        book.Text(3 + step, 2, "0" + std::to_string(step) + ":30:00");
+        book.Number(3 + step, 3, 1.5 + step);
+        book.Number(3 + step, 4, 0.25 * step);
     }
-    ASSERT_EQ(workbook_close(workbook), LXW_NO_ERROR);
+    ASSERT_TRUE(book.Close());
 }
 
 TEST_F(HandRoads, ExcelWithTheDateAndTimeTextsReadByTheFormat)

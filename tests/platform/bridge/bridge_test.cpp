@@ -1,6 +1,7 @@
 // The real bridge component: its verdict on a template and a data file must be what the conversion
 // engine does with the same files, for every input format.
 #include "tests/engine/CheckTestSupport.h"
+#include "tests/support/XlsxWorkbook.h"
 
 #include "converter/AsciiSeriesWriter.h"
 #include "converter/Converter.h"
@@ -16,7 +17,6 @@
 
 #include <filesystem>
 
-#include <xlsxwriter.h>
 
 using checktest::ScratchFolder;
 
@@ -46,23 +46,18 @@ void WriteSeries(converter::SeriesWriter& writer, const std::string& path)
 // in the layout a new Excel template reads.
 void WriteWorkbook(const std::string& path)
 {
-    lxw_workbook* workbook = workbook_new(path.c_str());
-    ASSERT_NE(workbook, nullptr);
-    lxw_worksheet* sheet = workbook_add_worksheet(workbook, nullptr);
-    lxw_format* date = workbook_add_format(workbook);
-    format_set_num_format(date, "yyyy/mm/dd hh:mm:ss");
-    worksheet_write_string(sheet, 0, 1, "Water level[m]:Instantaneous", nullptr);
-    worksheet_write_string(sheet, 0, 2, "Discharge[m^3/s]:Instantaneous", nullptr);
-    worksheet_write_string(sheet, 1, 0, "Date/time", nullptr);
-    worksheet_write_string(sheet, 1, 1, "Level", nullptr);
-    worksheet_write_string(sheet, 1, 2, "Flow", nullptr);
+    testsupport::XlsxWorkbook book(path);
+    book.Text(1, 2, "Water level[m]:Instantaneous");
+    book.Text(1, 3, "Discharge[m^3/s]:Instantaneous");
+    book.Text(2, 1, "Date/time");
+    book.Text(2, 2, "Level");
+    book.Text(2, 3, "Flow");
     for (int step = 0; step < 3; ++step) {
-        lxw_datetime stamp = {2021, 1, 1, step, 0, 0.0};
-        worksheet_write_datetime(sheet, static_cast<lxw_row_t>(2 + step), 0, &stamp, date);
-        worksheet_write_number(sheet, static_cast<lxw_row_t>(2 + step), 1, 1.5 + step, nullptr);
-        worksheet_write_number(sheet, static_cast<lxw_row_t>(2 + step), 2, 2.5 * step, nullptr);
+        book.DateTime(3 + step, 1, lxw_datetime{2021, 1, 1, step, 0, 0.0}, "yyyy/mm/dd hh:mm:ss");
+        book.Number(3 + step, 2, 1.5 + step);
+        book.Number(3 + step, 3, 2.5 * step);
     }
-    ASSERT_EQ(workbook_close(workbook), LXW_NO_ERROR);
+    ASSERT_TRUE(book.Close());
 }
 
 struct Verdict {
