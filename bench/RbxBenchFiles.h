@@ -4,11 +4,11 @@
 #include "bench/PeakMemory.h"
 #include "platform/rbx/RbxWriter.h"
 #include "platform/units/Units.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <fstream>
 #include <map>
 #include <string>
-#include <unistd.h>
 
 namespace benchfiles {
 
@@ -20,7 +20,7 @@ inline std::string MakeRbxFile(long steps)
     static std::map<long, std::string> made;
     if (auto found = made.find(steps); found != made.end())
         return found->second;
-    const std::string path = "/tmp/velmora-bench-" + std::to_string(::getpid()) + "-" + std::to_string(steps) + ".rbx0";
+    const std::string path = testsupport::ProgramScratchFile(std::to_string(steps) + ".rbx0");
     rbx::FileDefinition definition;
     definition.timeUnitKey = units::kUnitSecond;
     definition.calendarStart = COleDateTime(2000, 1, 1, 0, 0, 0);

@@ -2,22 +2,20 @@
 // a parse of files with one very long line in the header and with very wide data lines.
 #include "parsers/AsciiFilePreviewParser.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <benchmark/benchmark.h>
 
 #include <cstdio>
 #include <fstream>
 #include <string>
-#include <unistd.h>
 
 namespace {
-
-std::string TempPath(const char* name) { return "/tmp/velmora-bench-" + std::to_string(::getpid()) + "-" + name; }
 
 // A comment line of `bytes` characters, the name line, then 1000 short data lines.
 std::string LongCommentFile(long bytes)
 {
-    const std::string path = TempPath("comment.txt");
+    const std::string path = testsupport::ProgramScratchFile("comment.txt");
     std::ofstream out(path, std::ios::binary);
     out << std::string(static_cast<size_t>(bytes), 'x') << "\nTime\tA\tB\n";
     for (int i = 0; i < 1000; ++i)
@@ -28,7 +26,7 @@ std::string LongCommentFile(long bytes)
 // Names and data lines with `items` item columns (about 5 bytes a field).
 std::string WideFile(long items)
 {
-    const std::string path = TempPath("wide.txt");
+    const std::string path = testsupport::ProgramScratchFile("wide.txt");
     std::ofstream out(path, std::ios::binary);
     out << "header\nTime";
     for (long i = 0; i < items; ++i)

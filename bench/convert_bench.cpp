@@ -6,6 +6,7 @@
 #include "converter/NumberText.h"
 #include "converter/StampText.h"
 #include "templates/Specification.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <benchmark/benchmark.h>
 
@@ -17,7 +18,6 @@
 #include <random>
 #include <string>
 #include <sys/resource.h>
-#include <unistd.h>
 
 namespace {
 
@@ -31,12 +31,8 @@ size_t Rows()
 
 fs::path Folder()
 {
-    static const fs::path folder = [] {
-        fs::path path = fs::temp_directory_path() / ("velmora-bench-" + std::to_string(::getpid()));
-        fs::create_directories(path);
-        return path;
-    }();
-    return folder;
+    static const testsupport::ScratchFolder folder("velmora-bench");
+    return folder.Path();
 }
 
 std::string MakeText(size_t rows)
@@ -239,6 +235,5 @@ int main(int argc, char** argv)
     benchmark::Initialize(&argc, argv);
     benchmark::RunSpecifiedBenchmarks();
     benchmark::Shutdown();
-    fs::remove_all(Folder());
     return 0;
 }

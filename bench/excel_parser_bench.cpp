@@ -6,6 +6,7 @@
 #include "templates/ExcelSpecification.h"
 
 #include "PeakMemory.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <benchmark/benchmark.h>
 #include <xlsxwriter.h>
@@ -13,7 +14,6 @@
 #include <cstdio>
 #include <fstream>
 #include <string>
-#include <unistd.h>
 
 namespace {
 
@@ -21,7 +21,7 @@ constexpr int kRows = 5000;
 
 std::string WriteWorkbook(int items)
 {
-    const std::string path = "/tmp/velmora_excel_bench_" + std::to_string(getpid()) + "_" + std::to_string(items) + ".xlsx";
+    const std::string path = testsupport::ProgramScratchFile(std::to_string(items) + ".xlsx");
     lxw_workbook* book = workbook_new(path.c_str());
     lxw_worksheet* sheet = workbook_add_worksheet(book, nullptr);
     lxw_format* date = workbook_add_format(book);
@@ -80,7 +80,7 @@ using benchmemory::StatusKilobytes;
 // `items` values, written row by row (libxlsxwriter's constant memory mode).
 std::string WriteEngineLayout(const std::string& name, int rows, int items)
 {
-    const std::string path = "/tmp/velmora_excel_bench_" + std::to_string(getpid()) + "_" + name + ".xlsx";
+    const std::string path = testsupport::ProgramScratchFile(name + ".xlsx");
     lxw_workbook_options options{};
     options.constant_memory = LXW_TRUE;
     lxw_workbook* book = workbook_new_opt(path.c_str(), &options);

@@ -2,12 +2,12 @@
 // counters report rows (steps) per second.
 #include "platform/rbx/RbxReader.h"
 #include "platform/rbx/RbxWriter.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <benchmark/benchmark.h>
 
 #include <cstdio>
 #include <string>
-#include <unistd.h>
 #include <vector>
 
 namespace {
@@ -15,7 +15,7 @@ namespace {
 constexpr std::size_t kSteps = 1000000;
 constexpr std::size_t kItems = 10;
 
-std::string BenchPath() { return "/tmp/velmora_rbx_bench_" + std::to_string(getpid()) + ".rbx0"; }
+std::string BenchPath() { return testsupport::ProgramScratchFile("bench.rbx0"); }
 
 rbx::FileDefinition Definition()
 {

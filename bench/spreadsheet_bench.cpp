@@ -7,6 +7,7 @@
 #include "formats/workbook/NumberFormat.h"
 #include "formats/workbook/WorkbookReader.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <benchmark/benchmark.h>
 #include <xlsxwriter.h>
@@ -15,29 +16,17 @@
 #include <map>
 #include <string>
 #include <sys/resource.h>
-#include <unistd.h>
 
 namespace {
 
 constexpr int kColumns = 5;
 
-// The workbooks made for this run, removed when the program ends.
-struct MadeFiles {
-    std::map<long, std::string> paths;
-    ~MadeFiles()
-    {
-        for (const auto& [rows, path] : paths)
-            std::remove(path.c_str());
-    }
-};
-
 std::string MakeWorkbook(long rows)
 {
-    static MadeFiles files;
-    auto& made = files.paths;
+    static std::map<long, std::string> made;
     if (auto found = made.find(rows); found != made.end())
         return found->second;
-    const std::string path = "/tmp/velmora-sheet-bench-" + std::to_string(::getpid()) + "-" + std::to_string(rows) + ".xlsx";
+    const std::string path = testsupport::ProgramScratchFile(std::to_string(rows) + ".xlsx");
     lxw_workbook_options options{};
     options.constant_memory = LXW_TRUE;
     lxw_workbook* book = workbook_new_opt(path.c_str(), &options);

@@ -4,11 +4,11 @@
 #include "parsers/AsciiFilePreviewParser.h"
 #include "parsers/FileException.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/ScratchFile.h"
 
 #include <cstdint>
 #include <cstdio>
 #include <string>
-#include <unistd.h>
 
 namespace {
 
@@ -53,12 +53,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
 {
     if (size < kSettingBytes)
         return 0;
-    static const std::string path = "/tmp/velmora-ascii-fuzz-" + std::to_string(::getpid()) + ".txt";
-    FILE* file = std::fopen(path.c_str(), "wb");
-    if (!file)
+    const testsupport::ScratchFile input("velmora-ascii-fuzz", ".txt", data + kSettingBytes, size - kSettingBytes);
+    if (input.Path().empty())
         return 0;
-    std::fwrite(data + kSettingBytes, 1, size - kSettingBytes, file);
-    std::fclose(file);
+    const std::string& path = input.Path();
 
     ui::SilentUserInterface silent;
     ui::ScopedUserInterface scope(silent);

@@ -7,12 +7,12 @@
 #include "platform/system/OleDateTime.h"
 #include "platform/ui/UserInterface.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/ScratchFile.h"
 
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <string>
-#include <unistd.h>
 
 namespace {
 
@@ -72,12 +72,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
 {
     static ui::SilentUserInterface silent;
     static ui::ScopedUserInterface scope(silent);
-    static const std::string path = "/tmp/convert_ascii_fuzz_" + std::to_string(::getpid()) + ".txt";
-    std::FILE* file = std::fopen(path.c_str(), "wb");
-    if (!file)
+    const testsupport::ScratchFile input("velmora-convert-ascii-fuzz", ".txt", data, size);
+    if (input.Path().empty())
         return 0;
-    std::fwrite(data, 1, size, file);
-    std::fclose(file);
+    const std::string& path = input.Path();
 
     CAsciiSpecification defaults;
     ReadWhole(defaults, path);
@@ -100,6 +98,5 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
         CompareStamps(text.substr(start, end - start));
         start = end + 1;
     }
-    std::remove(path.c_str());
     return 0;
 }

@@ -4,12 +4,12 @@
 #include "converter/AsciiSeriesReader.h"
 #include "platform/ui/UserInterface.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/ScratchFile.h"
 
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <string>
-#include <unistd.h>
 #include <vector>
 
 namespace {
@@ -112,12 +112,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
         return 0;
     static ui::SilentUserInterface silent;
     static ui::ScopedUserInterface scope(silent);
-    static const std::string path = "/tmp/convert_ascii_passes_fuzz_" + std::to_string(::getpid()) + ".txt";
-    std::FILE* file = std::fopen(path.c_str(), "wb");
-    if (!file)
+    const testsupport::ScratchFile input("velmora-convert-ascii-passes-fuzz", ".txt", data + kSettingBytes, size - kSettingBytes);
+    if (input.Path().empty())
         return 0;
-    std::fwrite(data + kSettingBytes, 1, size - kSettingBytes, file);
-    std::fclose(file);
+    const std::string& path = input.Path();
 
     CAsciiSpecification spec;
     ApplySettings(data, spec);
@@ -127,6 +125,5 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
     const Reading split = ReadAll(spec, path, false, false, pick);
     if (!SameReading(blocks, split) || !SameReading(fused, split))
         __builtin_trap();
-    std::remove(path.c_str());
     return 0;
 }

@@ -4,12 +4,12 @@
 #include "converter/ExcelSeriesReader.h"
 #include "platform/ui/UserInterface.h"
 #include "templates/ExcelSpecification.h"
+#include "tests/support/ScratchFile.h"
 
 #include <cstdint>
 #include <cstdio>
 #include <exception>
 #include <string>
-#include <unistd.h>
 
 namespace {
 
@@ -36,12 +36,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
 {
     static ui::SilentUserInterface silent;
     static ui::ScopedUserInterface scope(silent);
-    static const std::string path = "/tmp/convert_excel_fuzz_" + std::to_string(::getpid()) + ".xlsx";
-    std::FILE* file = std::fopen(path.c_str(), "wb");
-    if (!file)
+    const testsupport::ScratchFile input("velmora-convert-excel-fuzz", ".xlsx", data, size);
+    if (input.Path().empty())
         return 0;
-    std::fwrite(data, 1, size, file);
-    std::fclose(file);
+    const std::string& path = input.Path();
 
     // The conversion catches what the libraries throw and reports it for the file.
     try {
@@ -59,6 +57,5 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
         ReadWhole(names, path, size % 2 == 1);
     } catch (const std::exception&) {
     }
-    std::remove(path.c_str());
     return 0;
 }

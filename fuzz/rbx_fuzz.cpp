@@ -1,33 +1,17 @@
 // Feeds arbitrary bytes to the rbx0 reader and the rbx calls. With the first byte odd, the checksums
 // are repaired first, so that mutations get past them into the header and data checks.
-#include "checksums/Crc32.h"
 #include "platform/rbx/Rbx.h"
-#include "platform/rbx/RbxHeaderCodec.h"
 #include "platform/rbx/RbxReader.h"
+#include "tests/support/RbxChecksums.h"
+#include "tests/support/ScratchFile.h"
 
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <string>
-#include <unistd.h>
 #include <vector>
 
 namespace {
-
-void RepairChecksums(std::vector<unsigned char>& bytes)
-{
-    if (bytes.size() < rbx::kFixedHeaderSize)
-        return;
-    std::uint32_t headerSize = 0;
-    std::memcpy(&headerSize, bytes.data() + rbx::layout::kHeaderSize, 4);
-    if (headerSize < rbx::kFixedHeaderSize || headerSize > bytes.size())
-        return;
-    const std::uint32_t dataCrc = checksum::Crc32(0, bytes.data() + headerSize, bytes.size() - headerSize);
-    std::memcpy(bytes.data() + rbx::layout::kDataChecksum, &dataCrc, 4);
-    std::memset(bytes.data() + rbx::layout::kHeaderChecksum, 0, 4);
-    const std::uint32_t headerCrc = checksum::Crc32(0, bytes.data(), headerSize);
-    std::memcpy(bytes.data() + rbx::layout::kHeaderChecksum, &headerCrc, 4);
-}
 
 void ReadWithTheReader(const std::string& path, rbx::VerifyChecksum verify)
 {
@@ -72,12 +56,11 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
         return 0;
     std::vector<unsigned char> bytes(data + 1, data + size);
     if (data[0] & 1)
-        RepairChecksums(bytes);
-    static const std::string path = "/tmp/rbx_fuzz_" + std::to_string(getpid()) + ".rbx0";
-    if (std::FILE* f = std::fopen(path.c_str(), "wb")) {
-        std::fwrite(bytes.data(), 1, bytes.size(), f);
-        std::fclose(f);
-    }
+        testsupport::RepairRbxChecksums(bytes);
+    const testsupport::ScratchFile input("velmora-rbx-fuzz", ".rbx0", bytes.data(), bytes.size());
+    if (input.Path().empty())
+        return 0;
+    const std::string& path = input.Path();
     ReadWithTheReader(path, (data[0] & 2) ? rbx::VerifyChecksum::AtOpen : rbx::VerifyChecksum::AtEnd);
     ReadWithTheCalls(path);
     return 0;

@@ -4,33 +4,14 @@
 // and past the last item).
 #include "checksums/Crc32.h"
 #include "converter/RbxSeriesReader.h"
-#include "platform/rbx/RbxHeaderCodec.h"
+#include "tests/support/RbxChecksums.h"
+#include "tests/support/ScratchFile.h"
 
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <string>
-#include <unistd.h>
 #include <vector>
-
-namespace {
-
-void RepairChecksums(std::vector<unsigned char>& bytes)
-{
-    if (bytes.size() < rbx::kFixedHeaderSize)
-        return;
-    std::uint32_t headerSize = 0;
-    std::memcpy(&headerSize, bytes.data() + rbx::layout::kHeaderSize, 4);
-    if (headerSize < rbx::kFixedHeaderSize || headerSize > bytes.size())
-        return;
-    const std::uint32_t dataCrc = checksum::Crc32(0, bytes.data() + headerSize, bytes.size() - headerSize);
-    std::memcpy(bytes.data() + rbx::layout::kDataChecksum, &dataCrc, 4);
-    std::memset(bytes.data() + rbx::layout::kHeaderChecksum, 0, 4);
-    const std::uint32_t headerCrc = checksum::Crc32(0, bytes.data(), headerSize);
-    std::memcpy(bytes.data() + rbx::layout::kHeaderChecksum, &headerCrc, 4);
-}
-
-} // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
 {
@@ -38,12 +19,11 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
         return 0;
     std::vector<unsigned char> bytes(data + 1, data + size);
     if (data[0] & 1)
-        RepairChecksums(bytes);
-    static const std::string path = "/tmp/rbx_series_fuzz_" + std::to_string(getpid()) + ".rbx0";
-    if (std::FILE* f = std::fopen(path.c_str(), "wb")) {
-        std::fwrite(bytes.data(), 1, bytes.size(), f);
-        std::fclose(f);
-    }
+        testsupport::RepairRbxChecksums(bytes);
+    const testsupport::ScratchFile input("velmora-rbx-series-fuzz", ".rbx0", bytes.data(), bytes.size());
+    if (input.Path().empty())
+        return 0;
+    const std::string& path = input.Path();
     converter::RbxSeriesReader reader;
     if (!reader.Open(path))
         return 0;

@@ -4,10 +4,10 @@
 #include "formats/workbook/NumberFormat.h"
 #include "platform/spreadsheet/SpreadsheetApplication.h"
 
+#include "tests/support/ScratchFile.h"
+
 #include <cstdint>
-#include <cstdio>
 #include <string>
-#include <unistd.h>
 
 namespace {
 
@@ -17,23 +17,6 @@ void RenderFormat(const std::string& code)
     for (double value : {0.0, -1.5, 44333.75, 1e300, -1e-300, 0.5})
         format.RenderNumber(value);
     format.RenderText("text");
-}
-
-std::string WriteTemporary(const uint8_t* data, size_t size)
-{
-    char path[] = "/tmp/velmora_spreadsheet_fuzz_XXXXXX";
-    int fd = mkstemp(path);
-    if (fd < 0)
-        return std::string();
-    size_t written = 0;
-    while (written < size) {
-        ssize_t n = write(fd, data + written, size - written);
-        if (n <= 0)
-            break;
-        written += static_cast<size_t>(n);
-    }
-    close(fd);
-    return path;
 }
 
 void WalkWorkbook(const std::string& path)
@@ -70,10 +53,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
         RenderFormat(std::string(reinterpret_cast<const char*>(data) + 1, size - 1));
         return 0;
     }
-    std::string path = WriteTemporary(data, size);
-    if (path.empty())
-        return 0;
-    WalkWorkbook(path);
-    unlink(path.c_str());
+    const testsupport::ScratchFile input("velmora-spreadsheet-fuzz", "", data, size);
+    if (!input.Path().empty())
+        WalkWorkbook(input.Path());
     return 0;
 }

@@ -2,25 +2,19 @@
 // in odd-sized chunks, under small limits so hostile sizes are refused quickly.
 #include "formats/xlsx/ZipReader.h"
 
+#include "tests/support/ScratchFile.h"
+
 #include <cstdint>
-#include <cstdio>
-#include <string>
-#include <unistd.h>
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
 {
-    char path[] = "/tmp/velmora_zip_fuzz_XXXXXX";
-    int fd = mkstemp(path);
-    if (fd < 0)
-        return 0;
-    bool complete = write(fd, data, size) == static_cast<ssize_t>(size);
-    close(fd);
-    if (complete) {
+    const testsupport::ScratchFile input("velmora-zip-fuzz", "", data, size);
+    if (!input.Path().empty()) {
         sheet::ImportLimits limits;
         limits.maxEntryBytes = 8 << 20;
         limits.maxUncompressedBytes = 16 << 20;
         try {
-            sheet::ZipReader package(path, limits);
+            sheet::ZipReader package(input.Path(), limits);
             char buffer[997];
             for (const sheet::ZipReader::Entry& entry : package.Entries()) {
                 auto part = package.Open(entry);
@@ -30,6 +24,5 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
         } catch (const sheet::AutomationError&) {
         }
     }
-    unlink(path);
     return 0;
 }

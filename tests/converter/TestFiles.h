@@ -1,58 +1,26 @@
 #pragma once
-// Scratch folders, small files and templates for the converter tests.
+// Runs, templates and series writes the converter tests share.
 #include "converter/ConversionJob.h"
 #include "converter/SeriesWriter.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/Files.h"
+#include "tests/support/ScratchFolder.h"
 
-#include <filesystem>
-#include <fstream>
-#include <sstream>
 #include <string>
-#include <unistd.h>
+#include <vector>
 
 namespace convtest {
 
-class ScratchFolder {
-public:
-    ScratchFolder()
-    {
-        static int counter = 0;
-        m_path = std::filesystem::temp_directory_path() /
-                 ("velmora-conv-" + std::to_string(::getpid()) + "-" + std::to_string(counter++));
-        std::filesystem::remove_all(m_path);
-        std::filesystem::create_directories(m_path);
-    }
-    ~ScratchFolder() { std::filesystem::remove_all(m_path); }
-    std::string Path(const std::string& name) const { return (m_path / name).string(); }
-    std::string Root() const { return m_path.string(); }
-
-private:
-    std::filesystem::path m_path;
-};
-
 // A run over the ASCII files of <folder>/in into rbx0 files in <folder>/out.
-inline converter::JobSetup AsciiFolderToRbx0(const ScratchFolder& folder)
+inline converter::JobSetup AsciiFolderToRbx0(const testsupport::ScratchFolder& folder)
 {
     converter::JobSetup setup;
     setup.inputType = 2;
     setup.inputFormat = 2;
-    setup.inputFolder = folder.Path("in");
+    setup.inputFolder = folder.File("in");
     setup.outputFormat = 1;
-    setup.outputFolder = folder.Path("out");
+    setup.outputFolder = folder.File("out");
     return setup;
-}
-
-inline void WriteFile(const std::string& path, const std::string& content)
-{
-    std::ofstream(path, std::ios::binary) << content;
-}
-
-inline std::string ReadFile(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream s;
-    s << in.rdbuf();
-    return s.str();
 }
 
 // A template whose items are described globally, so only names and data come from the file.

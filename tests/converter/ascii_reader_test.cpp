@@ -19,9 +19,9 @@ struct Read {
 
 Read ReadAll(const CSpecification& spec, const std::string& content)
 {
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("input.txt");
-    convtest::WriteFile(path, content);
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("input.txt");
+    testsupport::WriteFile(path, content);
     AsciiSeriesReader reader(spec);
     Read result;
     result.status = reader.Open(path);
@@ -111,10 +111,10 @@ TEST(AsciiSeriesReader, DeleteValueAndDecimalComma)
 TEST(AsciiSeriesReader, SelectionReadsOnlyTheChosenItemsInOrder)
 {
     CAsciiSpecification spec = GlobalSpec();
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("f.txt"), "T\tA\tB\tC\n2020/01/01 00:00:00\t1\tnot a number\t3\n");
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("f.txt"), "T\tA\tB\tC\n2020/01/01 00:00:00\t1\tnot a number\t3\n");
     AsciiSeriesReader reader(spec);
-    ASSERT_TRUE(reader.Open(folder.Path("f.txt")));
+    ASSERT_TRUE(reader.Open(folder.File("f.txt")));
     reader.Select({2, 0});
     Row row;
     ASSERT_TRUE(reader.Next(row)) << reader.status().problem().Describe();

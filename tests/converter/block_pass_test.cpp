@@ -223,9 +223,9 @@ void ExpectSame(const Outcome& a, const Outcome& b, const std::string& content)
 void ExpectPassesAgree(const CSpecification& spec, const std::string& content,
                        const std::vector<size_t>* selection = nullptr)
 {
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("in.txt");
-    convtest::WriteFile(path, content);
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("in.txt");
+    testsupport::WriteFile(path, content);
     const Outcome blocks = ReadWith(spec, path, Pass::Blocks, selection);
     ExpectSame(blocks, ReadWith(spec, path, Pass::Splitter, selection), content);
     ExpectSame(blocks, ReadWith(spec, path, Pass::Fields, selection), content);
@@ -359,9 +359,9 @@ TEST(BlockPass, EdgeLinesAgreeWithTheOtherPasses)
 TEST(BlockPass, ReadsTheCommonLayoutAndReportsAFaultOnItsLineAndColumn)
 {
     const CAsciiSpecification spec = Spec("Tab", "Dot", nullptr);
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("in.txt");
-    convtest::WriteFile(path, "T\tA\tB\n"
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("in.txt");
+    testsupport::WriteFile(path, "T\tA\tB\n"
                               "2020/01/01 23:59:59\t1.25\t-0\n"
                               "2020/01/02 00:00:00\t\t007.5\n"
                               "2020/01/02 00:00:01\t2\t1x\n");

@@ -42,27 +42,27 @@ std::vector<std::string> LeftoverTemporaries(const std::string& folder)
 
 TEST(Conversion, TextThroughRbx0AndBackKeepsEverything)
 {
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), kSample);
-    FileReport there = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("mid.rbx0"));
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), kSample);
+    FileReport there = Convert(sys::FileFormat::Ascii, folder.File("in.txt"), sys::FileFormat::Rbx0, folder.File("mid.rbx0"));
     ASSERT_TRUE(there.converted) << there.problem.Describe();
     EXPECT_EQ(there.rows, 3u);
-    FileReport back = Convert(sys::FileFormat::Rbx0, folder.Path("mid.rbx0"), sys::FileFormat::Ascii, folder.Path("out.txt"));
+    FileReport back = Convert(sys::FileFormat::Rbx0, folder.File("mid.rbx0"), sys::FileFormat::Ascii, folder.File("out.txt"));
     ASSERT_TRUE(back.converted) << back.problem.Describe();
     std::string expected = kSample;
     expected.replace(expected.find("Date/time"), 9, "Date/time"); // the rbx0 file names its time column so too
-    EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")), expected);
-    EXPECT_TRUE(LeftoverTemporaries(folder.Root()).empty());
+    EXPECT_EQ(testsupport::ReadFile(folder.File("out.txt")), expected);
+    EXPECT_TRUE(LeftoverTemporaries(folder.Path()).empty());
 }
 
 TEST(Conversion, TextToTextWithSelectionReorders)
 {
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), kSample);
-    FileReport report = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"), {2, 0});
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), kSample);
+    FileReport report = Convert(sys::FileFormat::Ascii, folder.File("in.txt"), sys::FileFormat::Ascii, folder.File("out.txt"), {2, 0});
     ASSERT_TRUE(report.converted) << report.problem.Describe();
     EXPECT_EQ(report.itemsWritten, 2u);
-    EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")),
+    EXPECT_EQ(testsupport::ReadFile(folder.File("out.txt")),
               "Undefined[Undefined]:Instantaneous\tRainfall[mm]:Accumulated\n"
               "Date/time\tOther\tRain\n"
               "2020/01/01 00:00:00\t7\t0.1\n"
@@ -81,13 +81,13 @@ TEST(Conversion, ASelectionNamingAnItemTwiceOrOneTheFileLacksIsRefused)
         {{0, 0}, "Items names item 0 twice (entries 1 and 2)"},
         {{3}, "Items entry 1 names item 3, but the file has 3 items (numbered from 0)"},
     };
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), kSample);
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), kSample);
     for (const auto& c : cases) {
-        FileReport report = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"), c.items);
+        FileReport report = Convert(sys::FileFormat::Ascii, folder.File("in.txt"), sys::FileFormat::Ascii, folder.File("out.txt"), c.items);
         EXPECT_FALSE(report.converted);
         EXPECT_EQ(report.problem.message, c.problem);
-        EXPECT_FALSE(std::filesystem::exists(folder.Path("out.txt")));
+        EXPECT_FALSE(std::filesystem::exists(folder.File("out.txt")));
         EXPECT_EQ(SelectionProblem(c.items, 3), c.problem);
     }
     EXPECT_EQ(SelectionProblem({4, 0, 2}, 5), "");
@@ -101,17 +101,17 @@ TEST(Conversion, EveryFormatPairRoundTrips)
     for (const auto& [middle, middleExtension] : outputs)
         for (const auto& [last, lastExtension] : outputs) {
             SCOPED_TRACE(std::string(middleExtension) + " then " + lastExtension);
-            convtest::ScratchFolder folder;
-            convtest::WriteFile(folder.Path("in.txt"), kSample);
-            const std::string mid = folder.Path(std::string("mid") + middleExtension);
-            const std::string end = folder.Path(std::string("end") + lastExtension);
-            FileReport first = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), middle, mid);
+            testsupport::ScratchFolder folder;
+            testsupport::WriteFile(folder.File("in.txt"), kSample);
+            const std::string mid = folder.File(std::string("mid") + middleExtension);
+            const std::string end = folder.File(std::string("end") + lastExtension);
+            FileReport first = Convert(sys::FileFormat::Ascii, folder.File("in.txt"), middle, mid);
             ASSERT_TRUE(first.converted) << first.problem.Describe();
             FileReport second = Convert(middle, mid, last, end);
             ASSERT_TRUE(second.converted) << second.problem.Describe();
-            FileReport back = Convert(last, end, sys::FileFormat::Ascii, folder.Path("back.txt"));
+            FileReport back = Convert(last, end, sys::FileFormat::Ascii, folder.File("back.txt"));
             ASSERT_TRUE(back.converted) << back.problem.Describe();
-            EXPECT_EQ(convtest::ReadFile(folder.Path("back.txt")), kSample);
+            EXPECT_EQ(testsupport::ReadFile(folder.File("back.txt")), kSample);
         }
 }
 
@@ -119,11 +119,11 @@ TEST(Conversion, AnXlsWorkbookInTheEngineLayoutReadsWithoutATemplateFile)
 {
     // Written record by record by tests/data/spreadsheet/make_test_files.py: date-time cells,
     // blank cells for the missing values.
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     FileReport report = Convert(sys::FileFormat::Excel, std::string(VELMORA_TEST_DATA) + "/spreadsheet/engine-layout.xls", sys::FileFormat::Ascii,
-                                folder.Path("out.txt"));
+                                folder.File("out.txt"));
     ASSERT_TRUE(report.converted) << report.problem.Describe();
-    EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")), kSample);
+    EXPECT_EQ(testsupport::ReadFile(folder.File("out.txt")), kSample);
 }
 
 TEST(Conversion, ExcelRowsCrossTheReadingBatchesAndDeleteValuesMatchTheDisplayedText)
@@ -137,27 +137,27 @@ TEST(Conversion, ExcelRowsCrossTheReadingBatchesAndDeleteValuesMatchTheDisplayed
         original += stamp + "\t" + rain + "\t" + (i % 7 == 0 ? "-999" : std::to_string(i)) + "\n";
         withoutDeleted += stamp + "\t" + rain + "\t" + (i % 7 == 0 ? "" : std::to_string(i)) + "\n";
     }
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), original);
-    ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Excel, folder.Path("mid.xlsx")).converted);
-    FileReport plain = Convert(sys::FileFormat::Excel, folder.Path("mid.xlsx"), sys::FileFormat::Ascii, folder.Path("plain.txt"));
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), original);
+    ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.File("in.txt"), sys::FileFormat::Excel, folder.File("mid.xlsx")).converted);
+    FileReport plain = Convert(sys::FileFormat::Excel, folder.File("mid.xlsx"), sys::FileFormat::Ascii, folder.File("plain.txt"));
     ASSERT_TRUE(plain.converted) << plain.problem.Describe();
-    EXPECT_EQ(convtest::ReadFile(folder.Path("plain.txt")), original);
+    EXPECT_EQ(testsupport::ReadFile(folder.File("plain.txt")), original);
 
     sys::Status status;
     std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Excel, "", status);
     spec->m_DataDesc.m_nDeleteValueCheck = 1;
     spec->m_DataDesc.m_nDeleteValueRadio = 0;
     spec->m_DataDesc.m_strDeleteValue = "-999";
-    FileJob job{sys::FileFormat::Excel, folder.Path("mid.xlsx"), spec.get(), {}, sys::FileFormat::Ascii, folder.Path("deleted.txt"), "Title"};
+    FileJob job{sys::FileFormat::Excel, folder.File("mid.xlsx"), spec.get(), {}, sys::FileFormat::Ascii, folder.File("deleted.txt"), "Title"};
     FileReport deleted = ConvertFile(job);
     ASSERT_TRUE(deleted.converted) << deleted.problem.Describe();
-    EXPECT_EQ(convtest::ReadFile(folder.Path("deleted.txt")), withoutDeleted);
+    EXPECT_EQ(testsupport::ReadFile(folder.File("deleted.txt")), withoutDeleted);
 }
 
 TEST(Conversion, Rbx0HeaderDescribesAxisAndItems)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     struct Case {
         std::string text;
         int axisType;
@@ -167,10 +167,10 @@ TEST(Conversion, Rbx0HeaderDescribesAxisAndItems)
         {kSample + "2020/01/01 01:30:00\t1\t2\t3\n", rbx::kNonEquidistantCalendar, 5400},
     };
     for (const Case& c : cases) {
-        convtest::WriteFile(folder.Path("in.txt"), c.text);
-        ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("out.rbx0")).converted);
+        testsupport::WriteFile(folder.File("in.txt"), c.text);
+        ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.File("in.txt"), sys::FileFormat::Rbx0, folder.File("out.rbx0")).converted);
         rbx::CRbxReader reader;
-        ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.status().problem().Describe();
+        ASSERT_TRUE(reader.Open(folder.File("out.rbx0"))) << reader.status().problem().Describe();
         const rbx::FileHeader& header = reader.Header();
         EXPECT_EQ(header.title, "Title");
         EXPECT_EQ(header.axis.type, c.axisType);
@@ -191,102 +191,102 @@ TEST(Conversion, Rbx0HeaderDescribesAxisAndItems)
 
 TEST(Conversion, DamagedWorkbookFailsWithoutOutput)
 {
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), kSample);
-    ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Excel, folder.Path("good.xlsx")).converted);
-    const std::string bytes = convtest::ReadFile(folder.Path("good.xlsx"));
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), kSample);
+    ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.File("in.txt"), sys::FileFormat::Excel, folder.File("good.xlsx")).converted);
+    const std::string bytes = testsupport::ReadFile(folder.File("good.xlsx"));
     std::string flipped = bytes;
     for (size_t i = bytes.size() / 3; i < bytes.size() / 3 + 64; ++i)
         flipped[i] = static_cast<char>(~flipped[i]);
     for (const std::string& damaged : {bytes.substr(0, bytes.size() / 2), flipped, std::string("PK not a zip")}) {
-        convtest::WriteFile(folder.Path("bad.xlsx"), damaged);
-        FileReport report = Convert(sys::FileFormat::Excel, folder.Path("bad.xlsx"), sys::FileFormat::Ascii, folder.Path("out.txt"));
+        testsupport::WriteFile(folder.File("bad.xlsx"), damaged);
+        FileReport report = Convert(sys::FileFormat::Excel, folder.File("bad.xlsx"), sys::FileFormat::Ascii, folder.File("out.txt"));
         EXPECT_FALSE(report.converted);
         EXPECT_FALSE(report.problem.message.empty());
-        EXPECT_FALSE(fs::exists(folder.Path("out.txt")));
+        EXPECT_FALSE(fs::exists(folder.File("out.txt")));
     }
 }
 
 TEST(Conversion, FailureLeavesTheOldOutputAndNoTemporary)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     std::string broken = kSample + "2020/01/01 00:45:00\t1\n"; // one field short
-    convtest::WriteFile(folder.Path("in.txt"), broken);
+    testsupport::WriteFile(folder.File("in.txt"), broken);
     for (sys::FileFormat out : {sys::FileFormat::Ascii, sys::FileFormat::Rbx0, sys::FileFormat::Excel}) {
-        const std::string output = folder.Path(std::string("out") + sys::FormatInfo(out).outputExtension);
-        convtest::WriteFile(output, "old content");
-        FileReport report = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), out, output);
+        const std::string output = folder.File(std::string("out") + sys::FormatInfo(out).outputExtension);
+        testsupport::WriteFile(output, "old content");
+        FileReport report = Convert(sys::FileFormat::Ascii, folder.File("in.txt"), out, output);
         ASSERT_FALSE(report.converted) << sys::FormatInfo(out).name;
         EXPECT_EQ(report.problem.line, 6);
-        EXPECT_EQ(convtest::ReadFile(output), "old content") << sys::FormatInfo(out).name;
+        EXPECT_EQ(testsupport::ReadFile(output), "old content") << sys::FormatInfo(out).name;
     }
-    EXPECT_TRUE(LeftoverTemporaries(folder.Root()).empty());
+    EXPECT_TRUE(LeftoverTemporaries(folder.Path()).empty());
 }
 
 TEST(Conversion, DecreasingStampsCannotGoToRbx0)
 {
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), "Undefined[Undefined]:Instantaneous\nT\tA\n2020/01/01 00:00:01\t1\n2020/01/01 00:00:00\t2\n");
-    FileReport report = Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("out.rbx0"));
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), "Undefined[Undefined]:Instantaneous\nT\tA\n2020/01/01 00:00:01\t1\n2020/01/01 00:00:00\t2\n");
+    FileReport report = Convert(sys::FileFormat::Ascii, folder.File("in.txt"), sys::FileFormat::Rbx0, folder.File("out.rbx0"));
     ASSERT_FALSE(report.converted);
     EXPECT_EQ(report.problem.line, 4);
-    EXPECT_FALSE(fs::exists(folder.Path("out.rbx0")));
+    EXPECT_FALSE(fs::exists(folder.File("out.rbx0")));
 }
 
 TEST(Conversion, TruncatedRbx0FailsWithoutOutput)
 {
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), kSample);
-    ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("good.rbx0")).converted);
-    const std::string bytes = convtest::ReadFile(folder.Path("good.rbx0"));
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), kSample);
+    ASSERT_TRUE(Convert(sys::FileFormat::Ascii, folder.File("in.txt"), sys::FileFormat::Rbx0, folder.File("good.rbx0")).converted);
+    const std::string bytes = testsupport::ReadFile(folder.File("good.rbx0"));
     for (size_t keep : {size_t{0}, size_t{10}, bytes.size() / 2, bytes.size() - 3}) {
-        convtest::WriteFile(folder.Path("cut.rbx0"), bytes.substr(0, keep));
-        FileReport report = Convert(sys::FileFormat::Rbx0, folder.Path("cut.rbx0"), sys::FileFormat::Ascii, folder.Path("out.txt"));
+        testsupport::WriteFile(folder.File("cut.rbx0"), bytes.substr(0, keep));
+        FileReport report = Convert(sys::FileFormat::Rbx0, folder.File("cut.rbx0"), sys::FileFormat::Ascii, folder.File("out.txt"));
         EXPECT_FALSE(report.converted) << keep;
         EXPECT_FALSE(report.problem.message.empty());
-        EXPECT_FALSE(fs::exists(folder.Path("out.txt"))) << keep;
+        EXPECT_FALSE(fs::exists(folder.File("out.txt"))) << keep;
     }
 }
 
 TEST(Conversion, CanConvertJudgesExtensionTemplateAndContent)
 {
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("good.txt"), kSample);
-    convtest::WriteFile(folder.Path("good.dat"), kSample);
-    convtest::WriteFile(folder.Path("noext"), kSample);
-    convtest::WriteFile(folder.Path("binary"), std::string("a\0b", 3));
-    convtest::WriteFile(folder.Path("misfit.txt"), "just words\n");
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("good.txt"), kSample);
+    testsupport::WriteFile(folder.File("good.dat"), kSample);
+    testsupport::WriteFile(folder.File("noext"), kSample);
+    testsupport::WriteFile(folder.File("binary"), std::string("a\0b", 3));
+    testsupport::WriteFile(folder.File("misfit.txt"), "just words\n");
     auto reason = [](const sys::Status& verdict) { return verdict.problem().Describe(); };
-    const sys::Status good = CanConvert(sys::FileFormat::Ascii, folder.Path("good.txt"), "");
+    const sys::Status good = CanConvert(sys::FileFormat::Ascii, folder.File("good.txt"), "");
     EXPECT_TRUE(good) << reason(good);
-    const sys::Status noExtension = CanConvert(sys::FileFormat::Ascii, folder.Path("noext"), "");
+    const sys::Status noExtension = CanConvert(sys::FileFormat::Ascii, folder.File("noext"), "");
     EXPECT_TRUE(noExtension) << reason(noExtension);
-    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("good.dat"), ""));
-    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("binary"), ""));
-    const sys::Status misfit = CanConvert(sys::FileFormat::Ascii, folder.Path("misfit.txt"), "");
+    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.File("good.dat"), ""));
+    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.File("binary"), ""));
+    const sys::Status misfit = CanConvert(sys::FileFormat::Ascii, folder.File("misfit.txt"), "");
     EXPECT_FALSE(misfit);
     EXPECT_NE(reason(misfit).find("misfit.txt"), std::string::npos);
-    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.Path("good.txt"), folder.Path("no-template.xml")));
+    EXPECT_FALSE(CanConvert(sys::FileFormat::Ascii, folder.File("good.txt"), folder.File("no-template.xml")));
 }
 
 TEST(ConversionJob, FolderConvertsTheRestAndReportsTheMisfit)
 {
-    convtest::ScratchFolder folder;
-    fs::create_directories(folder.Path("in"));
-    fs::create_directories(folder.Path("out"));
+    testsupport::ScratchFolder folder;
+    fs::create_directories(folder.File("in"));
+    fs::create_directories(folder.File("out"));
     for (const char* name : {"a.txt", "b.csv", "c.tab"})
-        convtest::WriteFile(folder.Path(std::string("in/") + name), kSample);
-    convtest::WriteFile(folder.Path("in/misfit.txt"), "Undefined[Undefined]:Instantaneous\nT\tA\n2020/01/01\n");
-    convtest::WriteFile(folder.Path("in/ignored.dat"), "whatever");
+        testsupport::WriteFile(folder.File(std::string("in/") + name), kSample);
+    testsupport::WriteFile(folder.File("in/misfit.txt"), "Undefined[Undefined]:Instantaneous\nT\tA\n2020/01/01\n");
+    testsupport::WriteFile(folder.File("in/ignored.dat"), "whatever");
     const JobSetup setup = convtest::AsciiFolderToRbx0(folder);
-    ConversionLog log(folder.Path("run.log"), nullptr);
+    ConversionLog log(folder.File("run.log"), nullptr);
     EXPECT_EQ(RunJob(setup, log, {2, nullptr}), kExitSomeFailed);
     for (const char* name : {"a.rbx0", "b.rbx0", "c.rbx0"})
-        EXPECT_TRUE(fs::exists(folder.Path(std::string("out/") + name))) << name;
-    EXPECT_FALSE(fs::exists(folder.Path("out/misfit.rbx0")));
-    const std::string text = convtest::ReadFile(folder.Path("run.log"));
-    EXPECT_NE(text.find("SKIPPED " + folder.Path("in/misfit.txt") + ": the template does not fit: " +
-                        folder.Path("in/misfit.txt") + ":3:"),
+        EXPECT_TRUE(fs::exists(folder.File(std::string("out/") + name))) << name;
+    EXPECT_FALSE(fs::exists(folder.File("out/misfit.rbx0")));
+    const std::string text = testsupport::ReadFile(folder.File("run.log"));
+    EXPECT_NE(text.find("SKIPPED " + folder.File("in/misfit.txt") + ": the template does not fit: " +
+                        folder.File("in/misfit.txt") + ":3:"),
               std::string::npos)
         << text;
     EXPECT_NE(text.find("3 converted, 1 skipped or failed"), std::string::npos) << text;
@@ -303,25 +303,25 @@ TEST(ConversionJob, SetupProblemsAndLogPlaces)
     ConversionLog quiet({}, nullptr);
     EXPECT_EQ(RunJob(setup, quiet), kExitSetup);
 
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     EXPECT_EQ(LogPathFor(""), "");
-    EXPECT_EQ(LogPathFor(folder.Root()), folder.Path("Velmora.log"));
-    EXPECT_EQ(LogPathFor(folder.Root() + "/new/"), folder.Path("new/Velmora.log"));
-    EXPECT_EQ(LogPathFor(folder.Path("my.log")), folder.Path("my.log"));
+    EXPECT_EQ(LogPathFor(folder.Path()), folder.File("Velmora.log"));
+    EXPECT_EQ(LogPathFor(folder.Path() + "/new/"), folder.File("new/Velmora.log"));
+    EXPECT_EQ(LogPathFor(folder.File("my.log")), folder.File("my.log"));
 }
 
 TEST(ConversionJob, SingleFileFailureExitsNonzero)
 {
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), "nothing useful");
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), "nothing useful");
     JobSetup setup;
     setup.inputFormat = 2;
-    setup.inputFile = folder.Path("in.txt");
+    setup.inputFile = folder.File("in.txt");
     setup.outputFormat = 2;
-    setup.outputFile = folder.Path("out.txt");
-    ConversionLog log(folder.Path("log.txt"), nullptr);
+    setup.outputFile = folder.File("out.txt");
+    ConversionLog log(folder.File("log.txt"), nullptr);
     EXPECT_EQ(RunJob(setup, log), kExitSomeFailed);
-    EXPECT_FALSE(fs::exists(folder.Path("out.txt")));
+    EXPECT_FALSE(fs::exists(folder.File("out.txt")));
 }
 
 } // namespace

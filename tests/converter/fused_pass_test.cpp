@@ -40,9 +40,9 @@ bool SameBits(double a, double b) { return std::memcmp(&a, &b, sizeof a) == 0; }
 
 void ExpectSameOutcome(const CSpecification& spec, const std::string& content)
 {
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("in.txt");
-    convtest::WriteFile(path, content);
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("in.txt");
+    testsupport::WriteFile(path, content);
     const Outcome fused = ReadWith(spec, path, true);
     const Outcome general = ReadWith(spec, path, false);
     ASSERT_EQ(fused.ok, general.ok) << content;
@@ -166,9 +166,9 @@ TEST(FusedPass, ReportsABrokenValueOnItsLine)
                                 "2020/01/01 00:00:01\t1\t\n"
                                 "2020/01/01 00:00:02\t1.5\t1x\n";
     ExpectSameOutcome(spec, content);
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), content);
-    const Outcome fused = ReadWith(spec, folder.Path("in.txt"), true);
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), content);
+    const Outcome fused = ReadWith(spec, folder.File("in.txt"), true);
     ASSERT_FALSE(fused.ok);
     EXPECT_EQ(fused.rows.size(), 2u);
     EXPECT_NE(fused.problem.find("4"), std::string::npos) << fused.problem;

@@ -30,33 +30,33 @@ std::vector<std::string> Hidden(const std::string& folder)
 
 std::string BootTag()
 {
-    return convtest::ReadFile("/proc/sys/kernel/random/boot_id").substr(0, 8);
+    return testsupport::ReadFile("/proc/sys/kernel/random/boot_id").substr(0, 8);
 }
 
 TEST(OutputFile, IsWrittenAsAHiddenPartFileAndCommittedOverARegularFileKeepingItsMode)
 {
-    convtest::ScratchFolder folder;
-    const std::string final = folder.Path("out.txt");
-    convtest::WriteFile(final, "old");
+    testsupport::ScratchFolder folder;
+    const std::string final = folder.File("out.txt");
+    testsupport::WriteFile(final, "old");
     ::chmod(final.c_str(), 0640);
     OutputFile output(final);
     ASSERT_TRUE(output.Create());
     const std::string part = output.TemporaryPath();
-    EXPECT_EQ(fs::path(part).parent_path(), fs::path(folder.Root()));
+    EXPECT_EQ(fs::path(part).parent_path(), fs::path(folder.Path()));
     EXPECT_EQ(fs::path(part).filename().string().rfind(".out.txt.part-" + BootTag() + "-" + std::to_string(::getpid()) + "-", 0), 0u)
         << part;
-    convtest::WriteFile(part, "new");
+    testsupport::WriteFile(part, "new");
     ASSERT_TRUE(output.Commit());
-    EXPECT_EQ(convtest::ReadFile(final), "new");
+    EXPECT_EQ(testsupport::ReadFile(final), "new");
     EXPECT_EQ(fs::status(final).permissions() & fs::perms::all,
               fs::perms::owner_read | fs::perms::owner_write | fs::perms::group_read);
-    EXPECT_TRUE(Hidden(folder.Root()).empty());
+    EXPECT_TRUE(Hidden(folder.Path()).empty());
 }
 
 TEST(OutputFile, ACommitDoesNotReplaceWhatIsNoLongerARegularFile)
 {
-    convtest::ScratchFolder folder;
-    const std::string final = folder.Path("out.txt");
+    testsupport::ScratchFolder folder;
+    const std::string final = folder.File("out.txt");
     {
         OutputFile output(final);
         ASSERT_TRUE(output.Create());
@@ -66,21 +66,21 @@ TEST(OutputFile, ACommitDoesNotReplaceWhatIsNoLongerARegularFile)
         EXPECT_NE(committed.problem().message.find("a named pipe (FIFO)"), std::string::npos);
     }
     EXPECT_TRUE(fs::is_fifo(final));
-    EXPECT_TRUE(Hidden(folder.Root()).empty()) << "the part file goes with the object";
+    EXPECT_TRUE(Hidden(folder.Path()).empty()) << "the part file goes with the object";
 }
 
 TEST(OutputFile, ALinkPlantedAtThePartFilesNameIsNeverWrittenThroughNorMovedIntoPlace)
 {
-    convtest::ScratchFolder folder;
-    const std::string victim = folder.Path("victim.txt");
-    convtest::WriteFile(victim, "someone's file");
-    const std::string final = folder.Path("out.txt");
+    testsupport::ScratchFolder folder;
+    const std::string victim = folder.File("victim.txt");
+    testsupport::WriteFile(victim, "someone's file");
+    const std::string final = folder.File("out.txt");
     OutputFile output(final);
     ASSERT_TRUE(output.Create());
     fs::remove(output.TemporaryPath());
     fs::create_symlink(victim, output.TemporaryPath());
-    convtest::WriteFile(output.WriterPath(), "converted"); // as a writer does
-    EXPECT_EQ(convtest::ReadFile(victim), "someone's file");
+    testsupport::WriteFile(output.WriterPath(), "converted"); // as a writer does
+    EXPECT_EQ(testsupport::ReadFile(victim), "someone's file");
     const sys::Status committed = output.Commit();
     EXPECT_FALSE(committed);
     EXPECT_NE(committed.problem().message.find("was replaced"), std::string::npos) << committed.problem().message;
@@ -89,33 +89,33 @@ TEST(OutputFile, ALinkPlantedAtThePartFilesNameIsNeverWrittenThroughNorMovedInto
 
 TEST(OutputFile, ANameTooLongForThePartFileIsShortenedAndAMissingFolderSaysWhy)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     const std::string longName = std::string(250, 'n') + ".txt";
-    OutputFile output(folder.Path(longName));
+    OutputFile output(folder.File(longName));
     ASSERT_TRUE(output.Create()) << output.FinalPath();
     EXPECT_LE(fs::path(output.TemporaryPath()).filename().string().size(), 255u);
 
-    OutputFile nowhere(folder.Path("missing/out.txt"));
+    OutputFile nowhere(folder.File("missing/out.txt"));
     const sys::Status created = nowhere.Create();
     EXPECT_FALSE(created);
-    EXPECT_EQ(created.problem().file, folder.Path("missing/out.txt"));
+    EXPECT_EQ(created.problem().file, folder.File("missing/out.txt"));
     EXPECT_NE(created.problem().message.find("No such file or directory"), std::string::npos) << created.problem().message;
 }
 
 // In a child process: stopping is for good, and this test runs among others.
 TEST(OutputFile, StoppingRemovesEveryPartFileHoweverManyAndRefusesNewOnes)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     EXPECT_EXIT(
         {
             std::vector<std::unique_ptr<OutputFile>> outputs;
             for (int n = 0; n < 300; ++n) {
-                outputs.push_back(std::make_unique<OutputFile>(folder.Path("out" + std::to_string(n) + ".txt")));
+                outputs.push_back(std::make_unique<OutputFile>(folder.File("out" + std::to_string(n) + ".txt")));
                 if (!outputs.back()->Create())
                     ::_exit(2);
             }
-            const bool allRemoved = OutputFile::RemoveAllTemporaries() == 300 && Hidden(folder.Root()).empty();
-            OutputFile late(folder.Path("late.txt"));
+            const bool allRemoved = OutputFile::RemoveAllTemporaries() == 300 && Hidden(folder.Path()).empty();
+            OutputFile late(folder.File("late.txt"));
             const bool lateRefused = !late.Create();
             ::_exit(allRemoved && lateRefused && !outputs[0]->Commit() ? 0 : 1);
         },
@@ -124,7 +124,7 @@ TEST(OutputFile, StoppingRemovesEveryPartFileHoweverManyAndRefusesNewOnes)
 
 TEST(OutputFile, LeftoversOfStoppedProcessesAreRemovedAndTheFilesOfLiveOnesKept)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     const pid_t gone = ::fork();
     if (gone == 0)
         ::_exit(0);
@@ -146,50 +146,50 @@ TEST(OutputFile, LeftoversOfStoppedProcessesAreRemovedAndTheFilesOfLiveOnesKept)
         {".g.txt.part-" + BootTag() + "-" + std::to_string(gone) + "-0-1", false, false},
     };
     for (const auto& c : cases) {
-        convtest::WriteFile(folder.Path(c.name), "part");
+        testsupport::WriteFile(folder.File(c.name), "part");
         if (c.old) {
             const timespec times[2] = {{1000000000, 0}, {1000000000, 0}}; // 2001
-            ::utimensat(AT_FDCWD, folder.Path(c.name).c_str(), times, 0);
+            ::utimensat(AT_FDCWD, folder.File(c.name).c_str(), times, 0);
         }
     }
     const std::string link = ".h.txt.part-" + BootTag() + "-" + std::to_string(gone) + "-0";
-    fs::create_symlink(folder.Path("f.txt"), folder.Path(link));
+    fs::create_symlink(folder.File("f.txt"), folder.File(link));
 
-    const std::vector<std::string> removed = OutputFile::RemoveStaleTemporaries(folder.Root());
+    const std::vector<std::string> removed = OutputFile::RemoveStaleTemporaries(folder.Path());
     for (const auto& c : cases)
-        EXPECT_EQ(!fs::exists(folder.Path(c.name)), c.removed) << c.name;
-    EXPECT_TRUE(fs::is_symlink(folder.Path(link))) << "a link is never a part file";
+        EXPECT_EQ(!fs::exists(folder.File(c.name)), c.removed) << c.name;
+    EXPECT_TRUE(fs::is_symlink(folder.File(link))) << "a link is never a part file";
     EXPECT_EQ(removed.size(), 2u);
 }
 
 TEST(RunPlan, TwoInputsGivingOneOutputAndOutputsThatCannotBeWrittenAreRefused)
 {
-    convtest::ScratchFolder folder;
-    fs::create_directories(folder.Path("in"));
-    fs::create_directories(folder.Path("out"));
+    testsupport::ScratchFolder folder;
+    fs::create_directories(folder.File("in"));
+    fs::create_directories(folder.File("out"));
     for (const char* name : {"in/a.csv", "in/a.txt", "in/b.txt", "in/c.txt", "in/d.tab"})
-        convtest::WriteFile(folder.Path(name), "x\n");
-    ::mkfifo(folder.Path("out/c.rbx0").c_str(), 0600);
-    fs::create_directories(folder.Path("out/d.rbx0"));
+        testsupport::WriteFile(folder.File(name), "x\n");
+    ::mkfifo(folder.File("out/c.rbx0").c_str(), 0600);
+    fs::create_directories(folder.File("out/d.rbx0"));
     const JobSetup setup = convtest::AsciiFolderToRbx0(folder);
-    const RunPlan plan(setup, folder.Path("out/b.rbx0"));
+    const RunPlan plan(setup, folder.File("out/b.rbx0"));
     const std::vector<PlannedFile>& files = plan.Files();
     ASSERT_EQ(files.size(), 5u);
     const std::pair<std::string, std::string> expected[] = {
         {"in/a.csv", ""},
-        {"in/a.txt", "its output " + folder.Path("out/a.rbx0") + " is also the output of " + folder.Path("in/a.csv")},
-        {"in/b.txt", "its output " + folder.Path("out/b.rbx0") + " is the log file " + folder.Path("out/b.rbx0")},
-        {"in/c.txt", "its output " + folder.Path("out/c.rbx0") + " is a named pipe (FIFO); only a regular file is replaced"},
-        {"in/d.tab", "its output " + folder.Path("out/d.rbx0") + " is a folder; only a regular file is replaced"},
+        {"in/a.txt", "its output " + folder.File("out/a.rbx0") + " is also the output of " + folder.File("in/a.csv")},
+        {"in/b.txt", "its output " + folder.File("out/b.rbx0") + " is the log file " + folder.File("out/b.rbx0")},
+        {"in/c.txt", "its output " + folder.File("out/c.rbx0") + " is a named pipe (FIFO); only a regular file is replaced"},
+        {"in/d.tab", "its output " + folder.File("out/d.rbx0") + " is a folder; only a regular file is replaced"},
     };
     for (size_t n = 0; n < files.size(); ++n) {
-        EXPECT_EQ(files[n].input, folder.Path(expected[n].first));
+        EXPECT_EQ(files[n].input, folder.File(expected[n].first));
         EXPECT_EQ(files[n].refusal, expected[n].second);
         EXPECT_EQ(files[n].outputRefused, !expected[n].second.empty());
     }
-    EXPECT_EQ(plan.OutputFolders(), std::vector<std::string>{folder.Path("out")});
-    EXPECT_EQ(plan.ReadFileAt(folder.Path("in/./b.txt")), "the input file " + folder.Path("in/b.txt"));
-    EXPECT_EQ(plan.ReadFileAt(folder.Path("out/b.rbx0")), "") << "the log itself is not a file the run reads";
+    EXPECT_EQ(plan.OutputFolders(), std::vector<std::string>{folder.File("out")});
+    EXPECT_EQ(plan.ReadFileAt(folder.File("in/./b.txt")), "the input file " + folder.File("in/b.txt"));
+    EXPECT_EQ(plan.ReadFileAt(folder.File("out/b.rbx0")), "") << "the log itself is not a file the run reads";
 }
 
 } // namespace

@@ -3,14 +3,14 @@
 // axis times, and rows across block boundaries up to a damaged step.
 #include "converter/RbxSeriesReader.h"
 #include "converter/StampText.h"
-#include "tests/rbx/RbxTestFiles.h"
+#include "tests/support/RbxFiles.h"
 
 #include <gtest/gtest.h>
 
 #include <cmath>
 
 using namespace converter;
-using rbxtest::Item;
+using testsupport::Item;
 
 namespace {
 
@@ -38,11 +38,11 @@ void ExpectValues(const std::vector<double>& actual, const std::vector<double>& 
 
 TEST(RbxSeriesReader, EveryDataTypeReadsWithItsOwnDeleteValue)
 {
-    rbxtest::TempFolder folder;
+    testsupport::ScratchFolder folder;
     const std::string path = folder.File("types.rbx0");
     // -999.9 is not a float: the 32-bit item stores it rounded and must still know it.
-    rbxtest::WriteFile(path,
-                       rbxtest::Definition({Item("F32", rbx::kFloat32, -999.9), Item("F64", rbx::kFloat64, -1e300),
+    testsupport::WriteRbxFile(path,
+                       testsupport::Definition({Item("F32", rbx::kFloat32, -999.9), Item("F64", rbx::kFloat64, -1e300),
                                             Item("Char", rbx::kChar, 255), Item("I32", rbx::kInt32, -2147483648.0),
                                             Item("U32", rbx::kUInt32, 0), Item("I16", rbx::kInt16, -1),
                                             Item("I64", rbx::kInteger, 123456789012.0)}),
@@ -64,7 +64,7 @@ TEST(RbxSeriesReader, EveryDataTypeReadsWithItsOwnDeleteValue)
 
 TEST(RbxSeriesReader, SelectionsReorderRepeatAndMissItems)
 {
-    rbxtest::TempFolder folder;
+    testsupport::ScratchFolder folder;
     struct Case {
         const char* what;
         std::vector<rbx::ItemInfo> items;
@@ -74,7 +74,7 @@ TEST(RbxSeriesReader, SelectionsReorderRepeatAndMissItems)
     };
     for (const Case& c : cases) {
         const std::string path = folder.File(std::string(c.what) + ".rbx0");
-        rbxtest::WriteFile(path, rbxtest::Definition(c.items), {0, 1}, {{1, 2, 3}, {4, NAN, 6}});
+        testsupport::WriteRbxFile(path, testsupport::Definition(c.items), {0, 1}, {{1, 2, 3}, {4, NAN, 6}});
         const std::pair<std::vector<size_t>, std::vector<std::vector<double>>> selections[] = {
             {{0, 1, 2}, {{1, 2, 3}, {4, NAN, 6}}},
             {{2, 0}, {{3, 1}, {6, 4}}},
@@ -97,17 +97,17 @@ TEST(RbxSeriesReader, SelectionsReorderRepeatAndMissItems)
 // unit and on either side of the axis start.
 TEST(RbxSeriesReader, StampsRoundAxisTimesHalfAwayFromZero)
 {
-    rbxtest::TempFolder folder;
+    testsupport::ScratchFolder folder;
     const std::pair<int, std::vector<double>> axes[] = {
         {1400, {-1e6 - 0.5, -2.5, -1.5, -0.5, -0.49999999999999994, 0.49999999999999994, 0.5, 1.5, 2.4999999999999996,
                 2.5, 4503599627370495.5}},
         {1401, {-0.125, -0.025, -1.0 / 120, 1.0 / 120, 0.025, 2.5 / 60, 0.125}}, // minutes
     };
     for (const auto& [unit, times] : axes) {
-        rbx::FileDefinition definition = rbxtest::Definition({Item("A", rbx::kFloat64)});
+        rbx::FileDefinition definition = testsupport::Definition({Item("A", rbx::kFloat64)});
         definition.timeUnitKey = unit;
         const std::string path = folder.File("times" + std::to_string(unit) + ".rbx0");
-        rbxtest::WriteFile(path, definition, times, std::vector<std::vector<double>>(times.size(), {1.0}));
+        testsupport::WriteRbxFile(path, definition, times, std::vector<std::vector<double>>(times.size(), {1.0}));
         RbxSeriesReader reader;
         ASSERT_TRUE(reader.Open(path)) << reader.status().problem().Describe();
         const std::vector<Row> rows = ReadAll(reader);
@@ -123,9 +123,9 @@ TEST(RbxSeriesReader, StampsRoundAxisTimesHalfAwayFromZero)
 // the axis start and at the step otherwise.
 TEST(RbxSeriesReader, TimesTooFarFromTheAxisStartFail)
 {
-    rbxtest::TempFolder folder;
+    testsupport::ScratchFolder folder;
     const std::string farStep = folder.File("far_step.rbx0");
-    rbxtest::WriteFile(farStep, rbxtest::Definition({Item("A", rbx::kFloat64)}), {0, 1e17, 2e17}, {{1}, {2}, {3}});
+    testsupport::WriteRbxFile(farStep, testsupport::Definition({Item("A", rbx::kFloat64)}), {0, 1e17, 2e17}, {{1}, {2}, {3}});
     RbxSeriesReader reader;
     ASSERT_TRUE(reader.Open(farStep)) << reader.status().problem().Describe();
     EXPECT_EQ(ReadAll(reader).size(), 2u);
@@ -133,10 +133,10 @@ TEST(RbxSeriesReader, TimesTooFarFromTheAxisStartFail)
     EXPECT_EQ(reader.status().problem().message,
               "the time of step 3 lies too far from the start of the time axis for a time stamp");
 
-    rbx::FileDefinition definition = rbxtest::Definition({Item("A", rbx::kFloat64)});
+    rbx::FileDefinition definition = testsupport::Definition({Item("A", rbx::kFloat64)});
     definition.startOffset = -1e18;
     const std::string farStart = folder.File("far_start.rbx0");
-    rbxtest::WriteFile(farStart, definition, {0}, {{1}});
+    testsupport::WriteRbxFile(farStart, definition, {0}, {{1}});
     RbxSeriesReader atOpen;
     EXPECT_FALSE(atOpen.Open(farStart));
     EXPECT_EQ(atOpen.status().problem().message,
@@ -146,12 +146,12 @@ TEST(RbxSeriesReader, TimesTooFarFromTheAxisStartFail)
 // Large enough that the checksum is checked at the end, so a damaged step is found while rows come.
 TEST(RbxSeriesReader, RowsCrossBlocksInOrderUntilADamagedStep)
 {
-    rbxtest::TempFolder folder;
+    testsupport::ScratchFolder folder;
     const std::string path = folder.File("long.rbx0");
     const size_t steps = 1100000; // 17.6 MB of records
     {
         rbx::CRbxWriter writer;
-        ASSERT_TRUE(writer.Open(path, rbxtest::Definition({Item("A", rbx::kFloat64)}))) << writer.status().problem().Describe();
+        ASSERT_TRUE(writer.Open(path, testsupport::Definition({Item("A", rbx::kFloat64)}))) << writer.status().problem().Describe();
         for (size_t s = 0; s < steps; ++s) {
             const double value = static_cast<double>(s) * 0.25;
             ASSERT_TRUE(writer.WriteStep(static_cast<double>(s), &value));
@@ -173,11 +173,11 @@ TEST(RbxSeriesReader, RowsCrossBlocksInOrderUntilADamagedStep)
         EXPECT_EQ(reader.BytesConsumed(), steps * 16);
     }
     // The time of step 70001 (in the second block of 65,536 steps) becomes NaN.
-    std::vector<unsigned char> bytes = rbxtest::ReadBytes(path);
+    std::vector<unsigned char> bytes = testsupport::ReadBytes(path);
     const size_t header = bytes.size() - steps * 16;
     const double nan = std::nan("");
     std::memcpy(bytes.data() + header + 70000 * 16, &nan, sizeof nan);
-    rbxtest::WriteBytes(path, bytes);
+    testsupport::WriteBytes(path, bytes);
     RbxSeriesReader reader;
     ASSERT_TRUE(reader.Open(path)) << reader.status().problem().Describe();
     const std::vector<Row> rows = ReadAll(reader);

@@ -30,7 +30,7 @@ FileReport Convert(const CSpecification& spec, const std::string& input, sys::Fi
 
 class TextInputConversion : public ::testing::Test {
 protected:
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     CAsciiSpecification spec = convtest::GlobalSpec();
 };
 
@@ -45,16 +45,16 @@ TEST_F(TextInputConversion, MarksAndUtf16ReadAsTheirText)
         {"UTF-16 big endian with a mark", "\xFE\xFF" + Utf16(kText, true)},
         {"UTF-16 little endian without a mark", Utf16(kText, false)},
     };
-    convtest::WriteFile(folder.Path("plain.txt"), kText);
-    ASSERT_TRUE(Convert(spec, folder.Path("plain.txt"), sys::FileFormat::Ascii, folder.Path("plain.out")).converted);
-    const std::string expected = convtest::ReadFile(folder.Path("plain.out"));
-    ASSERT_EQ(spec.Save(folder.Path("t.xml")), 1) << spec.LastError();
+    testsupport::WriteFile(folder.File("plain.txt"), kText);
+    ASSERT_TRUE(Convert(spec, folder.File("plain.txt"), sys::FileFormat::Ascii, folder.File("plain.out")).converted);
+    const std::string expected = testsupport::ReadFile(folder.File("plain.out"));
+    ASSERT_EQ(spec.Save(folder.File("t.xml")), 1) << spec.LastError();
     for (const auto& c : cases) {
-        convtest::WriteFile(folder.Path("in.txt"), c.bytes);
-        const FileReport report = Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"));
+        testsupport::WriteFile(folder.File("in.txt"), c.bytes);
+        const FileReport report = Convert(spec, folder.File("in.txt"), sys::FileFormat::Ascii, folder.File("out.txt"));
         ASSERT_TRUE(report.converted) << c.label << ": " << report.problem.Describe();
-        EXPECT_EQ(convtest::ReadFile(folder.Path("out.txt")), expected) << c.label;
-        const sys::Status verdict = CanConvert(sys::FileFormat::Ascii, folder.Path("in.txt"), folder.Path("t.xml"));
+        EXPECT_EQ(testsupport::ReadFile(folder.File("out.txt")), expected) << c.label;
+        const sys::Status verdict = CanConvert(sys::FileFormat::Ascii, folder.File("in.txt"), folder.File("t.xml"));
         EXPECT_TRUE(verdict) << c.label << ": " << verdict.problem().Describe();
     }
 }
@@ -65,8 +65,8 @@ TEST_F(TextInputConversion, DataOnTheFirstLineAfterAMark)
     spec.m_DataDesc.m_nStartRow = 1;
     const std::string data = kText.substr(kText.find('\n') + 1);
     for (const std::string& bytes : {"\xEF\xBB\xBF" + data, "\xFF\xFE" + Utf16(data, false)}) {
-        convtest::WriteFile(folder.Path("in.txt"), bytes);
-        const FileReport report = Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"));
+        testsupport::WriteFile(folder.File("in.txt"), bytes);
+        const FileReport report = Convert(spec, folder.File("in.txt"), sys::FileFormat::Ascii, folder.File("out.txt"));
         ASSERT_TRUE(report.converted) << report.problem.Describe();
         EXPECT_EQ(report.rows, 2u);
         EXPECT_EQ(report.firstStamp, "2020/01/01 00:00:00");
@@ -75,19 +75,19 @@ TEST_F(TextInputConversion, DataOnTheFirstLineAfterAMark)
 
 TEST_F(TextInputConversion, WhatCannotBeReadIsRefusedByName)
 {
-    const std::string fifo = folder.Path("fifo.txt");
+    const std::string fifo = folder.File("fifo.txt");
     ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
-    convtest::WriteFile(folder.Path("odd.txt"), "\xFF\xFE" + Utf16(kText, false) + "x");
-    convtest::WriteFile(folder.Path("utf32.txt"), std::string("\xFF\xFE\0\0D\0\0\0", 8));
-    convtest::WriteFile(folder.Path("endless.txt"), std::string(sys::kLongestTextLine + 1, 'x'));
+    testsupport::WriteFile(folder.File("odd.txt"), "\xFF\xFE" + Utf16(kText, false) + "x");
+    testsupport::WriteFile(folder.File("utf32.txt"), std::string("\xFF\xFE\0\0D\0\0\0", 8));
+    testsupport::WriteFile(folder.File("endless.txt"), std::string(sys::kLongestTextLine + 1, 'x'));
     const std::pair<std::string, const char*> cases[] = {
         {fifo, "FIFO"},
-        {folder.Path("odd.txt"), "UTF-16"},
-        {folder.Path("utf32.txt"), "UTF-32"},
-        {folder.Path("endless.txt"), "longer than"},
+        {folder.File("odd.txt"), "UTF-16"},
+        {folder.File("utf32.txt"), "UTF-32"},
+        {folder.File("endless.txt"), "longer than"},
     };
     for (const auto& [path, reason] : cases) {
-        const FileReport report = Convert(spec, path, sys::FileFormat::Rbx0, folder.Path("out.rbx0"));
+        const FileReport report = Convert(spec, path, sys::FileFormat::Rbx0, folder.File("out.rbx0"));
         EXPECT_FALSE(report.converted) << path;
         const std::string problem = report.problem.Describe();
         EXPECT_EQ(problem.rfind(path, 0), 0u) << problem;
@@ -98,19 +98,19 @@ TEST_F(TextInputConversion, WhatCannotBeReadIsRefusedByName)
 // Names from an 8-bit file are Windows-1252 text in every output.
 TEST_F(TextInputConversion, EightBitNamesAreWindows1252InEveryOutput)
 {
-    convtest::WriteFile(folder.Path("in.txt"), "Date/time\tPegel \xD6hringen \x80\tRain\n2020/01/01 00:00:00\t1.5\t0.1\n");
+    testsupport::WriteFile(folder.File("in.txt"), "Date/time\tPegel \xD6hringen \x80\tRain\n2020/01/01 00:00:00\t1.5\t0.1\n");
     const std::string name = "Pegel \xC3\x96hringen \xE2\x82\xAC";
 
-    ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Rbx0, folder.Path("out.rbx0")).converted);
+    ASSERT_TRUE(Convert(spec, folder.File("in.txt"), sys::FileFormat::Rbx0, folder.File("out.rbx0")).converted);
     rbx::CRbxReader reader;
-    ASSERT_TRUE(reader.Open(folder.Path("out.rbx0"))) << reader.status().problem().Describe();
+    ASSERT_TRUE(reader.Open(folder.File("out.rbx0"))) << reader.status().problem().Describe();
     EXPECT_EQ(reader.Header().items.at(0).name, name);
 
-    ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt")).converted);
-    EXPECT_NE(convtest::ReadFile(folder.Path("out.txt")).find("\t" + name + "\t"), std::string::npos);
+    ASSERT_TRUE(Convert(spec, folder.File("in.txt"), sys::FileFormat::Ascii, folder.File("out.txt")).converted);
+    EXPECT_NE(testsupport::ReadFile(folder.File("out.txt")).find("\t" + name + "\t"), std::string::npos);
 
-    ASSERT_TRUE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Excel, folder.Path("out.xlsx")).converted);
-    const convtest::ZipContents zip = convtest::Unzip(convtest::ReadFile(folder.Path("out.xlsx")));
+    ASSERT_TRUE(Convert(spec, folder.File("in.txt"), sys::FileFormat::Excel, folder.File("out.xlsx")).converted);
+    const convtest::ZipContents zip = convtest::Unzip(testsupport::ReadFile(folder.File("out.xlsx")));
     ASSERT_EQ(zip.error, "");
     EXPECT_NE(zip.parts.at("xl/sharedStrings.xml").find(">" + name + "<"), std::string::npos);
 }
@@ -121,15 +121,15 @@ TEST_F(TextInputConversion, UserLocaleTakesTheDecimalSeparatorFromTheEnvironment
     if (!german.Available())
         GTEST_SKIP() << "localedef cannot build de_DE.UTF-8 here (no localedef or no locale sources)";
     spec.m_strDecimalSeparator = "User Locale";
-    convtest::WriteFile(folder.Path("in.txt"), "Date/time\tA\n2020/01/01 00:00:00\t3,5\n");
+    testsupport::WriteFile(folder.File("in.txt"), "Date/time\tA\n2020/01/01 00:00:00\t3,5\n");
     {
         const testsupport::LocaleEnvironment environment(german, testsupport::ScratchLocale::kName, nullptr, nullptr);
-        const FileReport report = Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt"));
+        const FileReport report = Convert(spec, folder.File("in.txt"), sys::FileFormat::Ascii, folder.File("out.txt"));
         ASSERT_TRUE(report.converted) << report.problem.Describe();
-        EXPECT_NE(convtest::ReadFile(folder.Path("out.txt")).find("\t3.5\n"), std::string::npos);
+        EXPECT_NE(testsupport::ReadFile(folder.File("out.txt")).find("\t3.5\n"), std::string::npos);
     }
     const testsupport::LocaleEnvironment environment(german, nullptr, "C", testsupport::ScratchLocale::kName);
-    EXPECT_FALSE(Convert(spec, folder.Path("in.txt"), sys::FileFormat::Ascii, folder.Path("out.txt")).converted)
+    EXPECT_FALSE(Convert(spec, folder.File("in.txt"), sys::FileFormat::Ascii, folder.File("out.txt")).converted)
         << "LC_NUMERIC names the C locale, whose separator is the point";
 }
 

@@ -79,7 +79,7 @@ if stream:
 std::map<std::string, std::string> Dump(const std::string& path)
 {
     std::map<std::string, std::string> cells;
-    const pytools::Result dump = pytools::Run(kXlrdDump, pytools::Quote(path));
+    const pytools::Result dump = pytools::Run(kXlrdDump, testsupport::ShellQuote(path));
     EXPECT_EQ(dump.status, 0) << dump.output;
     std::istringstream lines(dump.output);
     for (std::string line; std::getline(lines, line);) {
@@ -103,8 +103,8 @@ TEST(XlsWriter, XlrdReadsValuesTextsDatesAndTheTitle)
 {
     if (!pytools::Has("xlrd"))
         GTEST_SKIP() << "/usr/bin/python3 with xlrd is not available";
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("out.xls");
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("out.xls");
     SeriesHeader header;
     header.timeTitle = "Zeit";
     header.items = {Item("Pegel \xD6hringen", "Water Level", "m"), Item("\xE6\xB0\xB4\xE4\xBD\x8D"), Item(""),
@@ -149,8 +149,8 @@ TEST(XlsWriter, ALargeWorkbookIsACompoundFileOtherReadersFollow)
 {
     if (!pytools::Has("xlrd"))
         GTEST_SKIP() << "/usr/bin/python3 with xlrd is not available";
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("large.xls");
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("large.xls");
     SeriesHeader header;
     for (int i = 0; i < 20; ++i)
         header.items.push_back(Item("V" + std::to_string(i)));
@@ -175,7 +175,7 @@ doc = compdoc.CompDoc(data, logfile=open(os.devnull, "w"))
 book = doc.get_named_stream("Workbook")
 print("workbook", len(book), zlib.crc32(book))
 )",
-                                                 pytools::Quote(path));
+                                                 testsupport::ShellQuote(path));
     ASSERT_EQ(streams.status, 0) << streams.output;
     sheet::CompoundFile ours(path);
     const std::vector<unsigned char> stream = ours.Read(*ours.Find("Workbook"));
@@ -201,8 +201,8 @@ TEST(XlsWriter, LibreOfficeReadsTheWorkbook)
 {
     if (std::system("command -v soffice >/dev/null 2>&1") != 0)
         GTEST_SKIP() << "LibreOffice (soffice) is not installed";
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("office.xls");
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("office.xls");
     SeriesHeader header;
     header.timeTitle = "Date/time";
     header.items = {Item("Rain"), Item("Level", "Water Level", "m")};
@@ -213,16 +213,16 @@ TEST(XlsWriter, LibreOfficeReadsTheWorkbook)
     };
     ASSERT_TRUE(WriteXls(path, header, rows, "Title"));
     // LibreOffice reads the .xls and writes it again as .xlsx, which our reader reads back.
-    const std::string command = "cd " + pytools::Quote(folder.Root()) +
+    const std::string command = "cd " + testsupport::ShellQuote(folder.Path()) +
                                 " && timeout 120 soffice --headless --norestore -env:UserInstallation=file://" +
-                                folder.Root() + "/profile --convert-to xlsx office.xls >convert.log 2>&1";
-    ASSERT_EQ(std::system(command.c_str()), 0) << convtest::ReadFile(folder.Path("convert.log"));
-    ASSERT_TRUE(std::filesystem::exists(folder.Path("office.xlsx"))) << convtest::ReadFile(folder.Path("convert.log"));
+                                folder.Path() + "/profile --convert-to xlsx office.xls >convert.log 2>&1";
+    ASSERT_EQ(std::system(command.c_str()), 0) << testsupport::ReadFile(folder.File("convert.log"));
+    ASSERT_TRUE(std::filesystem::exists(folder.File("office.xlsx"))) << testsupport::ReadFile(folder.File("convert.log"));
 
     sys::Status status;
     std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Excel, "", status);
     std::unique_ptr<SeriesReader> reader = MakeReader(sys::FileFormat::Excel, spec.get());
-    ASSERT_TRUE(reader->Open(folder.Path("office.xlsx"))) << reader->status().problem().Describe();
+    ASSERT_TRUE(reader->Open(folder.File("office.xlsx"))) << reader->status().problem().Describe();
     EXPECT_EQ(reader->Header().timeTitle, "Date/time");
     ASSERT_EQ(reader->Header().items.size(), 2u);
     EXPECT_EQ(reader->Header().items[1].name, "Level");
@@ -245,43 +245,43 @@ TEST(XlsWriter, LibreOfficeReadsTheWorkbook)
 // row that does not fit, and a conversion then leaves no output.
 TEST(XlsWriter, TheFormatsLimitsGiveClearErrors)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     SeriesHeader wide;
     wide.items.assign(256, Item("x"));
     XlsSeriesWriter tooWide;
-    const sys::Status refused = tooWide.Begin(folder.Path("wide.xls"), wide, "");
+    const sys::Status refused = tooWide.Begin(folder.File("wide.xls"), wide, "");
     EXPECT_FALSE(refused);
     EXPECT_EQ(refused.problem().message, "256 items do not fit the 255 value columns of an .xls sheet (.xlsx holds 16,383)");
-    EXPECT_FALSE(std::filesystem::exists(folder.Path("wide.xls")));
+    EXPECT_FALSE(std::filesystem::exists(folder.File("wide.xls")));
     wide.items.resize(255);
-    EXPECT_TRUE(WriteXls(folder.Path("widest.xls"), wide, {{At(2020, 1, 1), std::vector<double>(255, 1.0)}}));
+    EXPECT_TRUE(WriteXls(folder.File("widest.xls"), wide, {{At(2020, 1, 1), std::vector<double>(255, 1.0)}}));
 
     // The text holds 65,535 data rows, one more than the sheet has room for below its two header rows.
     std::string text = "Undefined[Undefined]:Instantaneous\nDate/time\tV\n";
     for (int r = 0; r < 65535; ++r)
         text += FormatStamp(At(2020, 1, 1) + r * 60LL) + "\t" + std::to_string(r) + "\n";
-    convtest::WriteFile(folder.Path("long.txt"), text);
+    testsupport::WriteFile(folder.File("long.txt"), text);
     sys::Status status;
     std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Ascii, "", status);
-    FileJob job{sys::FileFormat::Ascii, folder.Path("long.txt"), spec.get(), {}, sys::FileFormat::Excel, folder.Path("long.xls"), ""};
+    FileJob job{sys::FileFormat::Ascii, folder.File("long.txt"), spec.get(), {}, sys::FileFormat::Excel, folder.File("long.xls"), ""};
     const FileReport report = ConvertFile(job);
     EXPECT_FALSE(report.converted);
     EXPECT_NE(report.problem.message.find("more rows than an .xls sheet holds (65536 with the two header rows)"),
               std::string::npos)
         << report.problem.Describe();
-    EXPECT_FALSE(std::filesystem::exists(folder.Path("long.xls")));
-    for (const auto& entry : std::filesystem::directory_iterator(folder.Root()))
+    EXPECT_FALSE(std::filesystem::exists(folder.File("long.xls")));
+    for (const auto& entry : std::filesystem::directory_iterator(folder.Path()))
         EXPECT_EQ(entry.path().filename().string().find(".part-"), std::string::npos) << entry.path();
 
     // One row fewer fits, and reads back whole.
     text.resize(text.rfind('\n', text.size() - 2) + 1);
-    convtest::WriteFile(folder.Path("long.txt"), text);
+    testsupport::WriteFile(folder.File("long.txt"), text);
     const FileReport fits = ConvertFile(job);
     ASSERT_TRUE(fits.converted) << fits.problem.Describe();
     std::unique_ptr<CSpecification> excel = LoadTemplate(sys::FileFormat::Excel, "", status);
-    FileJob back{sys::FileFormat::Excel, folder.Path("long.xls"), excel.get(), {}, sys::FileFormat::Ascii, folder.Path("back.txt"), ""};
+    FileJob back{sys::FileFormat::Excel, folder.File("long.xls"), excel.get(), {}, sys::FileFormat::Ascii, folder.File("back.txt"), ""};
     ASSERT_TRUE(ConvertFile(back).converted);
-    EXPECT_EQ(convtest::ReadFile(folder.Path("back.txt")), text);
+    EXPECT_EQ(testsupport::ReadFile(folder.File("back.txt")), text);
 }
 
 // The sheet's calendar has a 29 February 1900: 1 January 1900 is day 1, 1 March day 61. Stamps
@@ -290,20 +290,20 @@ TEST(ExcelOutput, StampsGetTheSheetsOwnDayNumbers)
 {
     if (!pytools::Has("xlrd openpyxl"))
         GTEST_SKIP() << "/usr/bin/python3 with xlrd and openpyxl is not available";
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     std::string text = "Undefined[Undefined]:Instantaneous\nDate/time\tV\n";
     const char* stamps[] = {"0100/01/01 00:00:00", "1899/12/31 23:00:00", "1900/01/01 12:00:00", "1900/02/28 00:00:00",
                             "1900/03/01 06:00:00", "2021/05/17 00:00:00"};
     for (const char* stamp : stamps)
         text += std::string(stamp) + "\t1\n";
-    convtest::WriteFile(folder.Path("in.txt"), text);
+    testsupport::WriteFile(folder.File("in.txt"), text);
     sys::Status status;
     std::unique_ptr<CSpecification> ascii = LoadTemplate(sys::FileFormat::Ascii, "", status);
     std::unique_ptr<CSpecification> excel = LoadTemplate(sys::FileFormat::Excel, "", status);
     for (const char* extension : {".xls", ".xlsx"}) {
         SCOPED_TRACE(extension);
-        const std::string out = folder.Path(std::string("out") + extension);
-        FileJob job{sys::FileFormat::Ascii, folder.Path("in.txt"), ascii.get(), {}, sys::FileFormat::Excel, out, ""};
+        const std::string out = folder.File(std::string("out") + extension);
+        FileJob job{sys::FileFormat::Ascii, folder.File("in.txt"), ascii.get(), {}, sys::FileFormat::Excel, out, ""};
         ASSERT_TRUE(ConvertFile(job).converted);
         // The other tools' view: xlrd's raw day numbers, openpyxl's dates (it knows the calendar).
         const pytools::Result read = pytools::Run(std::string(extension) == ".xls" ? R"(
@@ -319,15 +319,15 @@ for r in range(3, sheet.max_row + 1):
     v = sheet.cell(r, 1).value
     print(v if isinstance(v, str) else v.strftime("%Y/%m/%d %H:%M:%S"))
 )",
-                                                  pytools::Quote(out));
+                                                  testsupport::ShellQuote(out));
         ASSERT_EQ(read.status, 0) << read.output;
         EXPECT_EQ(read.output, std::string(extension) == ".xls"
                                    ? "'0100/01/01 00:00:00'\n'1899/12/31 23:00:00'\n1.5\n59.0\n61.25\n44333.0\n"
                                    : "0100/01/01 00:00:00\n1899/12/31 23:00:00\n1900/01/01 12:00:00\n"
                                      "1900/02/28 00:00:00\n1900/03/01 06:00:00\n2021/05/17 00:00:00\n");
-        FileJob back{sys::FileFormat::Excel, out, excel.get(), {}, sys::FileFormat::Ascii, folder.Path("back.txt"), ""};
+        FileJob back{sys::FileFormat::Excel, out, excel.get(), {}, sys::FileFormat::Ascii, folder.File("back.txt"), ""};
         const FileReport report = ConvertFile(back);
         ASSERT_TRUE(report.converted) << report.problem.Describe();
-        EXPECT_EQ(convtest::ReadFile(folder.Path("back.txt")), text);
+        EXPECT_EQ(testsupport::ReadFile(folder.File("back.txt")), text);
     }
 }

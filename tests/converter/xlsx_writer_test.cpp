@@ -111,11 +111,11 @@ SeriesHeader FourItems()
 
 TEST(XlsxWriter, CellsHoldTheShortestTextOfEachValueExactly)
 {
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("values.xlsx");
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("values.xlsx");
     const std::vector<Row> rows = EdgeRows();
     ASSERT_TRUE(WriteWorkbook(path, FourItems(), rows));
-    const convtest::ZipContents zip = convtest::Unzip(convtest::ReadFile(path));
+    const convtest::ZipContents zip = convtest::Unzip(testsupport::ReadFile(path));
     ASSERT_EQ(zip.error, "");
     const std::string& sheetXml = zip.parts.at("xl/worksheets/sheet1.xml");
     std::map<std::string, std::string> cells; // "B3" -> the value's text
@@ -144,8 +144,8 @@ TEST(XlsxWriter, CellsHoldTheShortestTextOfEachValueExactly)
 
 TEST(XlsxWriter, ValuesAndStampsReadBackThroughOurReader)
 {
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("values.xlsx");
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("values.xlsx");
     const std::vector<Row> rows = EdgeRows();
     ASSERT_TRUE(WriteWorkbook(path, FourItems(), rows));
     const ReadBack back = ReadWorkbook(path);
@@ -173,7 +173,7 @@ TEST(XlsxWriter, ValuesAndStampsReadBackThroughOurReader)
 
 TEST(XlsxWriter, HeaderTextsAreSharedStringsThatReadBack)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     SeriesHeader header;
     header.timeTitle = "Zeit & Datum";
     struct Case {
@@ -192,7 +192,7 @@ TEST(XlsxWriter, HeaderTextsAreSharedStringsThatReadBack)
     };
     for (const Case& c : cases)
         header.items.push_back(c.item);
-    const std::string path = folder.Path("header.xlsx");
+    const std::string path = folder.File("header.xlsx");
     ASSERT_TRUE(WriteWorkbook(path, header, {{At(2021, 6, 30, 12, 30, 5), std::vector<double>(header.items.size(), 1.0)}}));
 
     std::shared_ptr<sheet::Worksheet> sheet = OpenSheet(path);
@@ -215,7 +215,7 @@ TEST(XlsxWriter, HeaderTextsAreSharedStringsThatReadBack)
 
 TEST(XlsxWriter, ThreeHundredItemsReachPastColumnAZ)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     SeriesHeader header;
     for (int column = 2; column <= 301; ++column)
         header.items.push_back(Item("item" + std::to_string(column)));
@@ -226,7 +226,7 @@ TEST(XlsxWriter, ThreeHundredItemsReachPastColumnAZ)
             row.values.push_back((i + 1) * 1000.0 + r);
         rows.push_back(row);
     }
-    const std::string path = folder.Path("wide.xlsx");
+    const std::string path = folder.File("wide.xlsx");
     ASSERT_TRUE(WriteWorkbook(path, header, rows));
     std::shared_ptr<sheet::Worksheet> sheet = OpenSheet(path);
     for (auto [cell, name] : {std::pair{"Z2", "item26"}, {"AA2", "item27"}, {"AZ2", "item52"}, {"BA2", "item53"},
@@ -245,7 +245,7 @@ TEST(XlsxWriter, ThreeHundredItemsReachPastColumnAZ)
 
 TEST(XlsxWriter, PackageHoldsTheWorkbookPartsWithTitleAndUsedRange)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     SeriesHeader header;
     header.items = {Item("x"), Item("y"), Item("x")};
     const std::vector<Row> rows(3, Row{At(2020, 5, 5), {1, kMissing, 3}});
@@ -254,9 +254,9 @@ TEST(XlsxWriter, PackageHoldsTheWorkbookPartsWithTitleAndUsedRange)
         std::string expected; // dc:title element, empty for none
     } cases[] = {{"Rain & <snow>", "<dc:title>Rain &amp; &lt;snow&gt;</dc:title>"}, {"", ""}};
     for (const Case& c : cases) {
-        const std::string path = folder.Path("parts.xlsx");
+        const std::string path = folder.File("parts.xlsx");
         ASSERT_TRUE(WriteWorkbook(path, header, rows, c.title));
-        const convtest::ZipContents zip = convtest::Unzip(convtest::ReadFile(path));
+        const convtest::ZipContents zip = convtest::Unzip(testsupport::ReadFile(path));
         ASSERT_EQ(zip.error, "");
         std::vector<std::string> names;
         for (const auto& part : zip.parts)
@@ -289,19 +289,19 @@ TEST(XlsxWriter, PackageHoldsTheWorkbookPartsWithTitleAndUsedRange)
 
 TEST(XlsxWriter, GridLimitsFailClearly)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     SeriesHeader wide;
     wide.items.resize(XlsxSeriesWriter::kMaxColumns - 1, Item("v"));
-    EXPECT_TRUE(WriteWorkbook(folder.Path("widest.xlsx"), wide, {{0, std::vector<double>(wide.items.size(), 2.5)}}));
+    EXPECT_TRUE(WriteWorkbook(folder.File("widest.xlsx"), wide, {{0, std::vector<double>(wide.items.size(), 2.5)}}));
     wide.items.push_back(Item("one too many"));
     XlsxSeriesWriter tooWide;
-    const sys::Status refused = tooWide.Begin(folder.Path("too-wide.xlsx"), wide, "");
+    const sys::Status refused = tooWide.Begin(folder.File("too-wide.xlsx"), wide, "");
     ASSERT_FALSE(refused);
     EXPECT_EQ(refused.problem().message, "16384 items do not fit the 16383 value columns of a worksheet");
 
     SeriesHeader narrow;
     XlsxSeriesWriter tall;
-    const std::string path = folder.Path("tall.xlsx");
+    const std::string path = folder.File("tall.xlsx");
     ASSERT_TRUE(tall.Begin(path, narrow, ""));
     for (unsigned row = 2; row < XlsxSeriesWriter::kMaxRows; ++row)
         ASSERT_TRUE(tall.Write(Row{Stamp(row) * 60, {}})) << row;
@@ -309,7 +309,7 @@ TEST(XlsxWriter, GridLimitsFailClearly)
     ASSERT_FALSE(full);
     EXPECT_EQ(full.problem().message, "more rows than a worksheet holds (1048576)");
     ASSERT_TRUE(tall.Finish());
-    const convtest::ZipContents zip = convtest::Unzip(convtest::ReadFile(path));
+    const convtest::ZipContents zip = convtest::Unzip(testsupport::ReadFile(path));
     ASSERT_EQ(zip.error, "");
     const std::string& sheetXml = zip.parts.at("xl/worksheets/sheet1.xml");
     EXPECT_TRUE(std::regex_search(sheetXml, std::regex("<dimension ref=\"A1:A1048576\" */>")));
@@ -326,15 +326,15 @@ TEST(XlsxWriter, WriteFailuresNameTheCauseAndLeaveNoOutput)
     EXPECT_EQ(full.problem().file, "/dev/full");
     EXPECT_NE(full.problem().message.find("No space left on device"), std::string::npos) << full.problem().message;
 
-    convtest::ScratchFolder folder;
-    convtest::WriteFile(folder.Path("in.txt"), "Rainfall[mm]:Accumulated\nDate/time\tRain\n2020/01/01 00:00:00\t1\n");
+    testsupport::ScratchFolder folder;
+    testsupport::WriteFile(folder.File("in.txt"), "Rainfall[mm]:Accumulated\nDate/time\tRain\n2020/01/01 00:00:00\t1\n");
     sys::Status status;
     std::unique_ptr<CSpecification> spec = LoadTemplate(sys::FileFormat::Ascii, "", status);
-    const std::string output = folder.Path("missing/out.xlsx");
-    const FileReport report = ConvertFile(FileJob{sys::FileFormat::Ascii, folder.Path("in.txt"), spec.get(), {}, sys::FileFormat::Excel, output, ""});
+    const std::string output = folder.File("missing/out.xlsx");
+    const FileReport report = ConvertFile(FileJob{sys::FileFormat::Ascii, folder.File("in.txt"), spec.get(), {}, sys::FileFormat::Excel, output, ""});
     EXPECT_FALSE(report.converted);
     EXPECT_NE(report.problem.message.find("No such file or directory"), std::string::npos) << report.problem.message;
-    EXPECT_FALSE(std::filesystem::exists(folder.Path("missing")));
+    EXPECT_FALSE(std::filesystem::exists(folder.File("missing")));
 }
 
 TEST(XlsxWriter, TextsBecomeWellFormedXmlCharacters)

@@ -1,7 +1,11 @@
 #pragma once
-// What the end-to-end tests share: a scratch folder, setup documents for the host program and the
-// engine program, starting the built programs (optionally as an unprivileged user), and fingerprints
-// of the files a run must leave as they were.
+// What the end-to-end tests share: a run's folder, setup documents for the host program and the
+// engine program, running the built programs in it, and fingerprints of the files a run must leave
+// as they were.
+#include "tests/support/Files.h"
+#include "tests/support/Program.h"
+#include "tests/support/ScratchFolder.h"
+
 #include <gtest/gtest.h>
 
 #include <cstdint>
@@ -35,18 +39,11 @@ inline const std::string kSample =
     "2020/01/01 00:15:00\t\t1.5\t8\n"
     "2020/01/01 00:30:00\t0.3\t\t9\n";
 
-inline std::string ReadFile(const fs::path& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream s;
-    s << in.rdbuf();
-    return s.str();
-}
-
-inline void WriteFile(const fs::path& path, const std::string& content)
-{
-    std::ofstream(path, std::ios::binary) << content;
-}
+using testsupport::Command;
+using testsupport::Contains;
+using testsupport::Outcome;
+using testsupport::ReadFile;
+using testsupport::WriteFile;
 
 // `kSample`'s layout with `rows` rows, one second apart: a file that takes a while to convert.
 inline std::string LargeSample(long long rows)
@@ -118,120 +115,24 @@ inline std::string EngineDocument(const SetupDoc& s)
     return "wpx 1\ntarget \"VELMORA\"\n" + Sections(s) + "end\nwpx end\n";
 }
 
-struct Outcome {
-    int status = -1; // the exit status, or 128 + the signal that ended the program
-    std::string out;
-    std::string err;
-};
-
-struct Command {
-    Command(std::vector<std::string> arguments, std::vector<std::pair<std::string, std::string>> variables = {},
-            bool asNobody = false)
-        : argv(std::move(arguments)), env(std::move(variables)), unprivileged(asNobody)
-    {
-    }
-    std::vector<std::string> argv;
-    std::vector<std::pair<std::string, std::string>> env; // set on top of the test's environment
-    bool unprivileged = false; // run as user and group 65534 when the test runs as root
-};
-
-constexpr uid_t kNobody = 65534;
-
-// Starts the command with its standard output and error going to the files named.
-inline pid_t Start(const Command& command, const fs::path& out, const fs::path& err)
-{
-    std::vector<char*> argv;
-    for (const std::string& arg : command.argv)
-        argv.push_back(const_cast<char*>(arg.c_str()));
-    argv.push_back(nullptr);
-    // The environment is built before the fork: the child only makes system calls.
-    std::map<std::string, std::string> variables;
-    for (char** entry = environ; *entry; ++entry) {
-        const std::string text = *entry;
-        variables[text.substr(0, text.find('='))] = text.substr(std::min(text.size(), text.find('=') + 1));
-    }
-    for (const auto& [name, value] : command.env)
-        variables[name] = value;
-    std::vector<std::string> texts;
-    for (const auto& [name, value] : variables)
-        texts.push_back(name + "=" + value);
-    std::vector<char*> envp;
-    for (std::string& text : texts)
-        envp.push_back(text.data());
-    envp.push_back(nullptr);
-    const pid_t pid = ::fork();
-    if (pid != 0)
-        return pid;
-    const int outFd = ::open(out.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0666);
-    const int errFd = ::open(err.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0666);
-    if (outFd < 0 || errFd < 0 || ::dup2(outFd, 1) < 0 || ::dup2(errFd, 2) < 0)
-        ::_exit(120);
-    if (command.unprivileged && ::geteuid() == 0 &&
-        (::setgroups(0, nullptr) != 0 || ::setgid(kNobody) != 0 || ::setuid(kNobody) != 0))
-        ::_exit(121);
-    ::execve(argv[0], argv.data(), envp.data());
-    ::_exit(122);
-}
-
-// The exit status of a child, or 128 + the signal that ended it.
-inline int Wait(pid_t pid)
-{
-    int status = 0;
-    if (::waitpid(pid, &status, 0) != pid)
-        return -1;
-    return WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
-}
-
 // The files and folders a run works in, under a private folder that everyone may enter.
 class RunFolder {
 public:
-    RunFolder()
+    RunFolder() : m_root(m_scratch.Path())
     {
-        std::string pattern = (fs::temp_directory_path() / "velmora-run-XXXXXX").string();
-        if (!::mkdtemp(pattern.data()))
-            throw std::runtime_error("cannot create a scratch folder");
-        m_root = pattern;
         fs::permissions(m_root, fs::perms::all); // an unprivileged run may read and write here too
-        fs::create_directories(m_root / "tmp");
-        fs::permissions(m_root / "tmp", fs::perms::all);
+        fs::permissions(m_scratch.MakeFolder("tmp"), fs::perms::all);
     }
-    ~RunFolder()
-    {
-        std::error_code ignored;
-        for (const auto& entry : fs::recursive_directory_iterator(m_root, ignored))
-            if (entry.is_directory(ignored) && !entry.is_symlink(ignored))
-                fs::permissions(entry.path(), fs::perms::owner_all, fs::perm_options::add, ignored);
-        fs::remove_all(m_root, ignored);
-    }
-    RunFolder(const RunFolder&) = delete;
-    RunFolder& operator=(const RunFolder&) = delete;
 
     const fs::path& Root() const { return m_root; }
-    std::string Path(const std::string& name) const { return (m_root / name).string(); }
-    std::string Write(const std::string& name, const std::string& content) const
-    {
-        const fs::path path = m_root / name;
-        fs::create_directories(path.parent_path());
-        WriteFile(path, content);
-        return path.string();
-    }
-    std::string MakeFolder(const std::string& name) const
-    {
-        fs::create_directories(m_root / name);
-        return Path(name);
-    }
+    std::string Path(const std::string& name) const { return m_scratch.File(name); }
+    std::string Write(const std::string& name, const std::string& content) const { return m_scratch.Write(name, content); }
+    std::string MakeFolder(const std::string& name) const { return m_scratch.MakeFolder(name); }
 
     Outcome Run(Command command) const
     {
         command.env.emplace_back("TMPDIR", Path("tmp"));
-        const pid_t pid = Start(command, m_root / ".out", m_root / ".err");
-        Outcome outcome;
-        outcome.status = Wait(pid);
-        outcome.out = ReadFile(m_root / ".out");
-        outcome.err = ReadFile(m_root / ".err");
-        fs::remove(m_root / ".out");
-        fs::remove(m_root / ".err");
-        return outcome;
+        return testsupport::RunProgram(command, Path(".out"), Path(".err"));
     }
     // `velmora run DOC --silent` through the plug-in and the engine program.
     Outcome Host(const std::string& document) const { return Run({{kBin + "/velmora", "run", document, "--silent"}}); }
@@ -258,6 +159,7 @@ public:
     }
 
 private:
+    testsupport::ScratchFolder m_scratch{"velmora-run"};
     fs::path m_root;
 };
 
@@ -297,7 +199,5 @@ private:
     std::map<std::string, std::string> m_files;
     std::map<std::string, std::string> m_logs;
 };
-
-inline bool Contains(const std::string& text, const std::string& part) { return text.find(part) != std::string::npos; }
 
 } // namespace e2e

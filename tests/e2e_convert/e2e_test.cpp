@@ -5,6 +5,7 @@
 #include "tests/e2e_convert/RunSupport.h"
 #include "templates/Specification.h"
 #include "tests/support/ScratchLocale.h"
+#include "tests/support/ShellCommand.h"
 
 #include <gtest/gtest.h>
 
@@ -29,16 +30,7 @@ using e2e::WriteFile;
 
 class EndToEnd : public ::testing::Test {
 protected:
-    void SetUp() override
-    {
-        static int counter = 0;
-        m_root = fs::temp_directory_path() / ("velmora-e2e-" + std::to_string(::getpid()) + "-" + std::to_string(counter++));
-        fs::remove_all(m_root);
-        fs::create_directories(m_root);
-    }
-    void TearDown() override { fs::remove_all(m_root); }
-
-    fs::path Path(const std::string& name) const { return m_root / name; }
+    fs::path Path(const std::string& name) const { return m_folder.File(name); }
 
     struct Setup {
         int type = 1;
@@ -69,13 +61,12 @@ protected:
         WriteFile(Path("setup.wpx"), doc.str());
         // The engine's setup file is named after the setup in the temporary folder: give each test
         // its own folder so that tests running side by side never share that file.
-        const std::string command = "TMPDIR='" + m_root.string() + "' " + std::string(VELMORA_BIN_DIR) + "/velmora run " + (s.silent ? "--silent '" : "'") +
+        const std::string command = "TMPDIR='" + m_folder.Path() + "' " + std::string(VELMORA_BIN_DIR) + "/velmora run " + (s.silent ? "--silent '" : "'") +
                                     Path("setup.wpx").string() + "' >'" + Path("host.out").string() + "' 2>&1";
-        const int status = std::system(command.c_str());
-        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+        return testsupport::ShellStatus(command);
     }
 
-    std::string Log() const { return ReadFile(m_root / "run.log"); }
+    std::string Log() const { return ReadFile(Path("run.log")); }
 
     // `kSample` in `format` at `path`, made with the library.
     void MakeInput(Format format, const fs::path& path)
@@ -105,7 +96,7 @@ protected:
         return ReadFile(text);
     }
 
-    fs::path m_root;
+    testsupport::ScratchFolder m_folder{"velmora-e2e"};
 };
 
 const std::string kSelectedAsText = "Undefined[Undefined]:Instantaneous\tRainfall[mm]:Accumulated\n"
@@ -190,7 +181,7 @@ TEST_F(EndToEnd, BrokenLineFarIntoTheFileFailsWithItsLineAndNoOutput)
     EXPECT_EQ(RunHost({1, Format::Ascii, Path("big.txt").string(), "", "", Format::Rbx0, Path("big.rbx0").string()}), 1);
     EXPECT_FALSE(fs::exists(Path("big.rbx0")));
     EXPECT_NE(Log().find(Path("big.txt").string() + ":500000: "), std::string::npos) << Log();
-    for (const auto& entry : fs::directory_iterator(m_root))
+    for (const auto& entry : fs::directory_iterator(m_folder.Path()))
         EXPECT_EQ(entry.path().filename().string().find(".part-"), std::string::npos) << entry.path();
 }
 
@@ -224,7 +215,7 @@ TEST_F(EndToEnd, InterruptedEngineLeavesNoPartFile)
     ASSERT_EQ(posix_spawn(&pid, engine.c_str(), nullptr, nullptr, argv, environ), 0);
     auto partFiles = [&] {
         int count = 0;
-        for (const auto& entry : fs::directory_iterator(m_root))
+        for (const auto& entry : fs::directory_iterator(m_folder.Path()))
             count += entry.path().filename().string().find(".part-") != std::string::npos ? 1 : 0;
         return count;
     };
@@ -292,8 +283,7 @@ TEST_F(EndToEnd, CheckAndEngineAgreeOnTheUserLocale)
     auto check = [this] {
         const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora check '" + Path("setup.wpx").string() +
                                     "' >'" + Path("check.out").string() + "' 2>&1";
-        const int raw = std::system(command.c_str());
-        return WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
+        return testsupport::ShellStatus(command);
     };
     {
         const testsupport::LocaleEnvironment environment(german, testsupport::ScratchLocale::kName, nullptr, nullptr);
@@ -310,10 +300,7 @@ TEST_F(EndToEnd, CheckAndEngineAgreeOnTheUserLocale)
 TEST_F(EndToEnd, EngineProgramHelpAndUsage)
 {
     const std::string engine = std::string(VELMORA_BIN_DIR) + "/Velmora";
-    auto status = [](const std::string& command) {
-        const int s = std::system((command + " >/dev/null 2>&1").c_str());
-        return WIFEXITED(s) ? WEXITSTATUS(s) : -1;
-    };
+    auto status = [](const std::string& command) { return testsupport::ShellStatus(command + " >/dev/null 2>&1"); };
     EXPECT_EQ(status(engine + " --help"), 0);
     EXPECT_EQ(status(engine), 2);
     EXPECT_EQ(status(engine + " --bogus x.wpx"), 2);

@@ -53,11 +53,11 @@ TEST(FaultInjection, AnEngineKilledAtRandomPointsLeavesOldOrCompleteOutputsOnly)
         const auto delay = std::chrono::microseconds(when(random));
         SCOPED_TRACE("kill " + std::to_string(kill) + ": " + strsignal(signal) + " after " +
                      std::to_string(delay.count()) + " us");
-        const pid_t engine = Start({{kBin + "/Velmora", runSetup, "1", "--quiet"}, {}}, folder.Path("e.out"),
+        const pid_t engine = testsupport::StartProgram({{kBin + "/Velmora", runSetup, "1", "--quiet"}, {}}, folder.Path("e.out"),
                                    folder.Path("e.err"));
         std::this_thread::sleep_for(delay);
         ::kill(engine, signal);
-        const int status = Wait(engine);
+        const int status = testsupport::WaitForExit(engine);
         EXPECT_TRUE(status == 128 + signal || status == 0) << "status " << status << ReadFile(folder.Path("e.err"));
         for (int n = 0; n < kInputs; ++n) {
             const std::string content = ReadFile(outputs[n]);

@@ -294,11 +294,11 @@ TEST_F(FileSafety, ALaterRunRemovesThePartFilesOfAKilledEngineButNotThoseOfALive
     SetupDoc setup = SingleFile(folder.Path("big.rbx0"));
     setup.input = big;
     const std::string engineSetup = folder.Write("engine.wpx", EngineDocument(setup));
-    const pid_t engine = Start({{kBin + "/Velmora", engineSetup, "1", "--quiet"}}, folder.Path("e.out"), folder.Path("e.err"));
+    const pid_t engine = testsupport::StartProgram({{kBin + "/Velmora", engineSetup, "1", "--quiet"}}, folder.Path("e.out"), folder.Path("e.err"));
     while (folder.PartFiles().empty())
         ASSERT_EQ(::waitpid(engine, nullptr, WNOHANG), 0) << "the engine ended before its output was begun";
     ::kill(engine, SIGKILL);
-    ASSERT_EQ(Wait(engine), 128 + SIGKILL);
+    ASSERT_EQ(testsupport::WaitForExit(engine), 128 + SIGKILL);
     ASSERT_EQ(folder.PartFiles().size(), 1u) << "a killed engine cannot clean up";
 
     // Part files that may still be written: one of this test's own process, which started before
@@ -336,12 +336,12 @@ TEST_F(FileSafety, KillingTheHostStopsTheEngineBeforeItReplacesTheOutput)
         Untouched untouched;
         for (const std::string& path : {big, doc, output})
             untouched.Add(path);
-        const pid_t host = Start({{kBin + "/velmora", "run", doc, "--silent"}, {{"TMPDIR", folder.Path("tmp")}}},
+        const pid_t host = testsupport::StartProgram({{kBin + "/velmora", "run", doc, "--silent"}, {{"TMPDIR", folder.Path("tmp")}}},
                                  folder.Path("h.out"), folder.Path("h.err"));
         while (folder.PartFiles().empty())
             ASSERT_EQ(::waitpid(host, nullptr, WNOHANG), 0) << "the run ended before its output was begun";
         ::kill(host, signal);
-        EXPECT_EQ(Wait(host), 128 + signal);
+        EXPECT_EQ(testsupport::WaitForExit(host), 128 + signal);
         int status = 0;
         const pid_t engine = ::waitpid(-1, &status, 0);
         ASSERT_GT(engine, 0) << "the engine outlived the host";
@@ -377,7 +377,7 @@ TEST_F(FileSafety, AStoppedEngineRemovesEveryPartFileHoweverManyAreOpen)
     setup.output = out;
     setup.log = log;
     const std::string engineSetup = folder.Write("engine.wpx", EngineDocument(setup));
-    const pid_t engine = Start({{kBin + "/Velmora", engineSetup, "1", "--quiet", "--threads", std::to_string(kFiles)}},
+    const pid_t engine = testsupport::StartProgram({{kBin + "/Velmora", engineSetup, "1", "--quiet", "--threads", std::to_string(kFiles)}},
                                folder.Path("e.out"), folder.Path("e.err"));
 
     auto partFilesInOut = [&] {
@@ -389,7 +389,7 @@ TEST_F(FileSafety, AStoppedEngineRemovesEveryPartFileHoweverManyAreOpen)
     while (partFilesInOut() < kOpenAtTheStop)
         ASSERT_EQ(::waitpid(engine, nullptr, WNOHANG), 0) << ReadFile(folder.Path("e.err"));
     ::kill(engine, SIGTERM);
-    EXPECT_EQ(Wait(engine), 128 + SIGTERM);
+    EXPECT_EQ(testsupport::WaitForExit(engine), 128 + SIGTERM);
     EXPECT_EQ(folder.PartFiles().size(), 0u);
     // The outputs finished before the stop are whole: the same text, as their inputs are.
     const std::vector<std::string> finished = Entries(out);

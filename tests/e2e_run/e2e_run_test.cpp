@@ -1,5 +1,9 @@
 // velmora run / summary through the built host program, plug-in and a recording engine program.
 #include "platform/wpx/Wpx.h"
+#include "tests/support/Files.h"
+#include "tests/support/ScratchFile.h"
+#include "tests/support/ScratchFolder.h"
+#include "tests/support/ShellCommand.h"
 
 #include <gtest/gtest.h>
 
@@ -19,19 +23,8 @@ namespace fs = std::filesystem;
 
 const std::string kBin = VELMORA_BIN_DIR;
 
-std::string ReadFile(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream content;
-    content << in.rdbuf();
-    return content.str();
-}
-
-void WriteFile(const std::string& path, const std::string& text)
-{
-    std::ofstream out(path, std::ios::binary);
-    out << text;
-}
+using testsupport::ReadFile;
+using testsupport::WriteFile;
 
 struct Outcome {
     int status = -1;
@@ -43,18 +36,14 @@ class E2eRun : public testing::Test {
 protected:
     void SetUp() override
     {
-        std::string pattern = (fs::temp_directory_path() / "e2e_run_XXXXXX").string();
-        m_root = ::mkdtemp(pattern.data());
         for (const char* folder : {"tmp", "record", "docs"})
-            fs::create_directory(fs::path(m_root) / folder);
+            m_scratch.MakeFolder(folder);
         m_env = {{"VELMORA_ENGINE", RECORDING_ENGINE},
                  {"VELMORA_TEST_RECORD", Path("record")},
                  {"TMPDIR", Path("tmp")},
                  {"VELMORA_TEST_EXIT", "0"}};
     }
-    void TearDown() override { fs::remove_all(m_root); }
-
-    std::string Path(const std::string& name) const { return (fs::path(m_root) / name).string(); }
+    std::string Path(const std::string& name) const { return m_scratch.File(name); }
 
     // Runs the host program with the test's environment; arguments are passed through the shell
     // quoted, so they must not hold single quotes.
@@ -64,9 +53,8 @@ protected:
         for (const auto& [name, value] : m_env)
             command += name + "='" + value + "' ";
         command += "'" + kBin + "/velmora' " + arguments + " >'" + Path("out.txt") + "' 2>'" + Path("err.txt") + "'";
-        int raw = std::system(command.c_str());
         Outcome outcome;
-        outcome.status = WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
+        outcome.status = testsupport::ShellStatus(command);
         outcome.out = ReadFile(Path("out.txt"));
         outcome.err = ReadFile(Path("err.txt"));
         return outcome;
@@ -74,7 +62,7 @@ protected:
 
     bool EngineStarted() const { return fs::exists(Path("record/args.txt")); }
 
-    std::string m_root;
+    testsupport::ScratchFolder m_scratch{"e2e_run"};
     std::vector<std::pair<std::string, std::string>> m_env;
 };
 
@@ -304,16 +292,11 @@ TEST_F(PluginExports, LoadWpxDocumentReportsIntoABoundedBuffer)
     EXPECT_EQ(load("/nonexistent/setup.wpx", small, sizeof small), 0);
     EXPECT_EQ(std::string(small), "/nonexi");
 
-    std::string pattern = (fs::temp_directory_path() / "e2e_doc_XXXXXX").string();
-    int fd = mkstemp(pattern.data());
-    ASSERT_GE(fd, 0);
-    ::close(fd);
-    WriteFile(pattern, "wpx 1\nwpx end\n");
-    int handle = load(pattern.c_str(), nullptr, 0);
+    const testsupport::ScratchFile document("e2e_doc", ".wpx", "wpx 1\nwpx end\n");
+    int handle = load(document.Path().c_str(), nullptr, 0);
     EXPECT_GT(handle, 0);
     EXPECT_EQ(close(handle), 1);
     EXPECT_EQ(close(handle), 0);
-    fs::remove(pattern);
 }
 
 } // namespace

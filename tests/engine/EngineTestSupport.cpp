@@ -3,44 +3,9 @@
 
 #include <gtest/gtest.h>
 
-#include <cstdlib>
-#include <filesystem>
-#include <fstream>
-#include <sstream>
 #include <sys/stat.h>
-#include <unistd.h>
 
 namespace enginetest {
-
-namespace fs = std::filesystem;
-
-ScratchFolder::ScratchFolder()
-{
-    std::string pattern = (fs::temp_directory_path() / "engine_test_XXXXXX").string();
-    m_path = ::mkdtemp(pattern.data());
-}
-
-ScratchFolder::~ScratchFolder() { fs::remove_all(m_path); }
-
-std::string ScratchFolder::File(const std::string& name) const { return (fs::path(m_path) / name).string(); }
-
-ScopedEnv::ScopedEnv(const char* name, std::optional<std::string> value) : m_name(name)
-{
-    if (const char* previous = std::getenv(name))
-        m_previous = previous;
-    if (value)
-        ::setenv(name, value->c_str(), 1);
-    else
-        ::unsetenv(name);
-}
-
-ScopedEnv::~ScopedEnv()
-{
-    if (m_previous)
-        ::setenv(m_name.c_str(), m_previous->c_str(), 1);
-    else
-        ::unsetenv(m_name.c_str());
-}
 
 std::string WriteRecordingEngine(const ScratchFolder& folder, const std::string& name)
 {
@@ -53,18 +18,14 @@ std::string WriteRecordingEngine(const ScratchFolder& folder, const std::string&
     return path;
 }
 
-std::string ReadFile(const std::string& path)
+void ExpectFirstChoices(const CEngine& engine)
 {
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream content;
-    content << in.rdbuf();
-    return content.str();
-}
-
-void WriteFile(const std::string& path, const std::string& text)
-{
-    std::ofstream out(path, std::ios::binary);
-    out << text;
+    EXPECT_EQ(engine.m_bConstraintsApplied, 0);
+    EXPECT_EQ(engine.m_nInputType, 1);
+    EXPECT_EQ(engine.m_nInputFormat, 1);
+    EXPECT_EQ(engine.m_nTemplateOption, 1);
+    EXPECT_EQ(engine.m_nOutputFormat, 1);
+    EXPECT_EQ(engine.m_bParsed, 0);
 }
 
 WPXHANDLE UseDocument(const std::string& text)

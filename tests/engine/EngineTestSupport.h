@@ -1,39 +1,21 @@
 #pragma once
-// Helpers the engine tests share: a private folder, environment overrides, a small template
-// class, and an engine program stand-in that records how it was started.
+// Helpers the engine tests share: a small template class, an engine program stand-in that records
+// how it was started, and the module's current document.
+#include "engine/Engine.h"
 #include "platform/wpx/Wpx.h"
 #include "templates/Specification.h"
+#include "tests/support/Files.h"
+#include "tests/support/ScopedEnv.h"
+#include "tests/support/ScratchFolder.h"
 
-#include <optional>
 #include <string>
 
 namespace enginetest {
 
-class ScratchFolder {
-public:
-    ScratchFolder();
-    ~ScratchFolder();
-    ScratchFolder(const ScratchFolder&) = delete;
-    ScratchFolder& operator=(const ScratchFolder&) = delete;
-    std::string File(const std::string& name) const;
-    const std::string& Path() const { return m_path; }
-
-private:
-    std::string m_path;
-};
-
-// Sets (or, with nullopt, removes) an environment variable until the end of the scope.
-class ScopedEnv {
-public:
-    ScopedEnv(const char* name, std::optional<std::string> value);
-    ~ScopedEnv();
-    ScopedEnv(const ScopedEnv&) = delete;
-    ScopedEnv& operator=(const ScopedEnv&) = delete;
-
-private:
-    std::string m_name;
-    std::optional<std::string> m_previous;
-};
+using testsupport::ReadFile;
+using testsupport::ScopedEnv;
+using testsupport::ScratchFolder;
+using testsupport::WriteFile;
 
 // A template whose Save only records where it was asked to write.
 class TestSpecification : public CSpecification {
@@ -51,8 +33,9 @@ public:
 // $ENGINE_TEST_EXIT (0 when unset). Returns its path.
 std::string WriteRecordingEngine(const ScratchFolder& folder, const std::string& name = "engine.sh");
 
-std::string ReadFile(const std::string& path);
-void WriteFile(const std::string& path, const std::string& text);
+// The choices of a setup no one has made yet: one input file, the first input and output formats,
+// a template file, nothing parsed and no constraints applied.
+void ExpectFirstChoices(const CEngine& engine);
 
 // Parses a document and makes it the module's current one; returns its handle.
 WPXHANDLE UseDocument(const std::string& text);

@@ -183,12 +183,7 @@ TEST_F(SetupStorage, NoDocumentKeepsEveryDefault)
     CString name = "x", log = "x";
     engine.GetSetupName(name);
     engine.GetLogFileDir(log);
-    EXPECT_EQ(engine.m_bConstraintsApplied, 0);
-    EXPECT_EQ(engine.m_nInputType, 1);
-    EXPECT_EQ(engine.m_nInputFormat, 1);
-    EXPECT_EQ(engine.m_nTemplateOption, 1);
-    EXPECT_EQ(engine.m_nOutputFormat, 1);
-    EXPECT_EQ(engine.m_bParsed, 0);
+    enginetest::ExpectFirstChoices(engine);
     for (const CString* text : {&engine.m_strInputFile, &engine.m_strInputBridge, &engine.m_strInputFolder,
                                 &engine.m_strTemplateName, &engine.m_strOutputBridge, &engine.m_strOutputFile,
                                 &engine.m_strOutputFolder, &engine.m_strOutputTitle, &engine.m_strPreviewFile,

@@ -1,42 +1,18 @@
 #pragma once
-// Shared by the parser tests: a private scratch folder, files written into it, and the message
-// boxes a scripted user interface recorded, as string ids.
+// Shared by the parser tests: an ASCII parser on a file of the test's own, and the message boxes a
+// scripted user interface recorded, as string ids.
+#include "parsers/AsciiFilePreviewParser.h"
 #include "platform/ui/UserInterface.h"
 #include "resources/StringTable.h"
+#include "templates/AsciiSpecification.h"
+#include "tests/support/ScratchFolder.h"
 
-#include <cstdlib>
-#include <filesystem>
-#include <fstream>
+#include <gtest/gtest.h>
+
 #include <string>
 #include <vector>
 
 namespace parsertest {
-
-class ScratchFolder {
-public:
-    ScratchFolder()
-    {
-        std::string pattern = (std::filesystem::temp_directory_path() / "velmora-parse-XXXXXX").string();
-        m_path = ::mkdtemp(pattern.data());
-    }
-    ~ScratchFolder()
-    {
-        std::error_code ignored;
-        std::filesystem::remove_all(m_path, ignored);
-    }
-    ScratchFolder(const ScratchFolder&) = delete;
-    ScratchFolder& operator=(const ScratchFolder&) = delete;
-
-    std::string Path(const std::string& name) const { return m_path + "/" + name; }
-    std::string Write(const std::string& name, const std::string& content) const
-    {
-        std::ofstream(Path(name), std::ios::binary) << content;
-        return Path(name);
-    }
-
-private:
-    std::string m_path;
-};
 
 // The string id of each recorded box, or -1 for a text the string table does not hold.
 inline std::vector<int> MessageIds(const ui::ScriptedUserInterface& ui)
@@ -51,5 +27,32 @@ inline std::vector<int> MessageIds(const ui::ScriptedUserInterface& ui)
     }
     return ids;
 }
+
+// The ASCII preview parser with a template that gives every item's type, unit and value type
+// itself, so that only names and data come from the file; message boxes are recorded in `ui`.
+class AsciiParserFixture : public ::testing::Test {
+protected:
+    AsciiParserFixture()
+    {
+        parser.m_pSpecification = &spec;
+        spec.m_DataDesc.m_nUnitTypeOption = 0;
+        spec.m_DataDesc.m_nUnitOption = 0;
+        spec.m_DataDesc.m_nValueTypeOption = 0;
+    }
+
+    // Writes `content` as the file to parse; returns its path.
+    std::string Bind(const std::string& content)
+    {
+        const std::string path = folder.Write("data.txt", content);
+        parser.SetFile(path);
+        return path;
+    }
+
+    testsupport::ScratchFolder folder;
+    ui::ScriptedUserInterface ui;
+    ui::ScopedUserInterface scope{ui};
+    CAsciiSpecification spec;
+    CAsciiFilePreviewParser parser;
+};
 
 } // namespace parsertest

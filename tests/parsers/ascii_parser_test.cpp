@@ -11,19 +11,9 @@ namespace {
 using parsertest::MessageIds;
 using Ids = std::vector<int>;
 
-class AsciiParserTest : public ::testing::Test {
+// Most cases give types, units and value types for all items, so the header rows do not matter.
+class AsciiParserTest : public parsertest::AsciiParserFixture {
 protected:
-    AsciiParserTest()
-    {
-        parser.m_pSpecification = &spec;
-        // Most cases give types, units and value types for all items, so the header rows do not matter.
-        spec.m_DataDesc.m_nUnitTypeOption = 0;
-        spec.m_DataDesc.m_nUnitOption = 0;
-        spec.m_DataDesc.m_nValueTypeOption = 0;
-    }
-
-    void Bind(const std::string& content) { parser.SetFile(folder.Write("data.txt", content)); }
-
     // A tab file: a header line, the name line, then `lines` data lines.
     static std::string TabFile(int lines)
     {
@@ -32,12 +22,6 @@ protected:
             content += "2020/01/01 " + std::to_string(10 + i % 10) + ":00:00\t" + std::to_string(i) + ".5\t2\n";
         return content;
     }
-
-    parsertest::ScratchFolder folder;
-    ui::ScriptedUserInterface ui;
-    ui::ScopedUserInterface scope{ui};
-    CAsciiSpecification spec;
-    CAsciiFilePreviewParser parser;
 };
 
 TEST_F(AsciiParserTest, TabLayoutGivesNamesMetadataAndStampedRows)
@@ -422,7 +406,7 @@ TEST_F(AsciiParserTest, FormatThatSpansNoFieldEndsTheParse)
 
 TEST_F(AsciiParserTest, MissingFileOrTemplateFailsSilently)
 {
-    parser.SetFile(folder.Path("absent.txt"));
+    parser.SetFile(folder.File("absent.txt"));
     int count = 7;
     CStringList list;
     EXPECT_EQ(parser.GetItemCount(count), 0);
@@ -444,7 +428,7 @@ TEST_F(AsciiParserTest, MissingFileOrTemplateFailsSilently)
 
 TEST_F(AsciiParserTest, UnreadableFileRaisesTheFileException)
 {
-    parser.SetFile(folder.Path("")); // the folder exists but cannot be read as a file
+    parser.SetFile(folder.File("")); // the folder exists but cannot be read as a file
     EXPECT_THROW(parser.Parse(""), CFileException);
     CString line;
     EXPECT_THROW(parser.ReadLine(1, line), CFileException);

@@ -1,42 +1,26 @@
 // Runs `velmora preview` on the example files and on bad arguments, as a user would.
 #include "ParserTestSupport.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/ShellCommand.h"
 
 #include <gtest/gtest.h>
 
-#include <array>
-#include <cstdio>
 #include <string>
-#include <sys/wait.h>
 
 namespace {
 
-struct CommandRun {
-    int status = -1;
-    std::string out;
-};
+using testsupport::ShellRun;
 
-CommandRun Velmora(const std::string& arguments)
+ShellRun Velmora(const std::string& arguments)
 {
-    const std::string command = std::string(VELMORA_BIN_DIR) + "/velmora preview " + arguments + " 2>/dev/null";
-    CommandRun run;
-    FILE* pipe = ::popen(command.c_str(), "r");
-    if (!pipe)
-        return run;
-    std::array<char, 4096> buffer;
-    size_t got;
-    while ((got = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0)
-        run.out.append(buffer.data(), got);
-    const int status = ::pclose(pipe);
-    run.status = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-    return run;
+    return testsupport::RunShell(std::string(VELMORA_BIN_DIR) + "/velmora preview " + arguments + " 2>/dev/null");
 }
 
 std::string Example(const std::string& relative) { return std::string(VELMORA_SOURCE_DIR) + "/examples/" + relative; }
 
 TEST(PreviewCommand, AsciiExampleAsJson)
 {
-    const CommandRun run = Velmora(Example("data/river_gauge.txt") + " --format ascii --template " +
+    const ShellRun run = Velmora(Example("data/river_gauge.txt") + " --format ascii --template " +
                             Example("templates/river_gauge.xml") + " --items 1 --json");
     ASSERT_EQ(run.status, 0) << run.out;
     EXPECT_NE(run.out.find("{\"ok\":true,"), std::string::npos);
@@ -48,14 +32,14 @@ TEST(PreviewCommand, AsciiExampleAsJson)
 
 TEST(PreviewCommand, FailedParseReportsItsMessages)
 {
-    parsertest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     const std::string file = folder.Write("bad.txt", "h\nTime\tA\n2020/01/01 00:00:00\t3,5\n");
     CAsciiSpecification spec;
     spec.m_DataDesc.m_nUnitTypeOption = 0;
     spec.m_DataDesc.m_nUnitOption = 0;
     spec.m_DataDesc.m_nValueTypeOption = 0;
-    ASSERT_EQ(spec.Save(folder.Path("t.xml")), 1);
-    const CommandRun run = Velmora(file + " --format ascii --json --template " + folder.Path("t.xml"));
+    ASSERT_EQ(spec.Save(folder.File("t.xml")), 1);
+    const ShellRun run = Velmora(file + " --format ascii --json --template " + folder.File("t.xml"));
     EXPECT_EQ(run.status, 1);
     EXPECT_NE(run.out.find("{\"ok\":false,"), std::string::npos) << run.out;
     const std::string message = "{\"text\":\"" + res::LoadString(res::IDS_DECIMAL_SEPARATOR_MISMATCH) + "\",\"caption\":\"\"}";
@@ -65,7 +49,7 @@ TEST(PreviewCommand, FailedParseReportsItsMessages)
 
 TEST(PreviewCommand, EveryFailureSaysWhichFileAndWhy)
 {
-    parsertest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     const std::string notRbx = folder.Write("text.rbx0", "Time\tA\n");
     const std::string notBook = folder.Write("text.xlsx", "Time\tA\n");
     const std::string bad = folder.Write("bad.txt", "h\nTime\tA\n2020/01/01 00:00:00\t3,5\n");
@@ -73,33 +57,33 @@ TEST(PreviewCommand, EveryFailureSaysWhichFileAndWhy)
         std::string arguments;
         std::string error;
     } cases[] = {
-        {folder.Path("absent.rbx0") + " --format rbx0", folder.Path("absent.rbx0") + ": the file does not exist"},
-        {folder.Path("absent.xlsx") + " --format excel", folder.Path("absent.xlsx") + ": the file does not exist"},
-        {folder.Path("absent.txt") + " --format ascii", folder.Path("absent.txt") + ": the file does not exist"},
+        {folder.File("absent.rbx0") + " --format rbx0", folder.File("absent.rbx0") + ": the file does not exist"},
+        {folder.File("absent.xlsx") + " --format excel", folder.File("absent.xlsx") + ": the file does not exist"},
+        {folder.File("absent.txt") + " --format ascii", folder.File("absent.txt") + ": the file does not exist"},
         {notRbx + " --format rbx0", notRbx + ": "},
         {notBook + " --format excel", notBook + ": "},
         {bad + " --format ascii", bad + ":1: the line gives no item type the unit catalogue knows"},
         {"/dev/zero --format ascii", "/dev/zero: it is a device, not a regular file"},
     };
     for (const auto& c : cases) {
-        const CommandRun json = Velmora(c.arguments + " --json");
+        const ShellRun json = Velmora(c.arguments + " --json");
         EXPECT_EQ(json.status, 1) << c.arguments;
         EXPECT_NE(json.out.find("\"error\":\"" + c.error), std::string::npos) << json.out;
         EXPECT_EQ(json.out.find("\"error\":\"\""), std::string::npos) << json.out;
-        const CommandRun text = Velmora(c.arguments);
+        const ShellRun text = Velmora(c.arguments);
         EXPECT_EQ(text.status, 1) << c.arguments;
         EXPECT_NE(text.out.find("Parse failed: "), std::string::npos) << text.out;
         EXPECT_NE(text.out.find(c.error), std::string::npos) << text.out;
     }
     // A success has no error.
-    const CommandRun good = Velmora(Example("data/river_gauge.rbx0") + " --format rbx0 --json");
+    const ShellRun good = Velmora(Example("data/river_gauge.rbx0") + " --format rbx0 --json");
     EXPECT_EQ(good.status, 0);
     EXPECT_EQ(good.out.find("\"error\""), std::string::npos);
 }
 
 TEST(PreviewCommand, RbxExampleAsTable)
 {
-    const CommandRun run = Velmora(Example("data/river_gauge.rbx0") + " --format rbx0");
+    const ShellRun run = Velmora(Example("data/river_gauge.rbx0") + " --format rbx0");
     ASSERT_EQ(run.status, 0);
     EXPECT_EQ(run.out.find("Input file"), std::string::npos); // rbx0 files have no raw lines
     EXPECT_NE(run.out.find("Date/time"), std::string::npos);
@@ -120,7 +104,7 @@ TEST(PreviewCommand, BadUsage)
 
 TEST(PreviewCommand, UnloadableTemplateFails)
 {
-    parsertest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     const std::string tmpl = folder.Write("broken.xml", "<not a template");
     EXPECT_EQ(Velmora(Example("data/river_gauge.txt") + " --format ascii --template " + tmpl).status, 1);
 }

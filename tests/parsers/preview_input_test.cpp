@@ -6,6 +6,7 @@
 #include "parsers/ParserFactory.h"
 #include "platform/system/TextFileInput.h"
 #include "templates/AsciiSpecification.h"
+#include "tests/support/Files.h"
 #include "tests/support/Utf16.h"
 
 #include <gtest/gtest.h>
@@ -17,39 +18,17 @@ namespace {
 
 using parsertest::MessageIds;
 
+using testsupport::Contains;
 using testsupport::Utf16;
 
-bool Contains(const std::string& text, const std::string& part) { return text.find(part) != std::string::npos; }
-
-class PreviewInputTest : public ::testing::Test {
+class PreviewInputTest : public parsertest::AsciiParserFixture {
 protected:
-    PreviewInputTest()
-    {
-        parser.m_pSpecification = &spec;
-        spec.m_DataDesc.m_nUnitTypeOption = 0;
-        spec.m_DataDesc.m_nUnitOption = 0;
-        spec.m_DataDesc.m_nValueTypeOption = 0;
-    }
-
-    std::string Bind(const std::string& content)
-    {
-        const std::string path = folder.Write("data.txt", content);
-        parser.SetFile(path);
-        return path;
-    }
-
     // Names on line 1, data from line 2.
     void NamesOnLineOne()
     {
         spec.m_DataDesc.m_nItemDescriptionRow = 1;
         spec.m_DataDesc.m_nStartRow = 2;
     }
-
-    parsertest::ScratchFolder folder;
-    ui::ScriptedUserInterface ui;
-    ui::ScopedUserInterface scope{ui};
-    CAsciiSpecification spec;
-    CAsciiFilePreviewParser parser;
 };
 
 TEST_F(PreviewInputTest, ByteOrderMarksAndUtf16AreReadAsText)
@@ -92,7 +71,7 @@ TEST_F(PreviewInputTest, FilesPythonWritesWithAMarkOrInUtf16)
     spec.m_strDelimiter = "Comma";
     NamesOnLineOne();
     for (const char* encoding : {"utf-8-sig", "utf-16", "utf-16-le"}) {
-        const std::string path = folder.Path(std::string("python-") + encoding + ".csv");
+        const std::string path = folder.File(std::string("python-") + encoding + ".csv");
         const std::string script = "import csv; w = csv.writer(open('" + path + "', 'w', newline='', encoding='" +
                                    encoding + "')); w.writerow(['Time', 'Pegel \\u00d6hringen']);"
                                    " w.writerows([['2020/01/01 00:00:00', 1.5], ['2020/01/01 01:00:00', 2.5]])";
@@ -157,10 +136,10 @@ TEST_F(PreviewInputTest, LongLinesAreShownCutButParsedWhole)
 
 TEST_F(PreviewInputTest, FifosDevicesAndFoldersAreRefused)
 {
-    const std::string fifo = folder.Path("fifo");
+    const std::string fifo = folder.File("fifo");
     ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
     const std::pair<std::string, const char*> cases[] = {
-        {fifo, "FIFO"}, {"/dev/zero", "device"}, {folder.Path(""), "folder"}};
+        {fifo, "FIFO"}, {"/dev/zero", "device"}, {folder.File(""), "folder"}};
     for (const auto& [path, kind] : cases) {
         parser.SetFile(path);
         EXPECT_EQ(ParseGuarded(parser, ""), 0) << path;
@@ -264,14 +243,14 @@ TEST_F(PreviewInputTest, EveryFailureNamesTheFileTheLineAndTheReason)
         EXPECT_EQ(parser.m_strFailure, path + c.failure) << c.label;
     }
 
-    parser.SetFile(folder.Path("absent.txt"));
+    parser.SetFile(folder.File("absent.txt"));
     EXPECT_EQ(ParseGuarded(parser, ""), 0);
-    EXPECT_EQ(parser.m_strFailure, folder.Path("absent.txt") + ": the file does not exist");
+    EXPECT_EQ(parser.m_strFailure, folder.File("absent.txt") + ": the file does not exist");
     EXPECT_EQ(parser.ReadRawLines(""), 0);
-    EXPECT_EQ(parser.m_strFailure, folder.Path("absent.txt") + ": the file does not exist");
+    EXPECT_EQ(parser.m_strFailure, folder.File("absent.txt") + ": the file does not exist");
     parser.m_pSpecification = nullptr;
     EXPECT_EQ(ParseGuarded(parser, ""), 0);
-    EXPECT_EQ(parser.m_strFailure, folder.Path("absent.txt") + ": there is no template to read it with");
+    EXPECT_EQ(parser.m_strFailure, folder.File("absent.txt") + ": there is no template to read it with");
 
     // A success leaves no reason behind.
     parser.m_pSpecification = &spec;

@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
 #include <sys/stat.h>
 
 namespace {
@@ -34,7 +35,7 @@ class RbxParserTest : public ::testing::Test {
 protected:
     std::string Write(const rbx::FileDefinition& definition, const std::vector<Step>& steps)
     {
-        const std::string path = folder.Path("series.rbx0");
+        const std::string path = folder.File("series.rbx0");
         rbx::CRbxWriter writer;
         EXPECT_TRUE(writer.Open(path, definition)) << writer.status().problem().Describe();
         for (const Step& step : steps)
@@ -61,7 +62,7 @@ protected:
         return stamps;
     }
 
-    parsertest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     ui::ScriptedUserInterface ui;
     ui::ScopedUserInterface scope{ui};
     CRbxPreviewFileParser parser;
@@ -199,10 +200,10 @@ TEST_F(RbxParserTest, UnreadableFilesGiveZeroQuietly)
     }
     const std::string damaged = folder.Write("damaged.rbx0", bytes.substr(0, bytes.size() / 2));
     const std::string text = folder.Write("text.rbx0", "Time\tA\n");
-    const std::string fifo = folder.Path("fifo.rbx0");
+    const std::string fifo = folder.File("fifo.rbx0");
     ASSERT_EQ(::mkfifo(fifo.c_str(), 0600), 0);
     const std::pair<std::string, const char*> cases[] = {
-        {damaged, "rbx0 header"}, {text, "rbx0"}, {folder.Path("absent.rbx0"), "does not exist"}, {fifo, "FIFO"}};
+        {damaged, "rbx0 header"}, {text, "rbx0"}, {folder.File("absent.rbx0"), "does not exist"}, {fifo, "FIFO"}};
     for (const auto& [path, reason] : cases) {
         parser.m_vecRows = {{"old"}};
         EXPECT_EQ(ParseGuarded(parser, path), 0) << path;

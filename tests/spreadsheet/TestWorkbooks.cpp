@@ -1,51 +1,20 @@
 #include "TestWorkbooks.h"
+#include "tests/support/ScratchFolder.h"
 
 #include <gtest/gtest.h>
 
-#include <filesystem>
-#include <fstream>
 #include <stdexcept>
-#include <unistd.h>
 
 namespace sheettest {
 
-namespace {
-
-class TempFolder {
-public:
-    TempFolder()
-    {
-        m_path = std::filesystem::temp_directory_path() / ("velmora_sheet_test_" + std::to_string(getpid()));
-        std::filesystem::create_directories(m_path);
-    }
-    ~TempFolder()
-    {
-        std::error_code ignored;
-        std::filesystem::remove_all(m_path, ignored);
-    }
-    const std::filesystem::path& Path() const { return m_path; }
-
-private:
-    std::filesystem::path m_path;
-};
-
-} // namespace
-
 std::string TempFile(const std::string& name)
 {
-    static TempFolder folder;
-    return (folder.Path() / name).string();
+    return testsupport::ProgramScratchFile(name);
 }
 
 std::string DataFile(const std::string& name)
 {
     return std::string(VELMORA_TEST_DATA) + "/spreadsheet/" + name;
-}
-
-void WriteFile(const std::string& path, const std::string& bytes)
-{
-    std::ofstream out(path, std::ios::binary);
-    out << bytes;
 }
 
 XlsxBuilder::XlsxBuilder(const std::string& path, bool constantMemory) : m_path(path)

@@ -1,6 +1,8 @@
 #pragma once
 // Test workbooks written by libxlsxwriter, an independent writer of the format, into a
 // temporary folder that is removed when the test program ends.
+#include "tests/support/Files.h"
+
 #include <xlsxwriter.h>
 
 #include <map>
@@ -12,7 +14,7 @@ namespace sheettest {
 std::string TempFile(const std::string& name);
 // A file of the test data folder (tests/data/spreadsheet).
 std::string DataFile(const std::string& name);
-void WriteFile(const std::string& path, const std::string& bytes);
+using testsupport::WriteFile;
 
 class XlsxBuilder {
 public:

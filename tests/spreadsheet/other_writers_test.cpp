@@ -19,14 +19,6 @@ using sheettest::TempFile;
 
 namespace {
 
-std::string ReadBytes(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream bytes;
-    bytes << in.rdbuf();
-    return bytes.str();
-}
-
 // Rows of 12 cells: a date, then r * 0.25 + c; 65,536 rows make a 7.5 MB file with one DIFAT sector.
 const char* kXlwtRows = R"(
 import sys, datetime, xlwt
@@ -65,9 +57,9 @@ TEST(OtherWriters, XlwtWorkbookOf65536RowsReadsWholeThroughItsDifatChain)
     if (!pytools::Has("xlwt"))
         GTEST_SKIP() << "/usr/bin/python3 with xlwt is not available";
     const std::string path = TempFile("xlwt-65536.xls");
-    const pytools::Result made = pytools::Run(kXlwtRows, pytools::Quote(path) + " 65536 12");
+    const pytools::Result made = pytools::Run(kXlwtRows, testsupport::ShellQuote(path) + " 65536 12");
     ASSERT_EQ(made.status, 0) << made.output;
-    const std::string bytes = ReadBytes(path);
+    const std::string bytes = testsupport::ReadFile(path);
     ASSERT_GE(bytes.size(), 512u);
     ASSERT_GE(Load32(reinterpret_cast<const unsigned char*>(bytes.data()) + 72), 1u) << "the file needs a DIFAT sector";
 
@@ -106,7 +98,7 @@ TEST(OtherWriters, EveryFaultOfADifatChainIsNamed)
     for (int i = 0; i < 8; ++i) // 8 MiB: 16,384 sectors, 130 table sectors, one DIFAT sector
         ASSERT_TRUE(writer.Append(block));
     ASSERT_TRUE(writer.Close("Workbook"));
-    const std::string good = ReadBytes(base);
+    const std::string good = testsupport::ReadFile(base);
     const auto field = [&](const std::string& bytes, size_t at) {
         return Load32(reinterpret_cast<const unsigned char*>(bytes.data()) + at);
     };
@@ -154,7 +146,7 @@ for i in range(3):
     sheet.append([datetime.datetime(2021, 1, 1, i), i, 2, "=B%d+C%d" % (i + 2, i + 2)])
 book.save(sys.argv[1])
 )",
-                                              pytools::Quote(path));
+                                              testsupport::ShellQuote(path));
     ASSERT_EQ(made.status, 0) << made.output;
 
     auto app = StartApplication(ApplicationSettings());
@@ -189,7 +181,7 @@ sheet.write(0, 0, 1.5)
 sheet.write(0, 1, xlwt.Formula("A1*2"))
 book.save(sys.argv[1])
 )",
-                                              pytools::Quote(path));
+                                              testsupport::ShellQuote(path));
     ASSERT_EQ(made.status, 0) << made.output;
     WorkbookReader reader;
     ASSERT_TRUE(reader.Open(path)) << reader.status().problem().message;

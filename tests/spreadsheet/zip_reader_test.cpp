@@ -19,11 +19,7 @@ using sheet::ZipReader;
 
 namespace {
 
-std::string ReadFile(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(in), {});
-}
+using testsupport::ReadFile;
 
 std::string Noise(std::size_t size)
 {

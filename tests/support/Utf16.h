@@ -1,5 +1,5 @@
 #pragma once
-// UTF-16 bytes of a UTF-8 text, without a byte-order mark, for tests that write UTF-16 files.
+// UTF-16 bytes of a UTF-8 text, for tests that write UTF-16 files.
 #include <string>
 #include <string_view>
 
@@ -28,6 +28,13 @@ inline std::string Utf16(std::string_view utf8, bool bigEndian)
         }
     }
     return bytes;
+}
+
+// The same, after a byte-order mark when `mark` is set.
+inline std::string Utf16(std::string_view utf8, bool bigEndian, bool mark)
+{
+    const std::string bom = !mark ? "" : bigEndian ? "\xFE\xFF" : "\xFF\xFE";
+    return bom + Utf16(utf8, bigEndian);
 }
 
 } // namespace testsupport

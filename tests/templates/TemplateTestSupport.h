@@ -1,68 +1,17 @@
 #pragma once
-// Helpers for the template tests: a scratch folder, byte-level file access, UTF-16 text, and a
-// full listing of a template's values so that two templates compare with a readable difference.
+// Helpers for the template tests: a full listing of a template's values so that two templates
+// compare with a readable difference, and a template with every value set.
 #include "templates/Specification.h"
+#include "tests/support/Files.h"
+#include "tests/support/ScratchFolder.h"
+#include "tests/support/Utf16.h"
 
 #include <gtest/gtest.h>
 
-#include <cstdlib>
-#include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <sstream>
 #include <string>
 
 namespace testsupport {
-
-class ScratchFolder {
-public:
-    ScratchFolder()
-    {
-        std::string pattern = (std::filesystem::temp_directory_path() / "velmora-templates-XXXXXX").string();
-        if (!mkdtemp(pattern.data()))
-            ADD_FAILURE() << "cannot create a scratch folder";
-        m_path = pattern;
-    }
-    ~ScratchFolder()
-    {
-        std::error_code ignored;
-        std::filesystem::remove_all(m_path, ignored);
-    }
-    std::string File(const std::string& name) const { return m_path + "/" + name; }
-
-private:
-    std::string m_path;
-};
-
-inline std::string ReadBytes(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(in), {});
-}
-
-inline void WriteBytes(const std::string& path, const std::string& bytes)
-{
-    std::ofstream out(path, std::ios::binary);
-    out << bytes;
-}
-
-// ASCII text as UTF-16 code units in the given byte order, optionally with a byte-order mark.
-inline std::string Utf16(const std::string& ascii, bool bigEndian, bool bom)
-{
-    std::string out;
-    if (bom)
-        out += bigEndian ? std::string("\xFE\xFF") : std::string("\xFF\xFE");
-    for (char c : ascii) {
-        if (bigEndian) {
-            out += '\0';
-            out += c;
-        } else {
-            out += c;
-            out += '\0';
-        }
-    }
-    return out;
-}
 
 // Every value of a template, one per line, in a fixed order.
 inline std::string Describe(const CSpecification& s)

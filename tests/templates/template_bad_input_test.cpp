@@ -125,10 +125,10 @@ TEST(TemplateBadInput, ExtremeButValidNumbersAreAccepted)
 TEST(TemplateBadInput, FilesThatCannotBeRead)
 {
     ScratchFolder folder;
-    WriteBytes(folder.File("empty.xml"), "");
+    WriteFile(folder.File("empty.xml"), "");
     std::string big(tmplfile::kMaxFileBytes + 1, ' ');
     big.replace(0, 29, "<ASCIITSBridgeSpecification/>");
-    WriteBytes(folder.File("big.xml"), big);
+    WriteFile(folder.File("big.xml"), big);
     struct Case {
         std::string path;
         const char* messagePart;

@@ -1,12 +1,11 @@
 // Runs the host program's template command as a person would and checks output and exit status.
 #include "TemplateTestSupport.h"
+#include "tests/support/ShellCommand.h"
 
 #include "templates/AsciiSpecification.h"
 #include "templates/ExcelSpecification.h"
 
 #include <gtest/gtest.h>
-
-#include <sys/wait.h>
 
 #include <string>
 
@@ -20,24 +19,15 @@ struct CommandRun {
     std::string err;
 };
 
-std::string Quote(const std::string& arg)
-{
-    std::string quoted = "'";
-    for (char c : arg)
-        quoted += c == '\'' ? std::string("'\\''") : std::string(1, c);
-    return quoted + "'";
-}
-
 CommandRun Velmora(const ScratchFolder& folder, const std::string& args)
 {
     const std::string program = std::string(VELMORA_BIN_DIR) + "/velmora";
-    const std::string command = Quote(program) + " template " + args + " >" + Quote(folder.File("out.txt")) + " 2>" +
-                                Quote(folder.File("err.txt")) + " </dev/null";
+    const std::string command = ShellQuote(program) + " template " + args + " >" + ShellQuote(folder.File("out.txt")) + " 2>" +
+                                ShellQuote(folder.File("err.txt")) + " </dev/null";
     CommandRun run;
-    int raw = std::system(command.c_str());
-    run.status = WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
-    run.out = ReadBytes(folder.File("out.txt"));
-    run.err = ReadBytes(folder.File("err.txt"));
+    run.status = ShellStatus(command);
+    run.out = ReadFile(folder.File("out.txt"));
+    run.err = ReadFile(folder.File("err.txt"));
     return run;
 }
 
@@ -46,7 +36,7 @@ CommandRun Velmora(const ScratchFolder& folder, const std::string& args)
 TEST(TemplateCommand, NewWritesTheDefaultsOfEitherKind)
 {
     ScratchFolder folder;
-    CommandRun ascii = Velmora(folder, "new --format ascii " + Quote(folder.File("a.xml")));
+    CommandRun ascii = Velmora(folder, "new --format ascii " + ShellQuote(folder.File("a.xml")));
     ASSERT_EQ(ascii.status, 0) << ascii.err;
     CAsciiSpecification loaded;
     loaded.m_strDelimiter = "Comma";
@@ -54,7 +44,7 @@ TEST(TemplateCommand, NewWritesTheDefaultsOfEitherKind)
     EXPECT_EQ(loaded.m_strDelimiter, "Tab");
     EXPECT_EQ(loaded.m_DataDesc.m_nStartRow, 3);
 
-    CommandRun excel = Velmora(folder, "new --format=excel " + Quote(folder.File("e.xml")));
+    CommandRun excel = Velmora(folder, "new --format=excel " + ShellQuote(folder.File("e.xml")));
     ASSERT_EQ(excel.status, 0) << excel.err;
     CExcelSpecification excelLoaded;
     EXPECT_EQ(excelLoaded.Load(folder.File("e.xml")), 1) << excelLoaded.LastError();
@@ -70,18 +60,18 @@ TEST(TemplateCommand, ShowPrintsTextOrJson)
     spec.m_DataDesc.m_vecItemDefs = {{"Flow", "Flow", "m3/s", "Accumulated"}};
     ASSERT_EQ(spec.Save(folder.File("e.xml")), 1);
 
-    CommandRun text = Velmora(folder, "show " + Quote(folder.File("e.xml")));
+    CommandRun text = Velmora(folder, "show " + ShellQuote(folder.File("e.xml")));
     ASSERT_EQ(text.status, 0) << text.err;
     EXPECT_NE(text.out.find("Kind: excel\n"), std::string::npos) << text.out;
     EXPECT_NE(text.out.find("ExcelSheet: 2\n"), std::string::npos) << text.out;
     EXPECT_NE(text.out.find("Items: 1\n"), std::string::npos) << text.out;
 
-    CommandRun json = Velmora(folder, "show --json " + Quote(folder.File("e.xml")));
+    CommandRun json = Velmora(folder, "show --json " + ShellQuote(folder.File("e.xml")));
     ASSERT_EQ(json.status, 0) << json.err;
     EXPECT_EQ(json.out.rfind("{\"kind\":\"excel\",\"values\":{", 0), 0u) << json.out;
     EXPECT_NE(json.out.find("\"ExcelSheet\":2"), std::string::npos);
     // An independent JSON reader accepts the output and sees the same values.
-    WriteBytes(folder.File("check.py"),
+    WriteFile(folder.File("check.py"),
                "import json,sys\n"
                "d=json.load(open(sys.argv[1],encoding='utf-8'))\n"
                "assert d['kind']=='excel'\n"
@@ -89,23 +79,23 @@ TEST(TemplateCommand, ShowPrintsTextOrJson)
                "assert d['values']['SelItems']==[]\n"
                "assert d['items']==[{'title':'Flow','type':'Flow','unit':'m3/s','valueType':'Accumulated'}]\n"
                "assert len(d['values'])==35\n");
-    std::string check = "python3 " + Quote(folder.File("check.py")) + " " + Quote(folder.File("out.txt"));
+    std::string check = "python3 " + ShellQuote(folder.File("check.py")) + " " + ShellQuote(folder.File("out.txt"));
     EXPECT_EQ(std::system(check.c_str()), 0) << json.out;
 }
 
 TEST(TemplateCommand, FailuresAndBadUsage)
 {
     ScratchFolder folder;
-    WriteBytes(folder.File("bad.xml"), "<ASCIITSBridgeSpecification StartRow='x'/>");
+    WriteFile(folder.File("bad.xml"), "<ASCIITSBridgeSpecification StartRow='x'/>");
     struct Case {
         std::string args;
         int status;
         const char* errorPart;
     } cases[] = {
-        {"show " + Quote(folder.File("missing.xml")), 1, "missing.xml: cannot be opened"},
-        {"show " + Quote(folder.File("bad.xml")), 1, "StartRow must be a whole number"},
-        {"show --json " + Quote(folder.File("bad.xml")), 1, "bad.xml"},
-        {"new --format ascii " + Quote(folder.File("no/such/folder.xml")), 1, "cannot be written"},
+        {"show " + ShellQuote(folder.File("missing.xml")), 1, "missing.xml: cannot be opened"},
+        {"show " + ShellQuote(folder.File("bad.xml")), 1, "StartRow must be a whole number"},
+        {"show --json " + ShellQuote(folder.File("bad.xml")), 1, "bad.xml"},
+        {"new --format ascii " + ShellQuote(folder.File("no/such/folder.xml")), 1, "cannot be written"},
         {"show", 2, "needs a template file"},
         {"show a.xml b.xml", 2, "one template file"},
         {"show --yaml a.xml", 2, "unknown option"},

@@ -127,7 +127,7 @@ TEST(TemplateFile, SavedAsciiFileBytes)
     spec.m_arrSelItems = {1, 2, 3};
     spec.m_DataDesc.m_vecItemDefs = {{"A", "B", "C", "D"}};
     ASSERT_EQ(spec.Save(folder.File("a.xml")), 1);
-    std::string bytes = ReadBytes(folder.File("a.xml"));
+    std::string bytes = ReadFile(folder.File("a.xml"));
     ASSERT_GE(bytes.size(), 4u);
     EXPECT_EQ(bytes.substr(0, 2), "\xFF\xFE");
     std::string xml = AsciiFromUtf16Le(bytes.substr(2));
@@ -159,7 +159,7 @@ TEST(TemplateFile, SavedExcelFileBytes)
     spec.m_DataDesc.m_nDeleteValueRadio = 5;  // flag of the equals-one form
     spec.m_DataDesc.m_nUnitTypeOption = 2;
     ASSERT_EQ(spec.Save(folder.File("e.xml")), 1);
-    std::string xml = AsciiFromUtf16Le(ReadBytes(folder.File("e.xml")).substr(2));
+    std::string xml = AsciiFromUtf16Le(ReadFile(folder.File("e.xml")).substr(2));
     EXPECT_EQ(xml.rfind("<?xml version='1.0'   encoding='UTF-16'?>", 0), 0u);
     EXPECT_EQ(RootAttributeNames(xml, "MSExcelTSBridgeSpecification"),
               std::vector<std::string>(std::begin(kExcelOrder), std::end(kExcelOrder)));
@@ -186,7 +186,7 @@ TEST(TemplateFile, SaveFallsBackToTheSaveFileAndReportsFailures)
     EXPECT_FALSE(spec.LastError().empty());
     spec.m_strSaveFile = folder.File("chosen.xml");
     EXPECT_EQ(spec.Save(""), 1);
-    EXPECT_FALSE(ReadBytes(folder.File("chosen.xml")).empty());
+    EXPECT_FALSE(ReadFile(folder.File("chosen.xml")).empty());
     EXPECT_EQ(spec.Save(folder.File("missing/folder/t.xml")), 0);
     EXPECT_NE(spec.LastError().find("missing/folder/t.xml"), std::string::npos) << spec.LastError();
     EXPECT_EQ(spec.Save(folder.File("")), 0); // a folder, not a file

@@ -92,7 +92,7 @@ TEST(TemplateReport, OpensTheKindTheRootNames)
     CAsciiSpecification ascii;
     ascii.m_strDelimiter = "Comma";
     ASSERT_EQ(ascii.Save(folder.File("a.xml")), 1);
-    WriteBytes(folder.File("nested.xml"), "<wrap><x/><MSExcelTSBridgeSpecification ExcelSheet='6'/>"
+    WriteFile(folder.File("nested.xml"), "<wrap><x/><MSExcelTSBridgeSpecification ExcelSheet='6'/>"
                                           "<ASCIITSBridgeSpecification/></wrap>");
     struct Case {
         const char* file;
@@ -114,8 +114,8 @@ TEST(TemplateReport, OpensTheKindTheRootNames)
 TEST(TemplateReport, FilesThatAreNoTemplatesGiveAReason)
 {
     ScratchFolder folder;
-    WriteBytes(folder.File("other.xml"), "<Setup/>");
-    WriteBytes(folder.File("broken.xml"), "<MSExcelTSBridgeSpecification ExcelSheet='x'/>");
+    WriteFile(folder.File("other.xml"), "<Setup/>");
+    WriteFile(folder.File("broken.xml"), "<MSExcelTSBridgeSpecification ExcelSheet='x'/>");
     struct Case {
         const char* file;
         const char* reason;

@@ -68,7 +68,7 @@ protected:
         return texts;
     }
 
-    TempFolder scratch;
+    ScratchFolder scratch;
     Inputs inputs{scratch};
     ui::ScriptedUserInterface screen;
     ui::ScopedUserInterface watching{screen};

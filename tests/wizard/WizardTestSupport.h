@@ -2,7 +2,8 @@
 // What the wizard tests share: input files of every format with a template each, written the way
 // users get them (the engine's own writers for text and rbx0, a spreadsheet library for .xlsx),
 // and a setup record pointed at a scratch temporary folder.
-#include "tests/checks/CheckTestSupport.h"
+#include "tests/engine/CheckTestSupport.h"
+#include "tests/support/XlsxWorkbook.h"
 
 #include "converter/AsciiSeriesWriter.h"
 #include "converter/RbxSeriesWriter.h"
@@ -10,7 +11,6 @@
 #include "templates/ExcelSpecification.h"
 
 #include <gtest/gtest.h>
-#include <xlsxwriter.h>
 
 #include <filesystem>
 #include <string>
@@ -18,7 +18,7 @@
 namespace wizardtest {
 
 using checktest::ScopedEnv;
-using checktest::TempFolder;
+using checktest::ScratchFolder;
 
 // The three items every input holds.
 inline const char* const kItemNames[] = {"Level", "Flow", "Rain"};
@@ -44,36 +44,30 @@ inline void WriteSeries(converter::SeriesWriter& writer, const std::string& path
 // A workbook as the spreadsheet application saves it, in the layout a new Excel template reads.
 inline void WriteWorkbook(const std::string& path)
 {
-    lxw_workbook* workbook = workbook_new(path.c_str());
-    ASSERT_NE(workbook, nullptr);
-    lxw_worksheet* sheet = workbook_add_worksheet(workbook, nullptr);
-    lxw_format* date = workbook_add_format(workbook);
-    format_set_num_format(date, "yyyy/mm/dd hh:mm:ss");
+    testsupport::XlsxWorkbook book(path);
     const char* descriptions[] = {"Water level[m]:Instantaneous", "Discharge[m^3/s]:Instantaneous",
                                   "Rainfall[mm]:Instantaneous"};
-    worksheet_write_string(sheet, 1, 0, "Date/time", nullptr);
-    for (lxw_col_t column = 1; column <= 3; ++column) {
-        worksheet_write_string(sheet, 0, column, descriptions[column - 1], nullptr);
-        worksheet_write_string(sheet, 1, column, kItemNames[column - 1], nullptr);
+    book.Text(2, 1, "Date/time");
+    for (int column = 2; column <= 4; ++column) {
+        book.Text(1, column, descriptions[column - 2]);
+        book.Text(2, column, kItemNames[column - 2]);
     }
     for (int step = 0; step < 4; ++step) {
-        lxw_datetime stamp = {2021, 1, 1, step, 0, 0.0};
-        const auto row = static_cast<lxw_row_t>(2 + step);
-        worksheet_write_datetime(sheet, row, 0, &stamp, date);
-        for (lxw_col_t column = 1; column <= 3; ++column)
-            worksheet_write_number(sheet, row, column, 1.5 * column + step, nullptr);
+        book.DateTime(3 + step, 1, lxw_datetime{2021, 1, 1, step, 0, 0.0}, "yyyy/mm/dd hh:mm:ss");
+        for (int column = 2; column <= 4; ++column)
+            book.Number(3 + step, column, 1.5 * (column - 1) + step);
     }
-    ASSERT_EQ(workbook_close(workbook), LXW_NO_ERROR);
+    ASSERT_TRUE(book.Close());
 }
 
 // Input files of every format: one single file each, a folder of two each, and a template for
 // ASCII and one for Excel. The temporary folder of the process is a scratch folder of its own.
 struct Inputs {
-    explicit Inputs(const TempFolder& scratch)
-        : temp(scratch.MakeFolder("tmp") + "/"), asciiFile(scratch / "gauge.txt"), rbxFile(scratch / "gauge.rbx0"),
-          excelFile(scratch / "gauge.xlsx"), asciiFolder(scratch.MakeFolder("ascii") + "/"),
+    explicit Inputs(const ScratchFolder& scratch)
+        : temp(scratch.MakeFolder("tmp") + "/"), asciiFile(scratch.File("gauge.txt")), rbxFile(scratch.File("gauge.rbx0")),
+          excelFile(scratch.File("gauge.xlsx")), asciiFolder(scratch.MakeFolder("ascii") + "/"),
           rbxFolder(scratch.MakeFolder("rbx") + "/"), excelFolder(scratch.MakeFolder("excel") + "/"),
-          asciiTemplate(scratch / "ascii.xml"), excelTemplate(scratch / "excel.xml"), output(scratch.MakeFolder("out") + "/")
+          asciiTemplate(scratch.File("ascii.xml")), excelTemplate(scratch.File("excel.xml")), output(scratch.MakeFolder("out") + "/")
     {
         converter::AsciiSeriesWriter ascii;
         WriteSeries(ascii, asciiFile);

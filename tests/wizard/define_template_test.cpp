@@ -37,7 +37,7 @@ protected:
     {
         CAsciiSpecification comma;
         comma.m_strDelimiter = "Comma";
-        const std::string path = scratch / "comma.xml";
+        const std::string path = scratch.File("comma.xml");
         EXPECT_EQ(comma.Save(path), 1);
         return path;
     }
@@ -132,7 +132,7 @@ TEST_F(DefineTemplate, TheBrowseDialogSavesOnlyWhenThePagesOptionIsManual)
 TEST_F(DefineTemplate, NoTemplateFileStopsOptionOneBeforeAnythingIsStored)
 {
     ChooseInput(2, true, inputs.asciiFile);
-    EXPECT_FALSE(AcceptDefineTemplate(Choice(1, scratch / "missing.xml"), &engine));
+    EXPECT_FALSE(AcceptDefineTemplate(Choice(1, scratch.File("missing.xml")), &engine));
     EXPECT_EQ(Messages(), std::vector<std::string>{res::LoadString(res::IDS_NO_TEMPLATE_SELECTED)});
     EXPECT_EQ(engine.m_strTemplateName, "");
 }
@@ -140,7 +140,7 @@ TEST_F(DefineTemplate, NoTemplateFileStopsOptionOneBeforeAnythingIsStored)
 TEST_F(DefineTemplate, OptionTwoWithoutItsFileIsStoredButTheUserStays)
 {
     ChooseInput(2, true, inputs.asciiFile);
-    const std::string missing = scratch / "missing.xml";
+    const std::string missing = scratch.File("missing.xml");
     EXPECT_FALSE(AcceptDefineTemplate(Choice(2, missing), &engine));
     EXPECT_EQ(Messages(), std::vector<std::string>{res::LoadString(res::IDS_NO_TEMPLATE_SELECTED)});
     EXPECT_EQ(engine.m_nTemplateOption, 2);

@@ -14,7 +14,7 @@ using namespace wizardtest;
 
 class Output : public testing::Test {
 protected:
-    TempFolder scratch;
+    ScratchFolder scratch;
     ui::ScriptedUserInterface screen;
     ui::ScopedUserInterface watching{screen};
     CEngine engine;
@@ -91,9 +91,9 @@ TEST_F(Output, BrowsingCompletesTheChosenNameAndTheFolderComesAsChosen)
 {
     OutputState state;
     state.format = 3;
-    screen.chosenPaths = {scratch / "book", scratch.Path()};
+    screen.chosenPaths = {scratch.File("book"), scratch.Path()};
     BrowseOutputFile(state, 16);
-    EXPECT_EQ(state.file, scratch / "book.xlsx");
+    EXPECT_EQ(state.file, scratch.File("book.xlsx"));
     BrowseOutputFolder(state);
     EXPECT_EQ(state.folder, scratch.Path());
     ASSERT_EQ(screen.folderRequests.size(), 1u);
@@ -107,25 +107,25 @@ TEST_F(Output, TheCheckStoresAnAcceptedOutputAndKeepsTheOldOneOnRefusal)
     engine.m_strOutputFile = "old.rbx0";
     OutputState state;
     state.format = 2;
-    state.file = scratch / "result.CSV";
+    state.file = scratch.File("result.CSV");
     EXPECT_EQ(ValidateOutput(state, &engine, 16), 0);
     EXPECT_EQ(screen.boxes.back().text, res::LoadString(res::IDS_FILE_NAME_INVALID));
     EXPECT_EQ(engine.m_strOutputFile, "old.rbx0");
 
-    state.file = scratch / "missing-folder/result";
+    state.file = scratch.File("missing-folder/result");
     EXPECT_EQ(ValidateOutput(state, &engine, 16), 0);
     EXPECT_EQ(screen.boxes.back().text, res::LoadString(res::IDS_FILE_INVALID));
     EXPECT_EQ(engine.m_strOutputFile, "old.rbx0");
 
-    state.file = scratch / "result";
+    state.file = scratch.File("result");
     state.title = "Gauge";
     EXPECT_EQ(ValidateOutput(state, &engine, 16), 1);
     EXPECT_EQ(engine.m_nOutputFormat, 2);
-    EXPECT_EQ(engine.m_strOutputFile, scratch / "result.txt");
+    EXPECT_EQ(engine.m_strOutputFile, scratch.File("result.txt"));
     EXPECT_EQ(engine.m_strOutputTitle, "Gauge");
 
     engine.m_nInputType = 2;
-    state.folder = scratch / "none";
+    state.folder = scratch.File("none");
     EXPECT_EQ(ValidateOutput(state, &engine, 16), 0);
     EXPECT_EQ(screen.boxes.back().text, res::LoadString(res::IDS_FOLDER_INVALID));
     state.folder = scratch.Path();

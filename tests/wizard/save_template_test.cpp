@@ -60,10 +60,10 @@ TEST_F(SaveTemplate, TheProposalFollowsTheOptionAndTheInput)
 TEST_F(SaveTemplate, ANameAcceptedOnceIsShownAgainInsteadOfAProposal)
 {
     DescribeByHand(2, inputs.asciiFile);
-    EXPECT_EQ(LoadTemplateName(engine, "typed.xml"), scratch / "template.xml") << "the template has no name yet";
-    ASSERT_TRUE(AcceptTemplateName(scratch / "mine.xml", &engine));
-    EXPECT_EQ(LoadTemplateName(engine, ""), scratch / "mine.xml");
-    EXPECT_EQ(engine.StoredTemplateName(), scratch / "mine.xml") << "the setup refers to it";
+    EXPECT_EQ(LoadTemplateName(engine, "typed.xml"), scratch.File("template.xml")) << "the template has no name yet";
+    ASSERT_TRUE(AcceptTemplateName(scratch.File("mine.xml"), &engine));
+    EXPECT_EQ(LoadTemplateName(engine, ""), scratch.File("mine.xml"));
+    EXPECT_EQ(engine.StoredTemplateName(), scratch.File("mine.xml")) << "the setup refers to it";
 }
 
 TEST_F(SaveTemplate, ANameMustBeAValidFileEndingInXmlInAnyCase)
@@ -73,14 +73,14 @@ TEST_F(SaveTemplate, ANameMustBeAValidFileEndingInXmlInAnyCase)
         std::string name;
         bool accepted;
     };
-    const Case cases[] = {{scratch / "b.XML", true}, {scratch / "b.xml", true},   {scratch / "b.txt", false},
-                          {scratch / "b", false},     {scratch / "b.xml.bak", false}, {scratch / "none/b.xml", false},
-                          {"", false},                {scratch / "", false}};
+    const Case cases[] = {{scratch.File("b.XML"), true}, {scratch.File("b.xml"), true},   {scratch.File("b.txt"), false},
+                          {scratch.File("b"), false},     {scratch.File("b.xml.bak"), false}, {scratch.File("none/b.xml"), false},
+                          {"", false},                {scratch.File(""), false}};
     for (const Case& c : cases) {
         EXPECT_EQ(ValidateTemplateName(c.name, nullptr), c.accepted ? 1 : 0) << c.name;
         EXPECT_EQ(Said(), c.accepted ? "" : invalid) << c.name;
     }
-    EXPECT_EQ(ValidateTemplateName(scratch / "b.txt", &engine), 0);
+    EXPECT_EQ(ValidateTemplateName(scratch.File("b.txt"), &engine), 0);
     ASSERT_EQ(screen.boxes.size(), 1u);
     EXPECT_EQ(screen.boxes[0].type, ui::MB_OK | ui::MB_ICONEXCLAMATION);
     EXPECT_EQ(screen.boxes[0].caption, "");
@@ -132,9 +132,9 @@ TEST_F(SaveTemplate, AHandMadeTemplateAsksBeforeReplacingAFileAndNoKeepsThePage)
     EXPECT_EQ(engine.m_pSpecification->m_strSaveFile, "") << "nothing stored";
 
     screen.boxes.clear();
-    EXPECT_TRUE(AcceptTemplateName(scratch / "fresh.xml", &engine)) << "a new file needs no question";
+    EXPECT_TRUE(AcceptTemplateName(scratch.File("fresh.xml"), &engine)) << "a new file needs no question";
     EXPECT_TRUE(screen.boxes.empty());
-    EXPECT_TRUE(std::filesystem::exists(scratch / "fresh.xml"));
+    EXPECT_TRUE(std::filesystem::exists(scratch.File("fresh.xml")));
 }
 
 } // namespace

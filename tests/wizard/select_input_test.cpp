@@ -101,10 +101,10 @@ TEST_F(SelectInput, RefusedFilesAndFoldersShowTheirMessageAndStoreNothing)
     const Case cases[] = {
         {"ASCII .dat", Single(2, dat), fileInvalid},
         {"ASCII without extension holding a zero byte", Single(2, zeroByte), fileInvalid},
-        {"missing rbx0 file", Single(1, scratch / "none.rbx0"), fileInvalid},
+        {"missing rbx0 file", Single(1, scratch.File("none.rbx0")), fileInvalid},
         {"rbx0 named .txt", Single(1, inputs.asciiFile), fileInvalid},
         {"Excel with Excel absent", Single(3, inputs.excelFile), res::LoadString(res::IDS_EXCEL_MISSING)},
-        {"missing folder", Folder(2, scratch / "none/"), folderInvalid},
+        {"missing folder", Folder(2, scratch.File("none/")), folderInvalid},
         {"folder of hidden files", Folder(2, hiddenOnly + "/"), folderInvalid},
         {"folder without rbx0 files", Folder(1, inputs.asciiFolder), folderInvalid},
     };
@@ -120,7 +120,7 @@ TEST_F(SelectInput, RefusedFilesAndFoldersShowTheirMessageAndStoreNothing)
 
 TEST_F(SelectInput, ATextFileWithoutExtensionIsAcceptedAsAscii)
 {
-    const std::string bare = scratch / "gauge";
+    const std::string bare = scratch.File("gauge");
     std::filesystem::copy_file(inputs.asciiFile, bare);
     EXPECT_TRUE(AcceptSelectInput(Single(2, bare), &engine));
     EXPECT_TRUE(screen.boxes.empty());

@@ -7,22 +7,15 @@
 #include "engine/ModuleHandle.h"
 #include "platform/harbor/qt/OverviewPage.h"
 #include "platform/wpx/Wpx.h"
+#include "tests/support/Files.h"
+#include "tests/support/ShellCommand.h"
 #include "wizard/SetupGui.h"
 
-#include <cstdlib>
-#include <fstream>
-#include <sstream>
-#include <sys/wait.h>
+#include <filesystem>
 
 namespace guitest {
 
-inline std::string ReadFile(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream text;
-    text << in.rdbuf();
-    return text.str();
-}
+using testsupport::ReadFile;
 
 // What a program of ours printed on standard output, and whether it exited with 0.
 struct ProgramRun {
@@ -65,13 +58,13 @@ protected:
     // Runs `program` of ours with `arguments` (each quoted).
     ProgramRun Run(const std::string& program, const std::vector<std::string>& arguments)
     {
-        const std::string out = scratch / "program.out";
-        const std::string err = scratch / "program.err";
+        const std::string out = scratch.File("program.out");
+        const std::string err = scratch.File("program.err");
         std::string command = "'" VELMORA_BIN_DIR "/" + program + "'";
         for (const std::string& argument : arguments)
             command += " '" + argument + "'";
-        const int status = std::system((command + " >'" + out + "' 2>'" + err + "'").c_str());
-        return {WIFEXITED(status) && WEXITSTATUS(status) == 0, ReadFile(out), ReadFile(err)};
+        const int status = testsupport::ShellStatus(command + " >'" + out + "' 2>'" + err + "'");
+        return {status == 0, ReadFile(out), ReadFile(err)};
     }
 
     // Runs the wizard as the plug-in's entry point does, then stores the new document and runs it
@@ -89,14 +82,14 @@ protected:
         EXPECT_TRUE(std::filesystem::is_empty(inputs.temp)) << road << ": the wizard left a working file";
         if (result != kFinished || !GetModuleWpxHandle())
             return std::string();
-        const std::string document = scratch / (road + ".wpx");
+        const std::string document = scratch.File(road + ".wpx");
         EXPECT_EQ(wpxWrite(ModuleWpxDocument(), document), 1);
         const ProgramRun run = Run("velmora", {"run", document});
         EXPECT_TRUE(run.ok) << road << ": " << run.err;
         return run.err;
     }
 
-    wizardtest::TempFolder scratch;
+    wizardtest::ScratchFolder scratch;
     wizardtest::Inputs inputs{scratch};
     ui::ScriptedUserInterface screen;
     ui::ScopedUserInterface watching{screen};

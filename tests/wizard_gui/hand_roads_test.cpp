@@ -1,6 +1,7 @@
 // The roads of the wizard that describe a file by hand or change a template, clicked through on
 // the real widgets: each ends in Finish, a template file that `velmora template show` reads back
 // with the values entered, and a document that `velmora run` converts with the expected values.
+#include "tests/support/XlsxWorkbook.h"
 #include "tests/wizard_gui/RoadTestSupport.h"
 
 #include "wizard/DataDescSettingPage.h"
@@ -99,7 +100,7 @@ TEST_F(HandRoads, AsciiWithTabsDateAndTimeInOneColumnAndADeleteValue)
         SaveAndFinish(d, road, inputs.output + "tab.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    ExpectLines(TemplateShown(scratch / "data/template.xml"),
+    ExpectLines(TemplateShown(scratch.File("data/template.xml")),
                 {"Delimiter: \"Tab\"", "DecimalSeparator: \"Dot\"", "DateTimeOption: 0", "DateTimeFormat: \"YYYY/MM/DD HH:mm:ss\"",
                  "ItemDescriptionRow: 2", "UnitTypeRow: 1", "StartRow: 3", "DeleteValueCheck: 1", "DeleteValueRadio: 0",
                  "DeleteValue: \"-999\"", "SelItems: 0,1,2"});
@@ -126,7 +127,7 @@ TEST_F(HandRoads, AsciiWithBlanksDecimalCommasAndDateAndTimeInTwoColumns)
         SaveAndFinish(d, road, inputs.output + "space.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    ExpectLines(TemplateShown(scratch / "data/template.xml"),
+    ExpectLines(TemplateShown(scratch.File("data/template.xml")),
                 {"Delimiter: \"Space\"", "IgnoreConsecutiveDelimiters: 1", "DecimalSeparator: \"Comma\"",
                  "DateTimeFormat: \"YYYY-MM-DD HH:mm:ss\"", "DeleteValueCheck: 0"});
     ExpectLines(guitest::ReadFile(inputs.output + "space.txt"),
@@ -160,7 +161,7 @@ TEST_F(HandRoads, AsciiWithSemicolonsOneDateForAllRowsAndTheDeleteValueInARow)
         SaveAndFinish(d, road, inputs.output + "semicolon.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    ExpectLines(TemplateShown(scratch / "data/template.xml"),
+    ExpectLines(TemplateShown(scratch.File("data/template.xml")),
                 {"Delimiter: \"Semi Colon\"", "DecimalSeparator: \"Comma\"", "DateTimeOption: 1", "GlobalDate: \"2021-05-01\"",
                  "TimeCol: 1", "StartRow: 4", "DeleteValueCheck: 1", "DeleteValueRadio: 1", "DeleteValueRow: 3"});
     ExpectLines(guitest::ReadFile(inputs.output + "semicolon.txt"),
@@ -202,7 +203,7 @@ TEST_F(HandRoads, AsciiWithNamesTypesUnitsAndValueTypesDefinedInTheGrid)
         SaveAndFinish(d, road, inputs.output + "grid.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    const std::string shown = TemplateShown(scratch / "data/template.xml");
+    const std::string shown = TemplateShown(scratch.File("data/template.xml"));
     ExpectLines(shown, {"ItemTitleOption: 1", "UnitTypeOption: 2", "UnitOption: 2", "ValueTypeOption: 2", "StartRow: 1"});
     ExpectLines(shown, {"  1: title \"Level\", type \"Water Level\", unit \"meter\", value type \"Instantaneous\"",
                         "  2: title \"Flow\", type \"Discharge\", unit \"cubic meter per second\", value type \"Accumulated\""});
@@ -214,29 +215,26 @@ TEST_F(HandRoads, AsciiWithNamesTypesUnitsAndValueTypesDefinedInTheGrid)
 // A workbook whose dates and times are texts in two cells, read with the date/time format.
 void WriteTextStampWorkbook(const std::string& path)
 {
-    lxw_workbook* workbook = workbook_new(path.c_str());
-    ASSERT_NE(workbook, nullptr);
-    lxw_worksheet* sheet = workbook_add_worksheet(workbook, nullptr);
-    worksheet_write_string(sheet, 0, 2, "Water Level[m]:Instantaneous", nullptr);
-    worksheet_write_string(sheet, 0, 3, "Rainfall[mm]:Accumulated", nullptr);
+    testsupport::XlsxWorkbook book(path);
+    book.Text(1, 3, "Water Level[m]:Instantaneous");
+    book.Text(1, 4, "Rainfall[mm]:Accumulated");
     const char* names[] = {"Date", "Time", "Level", "Rain"};
-    for (lxw_col_t column = 0; column < 4; ++column)
-        worksheet_write_string(sheet, 1, column, names[column], nullptr);
+    for (int column = 1; column <= 4; ++column)
+        book.Text(2, column, names[column - 1]);
     for (int step = 0; step < 3; ++step) {
-        const auto row = static_cast<lxw_row_t>(2 + step);
-        worksheet_write_string(sheet, row, 0, "2021-03-01", nullptr);
-        worksheet_write_string(sheet, row, 1, ("0" + std::to_string(step) + ":30:00").c_str(), nullptr);
-        worksheet_write_number(sheet, row, 2, 1.5 + step, nullptr);
-        worksheet_write_number(sheet, row, 3, 0.25 * step, nullptr);
+        book.Text(3 + step, 1, "2021-03-01");
+        book.Text(3 + step, 2, "0" + std::to_string(step) + ":30:00");
+        book.Number(3 + step, 3, 1.5 + step);
+        book.Number(3 + step, 4, 0.25 * step);
     }
-    ASSERT_EQ(workbook_close(workbook), LXW_NO_ERROR);
+    ASSERT_TRUE(book.Close());
 }
 
 TEST_F(HandRoads, ExcelWithTheDateAndTimeTextsReadByTheFormat)
 {
     const std::string road = "excel-by-hand";
     scratch.MakeFolder("data");
-    const std::string file = scratch / "data/stamps.xlsx";
+    const std::string file = scratch.File("data/stamps.xlsx");
     WriteTextStampWorkbook(file);
     const std::string said = RunRoad(road, [&](Driver& d) {
         Describe(d, road, 3, file);
@@ -250,7 +248,7 @@ TEST_F(HandRoads, ExcelWithTheDateAndTimeTextsReadByTheFormat)
         SaveAndFinish(d, road, inputs.output + "excel.txt");
     });
     EXPECT_NE(said.find("Status: OK"), std::string::npos) << said;
-    const std::string shown = TemplateShown(scratch / "data/template.xml");
+    const std::string shown = TemplateShown(scratch.File("data/template.xml"));
     ExpectLines(shown, {"Kind: excel", "UseDTFormat: 1", "DateTimeFormat: \"YYYY-MM-DD|HH:mm:ss\"", "UseTFormat: 0"});
     ExpectLines(guitest::ReadFile(inputs.output + "excel.txt"),
                 {"Date\tLevel\tRain", "2021/03/01 00:30:00\t1.5\t0", "2021/03/01 02:30:00\t3.5\t0.5"});
@@ -288,7 +286,7 @@ TEST_F(HandRoads, AnAsciiTemplateChangedAndSavedOverItselfAfterTheQuestion)
 TEST_F(HandRoads, AnExcelTemplateChangedAndSavedUnderANewName)
 {
     const std::string road = "excel-modified";
-    const std::string newTemplate = scratch / "excel-hourly.xml";
+    const std::string newTemplate = scratch.File("excel-hourly.xml");
     const std::string before = guitest::ReadFile(inputs.excelTemplate);
     const std::string said = RunRoad(road, [&](Driver& d) {
         Describe(d, road, 3, inputs.excelFile, inputs.excelTemplate);

@@ -85,7 +85,7 @@ protected:
         return text;
     }
 
-    TempFolder scratch;
+    ScratchFolder scratch;
     Inputs inputs{scratch};
     ui::ScriptedUserInterface screen;
     ui::ScopedUserInterface watching{screen};
@@ -205,7 +205,7 @@ TEST_F(Pages, EachRefusalSaysWhyAndKeepsThePage)
     }
     w.Click(kFolder);
     w.Click(kAscii);
-    w.Type(kInputFolder, scratch / "none/");
+    w.Type(kInputFolder, scratch.File("none/"));
     w.Next();
     EXPECT_EQ(w.Page(), kSelectInput);
     EXPECT_EQ(Said(), res::LoadString(res::IDS_FOLDER_INVALID));
@@ -237,7 +237,7 @@ TEST_F(Pages, EachRefusalSaysWhyAndKeepsThePage)
     w.Next();
     ASSERT_EQ(w.Page(), kOutput);
 
-    w.Type(kOutputFolder, scratch / "none");
+    w.Type(kOutputFolder, scratch.File("none"));
     w.Next();
     EXPECT_EQ(w.Page(), kOutput);
     EXPECT_EQ(Said(), res::LoadString(res::IDS_FOLDER_INVALID));
@@ -510,13 +510,13 @@ TEST_F(Pages, DecliningToReplaceAFileKeepsTheSavePage)
     EXPECT_EQ(screen.boxes[0].caption, "Save template file");
     EXPECT_EQ(w.Text(CSaveTempFilePage::IDC_FILE), existing);
     screen.boxes.clear();
-    w.Type(CSaveTempFilePage::IDC_FILE, scratch / "template.TXT");
+    w.Type(CSaveTempFilePage::IDC_FILE, scratch.File("template.TXT"));
     w.Next();
     EXPECT_EQ(w.Page(), kSaveTemplate);
     EXPECT_EQ(Said(), res::LoadString(res::IDS_TEMPLATE_NAME_INVALID));
-    screen.chosenPaths = {scratch / "chosen.xml"};
+    screen.chosenPaths = {scratch.File("chosen.xml")};
     guitest::Press(w.Find<QAbstractButton>(CSaveTempFilePage::IDC_BROWSE));
-    EXPECT_EQ(w.Text(CSaveTempFilePage::IDC_FILE), scratch / "chosen.xml");
+    EXPECT_EQ(w.Text(CSaveTempFilePage::IDC_FILE), scratch.File("chosen.xml"));
     ASSERT_EQ(screen.fileRequests.size(), 1u);
     EXPECT_FALSE(screen.fileRequests[0].open);
     EXPECT_EQ(screen.fileRequests[0].filter, "XML Files (*.xml)|*.xml|All Files (*.*)|*.*||");

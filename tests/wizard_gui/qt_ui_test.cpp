@@ -50,7 +50,7 @@ TEST(QtInterface, AMessageBoxShowsTheStylesButtonsAndIconAndAnswersWithTheButton
 
 TEST(QtInterface, AnOpenDialogFiltersByTheRequestAndReturnsTheChosenFile)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     const std::string chosen = scratch.Write("gauge.txt", "x\n");
     Answer<QFileDialog>([&](QFileDialog& dialog) {
         EXPECT_EQ(dialog.acceptMode(), QFileDialog::AcceptOpen);
@@ -72,25 +72,25 @@ TEST(QtInterface, AnOpenDialogFiltersByTheRequestAndReturnsTheChosenFile)
 
 TEST(QtInterface, ASaveDialogStartsAtTheGivenNameAndAddsTheDefaultExtension)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     Answer<QFileDialog>([&](QFileDialog& dialog) {
         EXPECT_EQ(dialog.acceptMode(), QFileDialog::AcceptSave);
         EXPECT_EQ(dialog.directory().absolutePath().toStdString(), scratch.Path());
         ASSERT_FALSE(dialog.selectedFiles().isEmpty());
         EXPECT_TRUE(dialog.selectedFiles().constFirst().endsWith("old.xlsx"));
         EXPECT_FALSE(dialog.testOption(QFileDialog::DontConfirmOverwrite));
-        dialog.selectFile(QString::fromStdString(scratch / "result"));
+        dialog.selectFile(QString::fromStdString(scratch.File("result")));
         static_cast<QDialog&>(dialog).accept(); // what the Open/Save button does
     });
     std::string path;
-    ui::FileDialogRequest request{false, ".xlsx", scratch / "old.xlsx", "Excel Files (*.xlsx) | *.xlsx||", 0x1006};
+    ui::FileDialogRequest request{false, ".xlsx", scratch.File("old.xlsx"), "Excel Files (*.xlsx) | *.xlsx||", 0x1006};
     EXPECT_TRUE(ui::QtUserInterface().ChooseFile(request, path));
-    EXPECT_EQ(path, scratch / "result.xlsx");
+    EXPECT_EQ(path, scratch.File("result.xlsx"));
 }
 
 TEST(QtInterface, TheFolderBrowserOpensAtTheStartFolderAndReturnsTheChosenOne)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     const std::string inner = scratch.MakeFolder("inner");
     Answer<QFileDialog>([&](QFileDialog& dialog) {
         EXPECT_EQ(dialog.windowTitle(), "Please select the folder to convert");
@@ -106,7 +106,7 @@ TEST(QtInterface, TheFolderBrowserOpensAtTheStartFolderAndReturnsTheChosenOne)
 
 TEST(QtInterface, TheRbx0SelectorListsTheFilesItemsAndReturnsTheTickedOnes)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     const Inputs inputs(scratch);
     COkaFileSelectorDlg* opened = nullptr;
     ui::RbxSelectionRequest request;
@@ -134,7 +134,7 @@ TEST(QtInterface, TheRbx0SelectorListsTheFilesItemsAndReturnsTheTickedOnes)
 
 TEST(QtInterface, TheRbx0SelectorSaysWhyAFileCannotBeListed)
 {
-    TempFolder scratch;
+    ScratchFolder scratch;
     const std::string broken = scratch.Write("broken.rbx0", "not rbx0");
     ui::RbxSelectionRequest request;
     request.initialFile = broken;

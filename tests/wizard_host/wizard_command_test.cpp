@@ -2,7 +2,9 @@
 // process's Qt application, a script drives the wizard through the object names its controls carry
 // (as an automation tool would), and the host's code writes the document back. The wizard also
 // starts as a program of its own, on a real X server and offscreen.
-#include "tests/checks/CheckTestSupport.h"
+#include "tests/engine/CheckTestSupport.h"
+#include "tests/support/Files.h"
+#include "tests/support/ShellCommand.h"
 #include "tests/wizard_gui/QtTestApplication.h"
 
 #include "apps/velmora/WizardDocument.h"
@@ -26,23 +28,11 @@
 namespace {
 
 using checktest::ScopedEnv;
-using checktest::TempFolder;
+using checktest::ScratchFolder;
 
 constexpr int kFinished = 12325;
 
-std::string ReadFile(const std::string& path)
-{
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream text;
-    text << in.rdbuf();
-    return text.str();
-}
-
-int Shell(const std::string& command)
-{
-    const int status = std::system(command.c_str());
-    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-}
+using testsupport::ReadFile;
 
 [[maybe_unused]] testing::Environment* const g_application =
     testing::AddGlobalTestEnvironment(new QtTestApplication("velmora-host-tests"));
@@ -106,7 +96,7 @@ protected:
         std::string error;
         plugin = host::Plugin::Load(error);
         ASSERT_NE(plugin, nullptr) << error;
-        std::filesystem::create_directories(scratch / "docs/data");
+        std::filesystem::create_directories(scratch.File("docs/data"));
         converter::RbxSeriesWriter writer;
         converter::SeriesHeader header;
         header.items = {{"Level", "Water level", "m", "Instantaneous"}};
@@ -125,17 +115,17 @@ protected:
         EXPECT_EQ(a.Page(), 2285);
         a.Press("Next >");
         a.Click(209);
-        a.Type(264, scratch / "docs/data/converted");
+        a.Type(264, scratch.File("docs/data/converted"));
         a.Press("Next >");
         EXPECT_EQ(a.Page(), 101);
         a.Press("Finish");
     }
 
-    TempFolder scratch;
+    ScratchFolder scratch;
     ScopedEnv tmpdir{"TMPDIR", scratch.MakeFolder("tmp")};
     std::unique_ptr<host::Plugin> plugin;
-    std::string input = scratch / "docs/data/gauge.rbx0";
-    std::string document = scratch / "docs/setup.wpx";
+    std::string input = scratch.File("docs/data/gauge.rbx0");
+    std::string document = scratch.File("docs/setup.wpx");
 };
 
 TEST_F(WizardCommand, FinishWritesANewDocumentWithNamesRelativeToItsFolderThatRuns)
@@ -148,14 +138,14 @@ TEST_F(WizardCommand, FinishWritesANewDocumentWithNamesRelativeToItsFolderThatRu
     EXPECT_NE(text.find("File_name = file \"data/gauge.rbx0\""), std::string::npos) << text;
     EXPECT_NE(text.find("File_name = file \"data/converted.txt\""), std::string::npos) << text;
     EXPECT_EQ(plugin->GetWpxHandle(), 0) << "the host closed the new document";
-    for (const auto& entry : std::filesystem::directory_iterator(scratch / "docs"))
+    for (const auto& entry : std::filesystem::directory_iterator(scratch.File("docs")))
         EXPECT_EQ(entry.path().filename().string().find(".wizard-"), std::string::npos) << "a scratch file was left";
 
     // The document works from anywhere, for the host program.
-    const std::string err = scratch / "run.err";
-    EXPECT_EQ(Shell("cd / && '" VELMORA_BIN_DIR "/velmora' run '" + document + "' 2>'" + err + "' >/dev/null"), 0);
+    const std::string err = scratch.File("run.err");
+    EXPECT_EQ(testsupport::ShellStatus("cd / && '" VELMORA_BIN_DIR "/velmora' run '" + document + "' 2>'" + err + "' >/dev/null"), 0);
     EXPECT_NE(ReadFile(err).find("Status: OK"), std::string::npos) << ReadFile(err);
-    EXPECT_TRUE(std::filesystem::exists(scratch / "docs/data/converted.txt"));
+    EXPECT_TRUE(std::filesystem::exists(scratch.File("docs/data/converted.txt")));
 }
 
 TEST_F(WizardCommand, TheStoredSetupIsShownAndCancelLeavesTheDocumentAsItWas)
@@ -188,14 +178,14 @@ TEST_F(WizardCommand, ADamagedDocumentIsReportedAndNoWizardShows)
 
 TEST_F(WizardCommand, WithoutADisplayTheCommandSaysSoAndWithoutADocumentHowToUseIt)
 {
-    const std::string err = scratch / "err.txt";
-    EXPECT_EQ(Shell("env -u DISPLAY -u WAYLAND_DISPLAY -u QT_QPA_PLATFORM '" VELMORA_BIN_DIR "/velmora' wizard '" + document +
+    const std::string err = scratch.File("err.txt");
+    EXPECT_EQ(testsupport::ShellStatus("env -u DISPLAY -u WAYLAND_DISPLAY -u QT_QPA_PLATFORM '" VELMORA_BIN_DIR "/velmora' wizard '" + document +
                     "' 2>'" + err + "'"),
               1);
     EXPECT_NE(ReadFile(err).find("no display"), std::string::npos) << ReadFile(err);
     EXPECT_FALSE(std::filesystem::exists(document));
-    EXPECT_EQ(Shell("'" VELMORA_BIN_DIR "/velmora' wizard 2>/dev/null"), 2);
-    EXPECT_EQ(Shell("'" VELMORA_BIN_DIR "/velmora' wizard --help >/dev/null"), 0);
+    EXPECT_EQ(testsupport::ShellStatus("'" VELMORA_BIN_DIR "/velmora' wizard 2>/dev/null"), 2);
+    EXPECT_EQ(testsupport::ShellStatus("'" VELMORA_BIN_DIR "/velmora' wizard --help >/dev/null"), 0);
 }
 
 } // namespace

@@ -61,7 +61,7 @@ sys::Status WritePackage(const std::string& path, const std::vector<std::pair<st
 
 TEST(ZipWriter, PartsUnpackToWhatWasWritten)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     const std::vector<std::pair<std::string, std::string>> parts = {
         {"empty.xml", ""},
         {"[Content_Types].xml", "<Types/>"},
@@ -70,9 +70,9 @@ TEST(ZipWriter, PartsUnpackToWhatWasWritten)
         {"dir/streamed-random.bin+", RandomBytes(1000003, 2)},
         {"streamed-empty+", ""},
     };
-    const std::string path = folder.Path("parts.zip");
+    const std::string path = folder.File("parts.zip");
     ASSERT_TRUE(WritePackage(path, parts)) << "write";
-    const std::string bytes = convtest::ReadFile(path);
+    const std::string bytes = testsupport::ReadFile(path);
     const convtest::ZipContents contents = convtest::Unzip(bytes);
     ASSERT_EQ(contents.error, "");
     ASSERT_EQ(contents.parts.size(), parts.size());
@@ -88,34 +88,34 @@ TEST(ZipWriter, SmallOutputBuffersSplitHeadersAndTheirPatchesAcrossWrites)
 {
     // Over these sizes every header, and every patch of its sizes and CRC, lands partly in the
     // file and partly in the buffer for some of them.
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     const std::vector<std::pair<std::string, std::string>> parts = {
         {"a", "x"}, {"b+", Repetitive(2000)}, {"c", RandomBytes(1000, 6)}, {"d+", ""}, {"e", Repetitive(777)}, {"f", ""}};
     for (size_t buffer = 1; buffer <= 64; ++buffer) {
-        const std::string path = folder.Path("small-" + std::to_string(buffer) + ".zip");
+        const std::string path = folder.File("small-" + std::to_string(buffer) + ".zip");
         ASSERT_TRUE(WritePackage(path, parts, buffer)) << buffer;
-        const convtest::ZipContents contents = convtest::Unzip(convtest::ReadFile(path));
+        const convtest::ZipContents contents = convtest::Unzip(testsupport::ReadFile(path));
         ASSERT_EQ(contents.error, "") << buffer;
         EXPECT_TRUE(contents.parts.at("b") == parts[1].second) << buffer;
         EXPECT_TRUE(contents.parts.at("c") == parts[2].second) << buffer;
         EXPECT_EQ(contents.parts.at("e"), parts[4].second) << buffer;
     }
     ZipWriter zip(5);
-    const std::string path = folder.Path("head.zip");
+    const std::string path = folder.File("head.zip");
     ASSERT_TRUE(zip.Open(path));
     ASSERT_TRUE(zip.BeginEntry("h", "0123456789"));
     ASSERT_TRUE(zip.Append(Repetitive(100)));
     ASSERT_TRUE(zip.EndEntry("abcdefghij"));
     ASSERT_TRUE(zip.Close());
-    EXPECT_EQ(convtest::Unzip(convtest::ReadFile(path)).parts.at("h"), "abcdefghij" + Repetitive(100));
+    EXPECT_EQ(convtest::Unzip(testsupport::ReadFile(path)).parts.at("h"), "abcdefghij" + Repetitive(100));
 }
 
 TEST(ZipWriter, PythonZipfileAcceptsThePackage)
 {
     if (std::system("python3 -c 'import zipfile' 2>/dev/null") != 0)
         GTEST_SKIP() << "python3 is not available";
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("py.zip");
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("py.zip");
     ASSERT_TRUE(WritePackage(path, {{"a.txt", "alpha"}, {"b/big.xml+", Repetitive(500000)}, {"c.bin", RandomBytes(4096, 3)}}));
     const std::string script = "import zipfile,sys\n"
                                "z=zipfile.ZipFile(sys.argv[1])\n"
@@ -123,14 +123,14 @@ TEST(ZipWriter, PythonZipfileAcceptsThePackage)
                                "assert z.namelist()==['a.txt','b/big.xml','c.bin'], z.namelist()\n"
                                "assert z.read('a.txt')==b'alpha'\n"
                                "assert len(z.read('b/big.xml'))==500000\n";
-    convtest::WriteFile(folder.Path("check.py"), script);
-    EXPECT_EQ(std::system(("python3 " + folder.Path("check.py") + " " + path).c_str()), 0);
+    testsupport::WriteFile(folder.File("check.py"), script);
+    EXPECT_EQ(std::system(("python3 " + folder.File("check.py") + " " + path).c_str()), 0);
 }
 
 TEST(ZipWriter, HeadOfAStreamedPartCanBeReplaced)
 {
-    convtest::ScratchFolder folder;
-    const std::string path = folder.Path("head.zip");
+    testsupport::ScratchFolder folder;
+    const std::string path = folder.File("head.zip");
     ZipWriter zip;
     ASSERT_TRUE(zip.Open(path));
     ASSERT_TRUE(zip.AddEntry("first", "before"));
@@ -145,7 +145,7 @@ TEST(ZipWriter, HeadOfAStreamedPartCanBeReplaced)
     ASSERT_TRUE(again.Append(rest));
     ASSERT_TRUE(again.EndEntry("<dimension ref=\"A1:K12345\"/>"));
     ASSERT_TRUE(again.Close());
-    const convtest::ZipContents contents = convtest::Unzip(convtest::ReadFile(path));
+    const convtest::ZipContents contents = convtest::Unzip(testsupport::ReadFile(path));
     ASSERT_EQ(contents.error, "");
     EXPECT_TRUE(contents.parts.at("sheet.xml") == "<dimension ref=\"A1:K12345\"/>" + rest);
 }
@@ -181,18 +181,18 @@ TEST(ZipWriter, WriteFailuresNameTheFileAndTheCause)
 
 TEST(ZipWriter, CallsOutOfOrderFailInsteadOfWritingABrokenPackage)
 {
-    convtest::ScratchFolder folder;
+    testsupport::ScratchFolder folder;
     ZipWriter unopened;
     EXPECT_FALSE(unopened.AddEntry("a", "x"));
     ZipWriter zip;
-    ASSERT_TRUE(zip.Open(folder.Path("order.zip")));
+    ASSERT_TRUE(zip.Open(folder.File("order.zip")));
     EXPECT_FALSE(zip.Append("no entry open"));
     ZipWriter streaming;
-    ASSERT_TRUE(streaming.Open(folder.Path("open.zip")));
+    ASSERT_TRUE(streaming.Open(folder.File("open.zip")));
     ASSERT_TRUE(streaming.BeginEntry("a"));
     EXPECT_FALSE(streaming.BeginEntry("b")) << "one streamed part at a time";
     ZipWriter unfinished;
-    ASSERT_TRUE(unfinished.Open(folder.Path("unfinished.zip")));
+    ASSERT_TRUE(unfinished.Open(folder.File("unfinished.zip")));
     ASSERT_TRUE(unfinished.BeginEntry("a"));
     EXPECT_FALSE(unfinished.Close()) << "a part still open";
 }
