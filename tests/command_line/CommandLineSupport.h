@@ -1,93 +1,35 @@
 #pragma once
-// What the command-line tests share: a scratch folder, running the built programs, inputs of every
-// format (workbooks written by Python's own writers) and the values read back from any output.
+// What the command-line tests share: running the built programs, inputs of every format (workbooks
+// written by libxlsxwriter and Python's xlwt) and the values read back from any output.
 #include "converter/RbxSeriesReader.h"
 #include "converter/RbxSeriesWriter.h"
+
+#include "tests/support/Files.h"
+#include "tests/support/Program.h"
+#include "tests/support/ScratchFile.h"
+#include "tests/support/ScratchFolder.h"
+#include "tests/support/ShellCommand.h"
+#include "tests/support/XlsxWorkbook.h"
 
 #include <gtest/gtest.h>
 
 #include <cstdio>
-#include <cstdlib>
 #include <filesystem>
-#include <fstream>
 #include <map>
 #include <sstream>
 #include <string>
 #include <vector>
 
-#include <sys/wait.h>
-#include <unistd.h>
-
 namespace cli {
 
 namespace fs = std::filesystem;
 
-class Scratch {
-public:
-    Scratch()
-    {
-        static int counter = 0;
-        m_root = fs::temp_directory_path() / ("velmora-cli-" + std::to_string(::getpid()) + "-" + std::to_string(counter++));
-        fs::remove_all(m_root);
-        fs::create_directories(m_root);
-    }
-    ~Scratch() { fs::remove_all(m_root); }
-    Scratch(const Scratch&) = delete;
-    Scratch& operator=(const Scratch&) = delete;
-    std::string operator/(const std::string& name) const { return (m_root / name).string(); }
-    std::string Folder(const std::string& name) const
-    {
-        fs::create_directories(m_root / name);
-        return (m_root / name).string();
-    }
-
-private:
-    fs::path m_root;
-};
-
-inline std::string ReadFile(const std::string& path)
+// Runs `program` (in the build's bin folder) with `arguments`, quoted for the shell as a user types them.
+inline testsupport::Outcome Run(const std::string& program, const std::string& arguments)
 {
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream s;
-    s << in.rdbuf();
-    return s.str();
-}
-
-inline void WriteFile(const std::string& path, const std::string& content)
-{
-    std::ofstream(path, std::ios::binary) << content;
-}
-
-struct Outcome {
-    int status = -1;
-    std::string out, err;
-};
-
-// Runs `program` (in the build's bin folder) with `arguments` (already quoted for the shell).
-inline Outcome Run(const std::string& program, const std::string& arguments)
-{
-    static int counter = 0;
-    const std::string base = (fs::temp_directory_path() / ("velmora-cli-out-" + std::to_string(::getpid()) + "-" +
-                                                           std::to_string(counter++)))
-                                 .string();
-    const std::string command = std::string(VELMORA_BIN_DIR) + "/" + program + " " + arguments + " >" + base +
-                                ".out 2>" + base + ".err";
-    const int raw = std::system(command.c_str());
-    Outcome outcome;
-    outcome.status = WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
-    outcome.out = ReadFile(base + ".out");
-    outcome.err = ReadFile(base + ".err");
-    fs::remove(base + ".out");
-    fs::remove(base + ".err");
-    return outcome;
-}
-
-inline std::string Quote(const std::string& text)
-{
-    std::string quoted = "'";
-    for (char c : text)
-        quoted += c == '\'' ? std::string("'\\''") : std::string(1, c);
-    return quoted + "'";
+    const testsupport::Command command({"/bin/sh", "-c", std::string(VELMORA_BIN_DIR) + "/" + program + " " + arguments});
+    return testsupport::RunProgram(command, testsupport::ProgramScratchFile("run.out"),
+                                   testsupport::ProgramScratchFile("run.err"));
 }
 
 // Six rows ten minutes apart; Level holds 1.5, 1.6, ... 2.0.
@@ -98,7 +40,7 @@ inline void WriteCsv(const std::string& path)
     std::string text = "Time;Level;Rain\n";
     for (size_t r = 0; r < kLevels.size(); ++r)
         text += "2021-01-01 00:" + std::to_string(r) + "0;" + kLevels[r] + ";" + std::to_string(r) + "\n";
-    WriteFile(path, text);
+    testsupport::WriteFile(path, text);
 }
 
 inline void WriteRbx0(const std::string& path)
@@ -112,33 +54,38 @@ inline void WriteRbx0(const std::string& path)
     ASSERT_TRUE(writer.Finish().ok());
 }
 
+// The exit status of `script` run by the system's Python, which has the workbook modules.
 inline int Python(const std::string& script)
 {
-    const std::string file = (fs::temp_directory_path() / ("velmora-cli-" + std::to_string(::getpid()) + ".py")).string();
-    WriteFile(file, script);
-    const int status = std::system(("/usr/bin/python3 " + file + " >/dev/null 2>&1").c_str());
-    fs::remove(file);
-    return status;
+    const testsupport::ScratchFile file("velmora-cli", ".py", script);
+    return testsupport::ShellStatus("/usr/bin/python3 " + testsupport::ShellQuote(file.Path()) + " >/dev/null 2>&1");
 }
 
-// A workbook made by xlsxwriter (.xlsx) or xlwt (.xls), as another program would make it.
+// A workbook made by libxlsxwriter (.xlsx) or Python's xlwt (.xls), as another program would make it.
 inline void WriteWorkbook(const std::string& path)
 {
+    const bool xls = path.size() > 4 && path.substr(path.size() - 4) == ".xls";
+    if (!xls) {
+        testsupport::XlsxWorkbook book(path);
+        book.Text(1, 1, "Time"), book.Text(1, 2, "Level"), book.Text(1, 3, "Rain");
+        for (int r = 0; r < static_cast<int>(kLevels.size()); ++r) {
+            book.DateTime(r + 2, 1, {2021, 1, 1, 0, 10 * r, 0}, "yyyy-mm-dd hh:mm");
+            book.Number(r + 2, 2, std::stod(kLevels[static_cast<size_t>(r)]));
+            book.Number(r + 2, 3, r);
+        }
+        ASSERT_TRUE(book.Close()) << path;
+        return;
+    }
     std::string levels;
     for (const std::string& level : kLevels)
         levels += level + ",";
-    const bool xls = path.size() > 4 && path.substr(path.size() - 4) == ".xls";
     const std::string script =
-        std::string("import datetime\nlevels=[") + levels + "]\n" +
-        (xls ? "import xlwt\nwb=xlwt.Workbook();ws=wb.add_sheet('S1');f=xlwt.easyxf(num_format_str='yyyy-mm-dd hh:mm')\n"
-               "put=lambda r,c,v,fm=None: ws.write(r,c,v,fm) if fm else ws.write(r,c,v)\n"
-             : "import xlsxwriter\nwb=xlsxwriter.Workbook(" + Quote(path) + ");ws=wb.add_worksheet();"
-               "f=wb.add_format({'num_format':'yyyy-mm-dd hh:mm'})\n"
-               "put=lambda r,c,v,fm=None: ws.write_datetime(r,c,v,fm) if fm else ws.write(r,c,v)\n") +
-        "for c,t in enumerate(['Time','Level','Rain']): put(0,c,t)\n"
+        "import datetime\nimport xlwt\nlevels=[" + levels + "]\n"
+        "wb=xlwt.Workbook();ws=wb.add_sheet('S1');f=xlwt.easyxf(num_format_str='yyyy-mm-dd hh:mm')\n"
+        "for c,t in enumerate(['Time','Level','Rain']): ws.write(0,c,t)\n"
         "for r,v in enumerate(levels):\n"
-        "  put(r+1,0,datetime.datetime(2021,1,1,0,10*r),f); put(r+1,1,v); put(r+1,2,r)\n" +
-        (xls ? "wb.save(" + Quote(path) + ")\n" : "wb.close()\n");
+        "  ws.write(r+1,0,datetime.datetime(2021,1,1,0,10*r),f); ws.write(r+1,1,v); ws.write(r+1,2,r)\n"
+        "wb.save(" + testsupport::ShellQuote(path) + ")\n";
     ASSERT_EQ(Python(script), 0) << script;
 }
 
@@ -178,17 +125,17 @@ inline std::vector<std::string> LevelsOf(const std::string& path)
             levels.push_back(Shown(row.values.at(level)));
         return levels;
     }
-    std::string text = ReadFile(path);
+    std::string text = testsupport::ReadFile(path);
     if (extension == ".xls" || extension == ".xlsx") {
         const std::string list = path + ".levels";
-        Python((extension == ".xls" ? "import xlrd\ns=xlrd.open_workbook(" + Quote(path) +
+        Python((extension == ".xls" ? "import xlrd\ns=xlrd.open_workbook(" + testsupport::ShellQuote(path) +
                                           ").sheet_by_index(0)\nrows=[[c.value for c in s.row(r)] for r in range(s.nrows)]\n"
-                                    : "import openpyxl\ns=openpyxl.load_workbook(" + Quote(path) +
+                                    : "import openpyxl\ns=openpyxl.load_workbook(" + testsupport::ShellQuote(path) +
                                           ").worksheets[0]\nrows=[[c.value for c in r] for r in s.iter_rows()]\n") +
                "col=[r.index(x) for r in rows for x in r if x=='Level'][0]\n"
                "vals=[r[col] for r in rows if isinstance(r[col],(int,float))]\n"
-               "open(" + Quote(list) + ",'w').write('\\n'.join('%g'%v for v in vals))\n");
-        text = ReadFile(list);
+               "open(" + testsupport::ShellQuote(list) + ",'w').write('\\n'.join('%g'%v for v in vals))\n");
+        text = testsupport::ReadFile(list);
         fs::remove(list);
         std::istringstream lines(text);
         for (std::string line; std::getline(lines, line);)
@@ -219,7 +166,7 @@ inline std::map<std::string, std::string> Snapshot(const std::string& folder)
 {
     std::map<std::string, std::string> files;
     for (const auto& entry : fs::recursive_directory_iterator(folder))
-        files[entry.path().string()] = entry.is_regular_file() ? ReadFile(entry.path().string()) : "<folder>";
+        files[entry.path().string()] = entry.is_regular_file() ? testsupport::ReadFile(entry.path().string()) : "<folder>";
     return files;
 }
 

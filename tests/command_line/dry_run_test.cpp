@@ -12,7 +12,8 @@
 
 namespace {
 
-using cli::Quote;
+using testsupport::ShellQuote;
+namespace fs = std::filesystem;
 
 const std::string kHead = "Rainfall[mm]:Accumulated\tWater Level[m]:Instantaneous\nTime\tRain\tLevel\n";
 
@@ -64,50 +65,50 @@ protected:
     void SetUp() override
     {
         for (const auto& [name, rows] : kFiles)
-            cli::WriteFile(in + "/" + name, kHead + rows);
-        cli::WriteFile(in + "/g_shape.txt", "a,b,c\n1,2,3\n");
-        ASSERT_EQ(CAsciiSpecification().Save(scratch / "t.xml"), 1);
+            testsupport::WriteFile(in + "/" + name, kHead + rows);
+        testsupport::WriteFile(in + "/g_shape.txt", "a,b,c\n1,2,3\n");
+        ASSERT_EQ(CAsciiSpecification().Save(scratch.File("t.xml")), 1);
         e2e::SetupDoc setup;
         setup.type = 2;
         setup.input = in;
-        setup.templateName = scratch / "t.xml";
+        setup.templateName = scratch.File("t.xml");
         setup.output = out;
-        setup.log = scratch / "run.log";
-        cli::WriteFile(engineSetup, e2e::EngineDocument(setup));
-        cli::WriteFile(hostDocument, e2e::HostDocument(setup));
+        setup.log = scratch.File("run.log");
+        testsupport::WriteFile(engineSetup, e2e::EngineDocument(setup));
+        testsupport::WriteFile(hostDocument, e2e::HostDocument(setup));
     }
 
-    cli::Scratch scratch;
-    std::string in = scratch.Folder("in"), out = scratch.Folder("out");
-    std::string engineSetup = scratch / "setup.wpx", hostDocument = scratch / "doc.wpx";
+    testsupport::ScratchFolder scratch{"velmora-cli"};
+    std::string in = scratch.MakeFolder("in"), out = scratch.MakeFolder("out");
+    std::string engineSetup = scratch.File("setup.wpx"), hostDocument = scratch.File("doc.wpx");
 };
 
 TEST_F(DryRun, ReportsEachFaultWithItsPositionAndWritesNothing)
 {
-    const auto before = cli::Snapshot(scratch / "");
-    const cli::Outcome outcome = cli::Run("Velmora", Quote(engineSetup) + " --dry-run --threads 3");
+    const auto before = cli::Snapshot(scratch.Path());
+    const testsupport::Outcome outcome = cli::Run("Velmora", ShellQuote(engineSetup) + " --dry-run --threads 3");
     EXPECT_EQ(outcome.status, 1) << outcome.err;
     EXPECT_EQ(outcome.out, WithFolder(kReport, in));
     EXPECT_EQ(outcome.err, "");
     // No output, no part file, no log.
-    EXPECT_EQ(cli::Snapshot(scratch / ""), before);
+    EXPECT_EQ(cli::Snapshot(scratch.Path()), before);
 }
 
 TEST_F(DryRun, CheckAllPrintsTheChecksThenTheSameReport)
 {
-    const auto before = cli::Snapshot(scratch / "");
-    const cli::Outcome outcome = cli::Run("velmora", "check --all " + Quote(hostDocument));
+    const auto before = cli::Snapshot(scratch.Path());
+    const testsupport::Outcome outcome = cli::Run("velmora", "check --all " + ShellQuote(hostDocument));
     EXPECT_EQ(outcome.status, 1);
     const size_t report = outcome.out.find("ok " + in);
     ASSERT_NE(report, std::string::npos) << outcome.out;
     EXPECT_EQ(outcome.out.substr(0, report).find("FAIL"), std::string::npos) << "every check passes: " << outcome.out;
     EXPECT_EQ(outcome.out.substr(report), WithFolder(kReport, in));
-    EXPECT_EQ(cli::Snapshot(scratch / ""), before);
+    EXPECT_EQ(cli::Snapshot(scratch.Path()), before);
 }
 
 TEST_F(DryRun, JsonGivesTheSameFindingsToTools)
 {
-    const cli::Outcome outcome = cli::Run("Velmora", Quote(engineSetup) + " --dry-run --json");
+    const testsupport::Outcome outcome = cli::Run("Velmora", ShellQuote(engineSetup) + " --dry-run --json");
     EXPECT_EQ(outcome.status, 1);
     for (const std::string& part :
          {std::string("\"verdict\":\"fails\",\"reason\":\"2 rows do not read\""),
@@ -120,7 +121,7 @@ TEST_F(DryRun, JsonGivesTheSameFindingsToTools)
           std::string("\"summary\":{\"files\":7,\"converts\":3,\"fails\":3,\"skipped\":1,\"rejected\":2,\"gaps\":1,"
                       "\"missingSteps\":2,\"repeatedStamps\":1,\"decreasingStamps\":1,\"decreases\":1}}\n")})
         EXPECT_NE(outcome.out.find(part), std::string::npos) << part << "\nin: " << outcome.out;
-    const cli::Outcome check = cli::Run("velmora", "check --all --json " + Quote(hostDocument));
+    const testsupport::Outcome check = cli::Run("velmora", "check --all --json " + ShellQuote(hostDocument));
     EXPECT_EQ(check.out.rfind("{\"checks\":[{\"name\":\"input\",\"passed\":true", 0), 0u) << check.out;
     EXPECT_NE(check.out.find("\"files\":[{\"input\":"), std::string::npos);
 }
@@ -128,11 +129,11 @@ TEST_F(DryRun, JsonGivesTheSameFindingsToTools)
 TEST_F(DryRun, GoodFilesAloneGiveExitStatusZero)
 {
     for (const char* faulty : {"b_value.txt", "d_repeat.txt", "e_back.txt", "g_shape.txt"})
-        cli::fs::remove(in + "/" + faulty);
-    const cli::Outcome outcome = cli::Run("Velmora", Quote(engineSetup) + " --dry-run");
+        fs::remove(in + "/" + faulty);
+    const testsupport::Outcome outcome = cli::Run("Velmora", ShellQuote(engineSetup) + " --dry-run");
     EXPECT_EQ(outcome.status, 0) << outcome.out;
     EXPECT_NE(outcome.out.find("dry run: 3 files: 3 would convert, 0 would fail"), std::string::npos) << outcome.out;
-    EXPECT_EQ(cli::Run("velmora", "check --all " + Quote(hostDocument)).status, 0);
+    EXPECT_EQ(cli::Run("velmora", "check --all " + ShellQuote(hostDocument)).status, 0);
 }
 
 // The inputs named in the "converted" lines of a log.
@@ -148,52 +149,52 @@ std::vector<std::string> ConvertedInputs(const std::string& log)
 
 TEST(Shards, NRunsConvertEveryFileOfAFolderExactlyOnce)
 {
-    cli::Scratch scratch;
-    const std::string in = scratch.Folder("in");
+    testsupport::ScratchFolder scratch("velmora-cli");
+    const std::string in = scratch.MakeFolder("in");
     std::set<std::string> all;
     for (int n = 1; n <= 23; ++n) {
         const std::string name = in + "/gauge-" + std::to_string(n) + ".txt";
-        cli::WriteFile(name, kHead + kFiles.at("a_good.txt"));
+        testsupport::WriteFile(name, kHead + kFiles.at("a_good.txt"));
         all.insert(name);
     }
-    ASSERT_EQ(CAsciiSpecification().Save(scratch / "t.xml"), 1);
+    ASSERT_EQ(CAsciiSpecification().Save(scratch.File("t.xml")), 1);
     for (int shares : {1, 2, 3, 7}) {
         SCOPED_TRACE(std::to_string(shares) + " shares");
-        const std::string out = scratch.Folder("out" + std::to_string(shares));
+        const std::string out = scratch.MakeFolder("out" + std::to_string(shares));
         std::multiset<std::string> converted, checked;
         for (int share = 1; share <= shares; ++share) {
             e2e::SetupDoc setup;
             setup.type = 2;
             setup.input = in;
-            setup.templateName = scratch / "t.xml";
+            setup.templateName = scratch.File("t.xml");
             setup.output = out;
-            setup.log = scratch / ("run-" + std::to_string(share) + ".log");
-            const std::string file = scratch / "setup.wpx";
-            cli::WriteFile(file, e2e::EngineDocument(setup));
+            setup.log = scratch.File("run-" + std::to_string(share) + ".log");
+            const std::string file = scratch.File("setup.wpx");
+            testsupport::WriteFile(file, e2e::EngineDocument(setup));
             const std::string shard = " --shard " + std::to_string(share) + "/" + std::to_string(shares);
-            const cli::Outcome dry = cli::Run("Velmora", Quote(file) + " --dry-run" + shard);
+            const testsupport::Outcome dry = cli::Run("Velmora", ShellQuote(file) + " --dry-run" + shard);
             EXPECT_EQ(dry.status, 0) << dry.out;
             std::istringstream lines(dry.out);
             for (std::string line; std::getline(lines, line);)
                 if (line.rfind("ok ", 0) == 0)
                     checked.insert(line.substr(3, line.find(": ") - 3));
-            EXPECT_EQ(cli::Run("Velmora", Quote(file) + " --quiet" + shard).status, 0);
-            const std::string log = cli::ReadFile(setup.log);
+            EXPECT_EQ(cli::Run("Velmora", ShellQuote(file) + " --quiet" + shard).status, 0);
+            const std::string log = testsupport::ReadFile(setup.log);
             EXPECT_NE(log.find("; share " + std::to_string(share) + " of " + std::to_string(shares)), std::string::npos);
             for (const std::string& input : ConvertedInputs(log))
                 converted.insert(input);
-            cli::fs::remove(setup.log);
+            fs::remove(setup.log);
         }
         EXPECT_EQ(converted, std::multiset<std::string>(all.begin(), all.end()));
         EXPECT_EQ(checked, converted);
-        EXPECT_EQ(std::distance(cli::fs::directory_iterator(out), cli::fs::directory_iterator()), 23);
+        EXPECT_EQ(std::distance(fs::directory_iterator(out), fs::directory_iterator()), 23);
     }
 }
 
 TEST(Shards, AShareMustBeOneOfN)
 {
     for (const char* shard : {"0/3", "4/3", "1/0", "3", "a/b", "1/2x"}) {
-        const cli::Outcome outcome = cli::Run("Velmora", std::string("setup.wpx --shard ") + shard);
+        const testsupport::Outcome outcome = cli::Run("Velmora", std::string("setup.wpx --shard ") + shard);
         EXPECT_EQ(outcome.status, 2) << shard;
         EXPECT_NE(outcome.err.find("--shard needs K/N with 1 <= K <= N"), std::string::npos) << outcome.err;
     }

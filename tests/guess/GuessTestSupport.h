@@ -108,4 +108,20 @@ inline void ExpectRow(const std::vector<double>& actual, const std::vector<doubl
     }
 }
 
+// The series read is the one a layout table's row expects: its item names, first item, number of
+// rows, first and last stamps, first row's values and missing values.
+template <class Layout>
+void ExpectSeries(const ReadSeries& series, const Layout& layout)
+{
+    ASSERT_EQ(series.problem, "");
+    EXPECT_EQ(series.names, layout.names);
+    ASSERT_FALSE(series.meta.empty());
+    EXPECT_EQ(series.meta.front(), layout.firstItem);
+    ASSERT_EQ(series.stamps.size(), layout.rows);
+    EXPECT_EQ(series.stamps.front(), layout.first);
+    ExpectRow(series.values.front(), layout.firstValues);
+    EXPECT_EQ(series.stamps.back(), layout.last);
+    EXPECT_EQ(series.missing, layout.missing);
+}
+
 } // namespace guesstest

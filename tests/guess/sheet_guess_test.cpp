@@ -2,73 +2,32 @@
 // layouts an Excel template can describe, and the workbooks our own engine writes; each guess value
 // by value and the series the engine's reader then makes of the sheet.
 #include "guess/GuessReport.h"
-#include "platform/system/FileSystem.h"
 #include "tests/guess/GuessTestSupport.h"
-
-#include <xlsxwriter.h>
+#include "tests/support/ScratchFolder.h"
+#include "tests/support/XlsxWorkbook.h"
 
 #include <functional>
-#include <unistd.h>
 
 namespace {
 
 using namespace guesstest;
 
-// One .xlsx written with libxlsxwriter into the temporary folder; rows and columns from 1.
-class Book {
-public:
-    explicit Book(const std::string& name)
-    {
-        std::string folder;
-        sys::GetTempPath(4096, folder);
-        path = folder + "velmora_guess_" + std::to_string(::getpid()) + "_" + name + ".xlsx";
-        m_book = workbook_new(path.c_str());
-    }
-    ~Book() { sys::DeleteFile(path); }
+using testsupport::XlsxWorkbook;
 
-    lxw_worksheet* Sheet(int number = 1)
-    {
-        while (static_cast<int>(m_sheets.size()) < number)
-            m_sheets.push_back(workbook_add_worksheet(m_book, nullptr));
-        return m_sheets[static_cast<size_t>(number - 1)];
-    }
-    lxw_format* Format(const char* code)
-    {
-        lxw_format* format = workbook_add_format(m_book);
-        format_set_num_format(format, code);
-        return format;
-    }
-    void Text(int row, int column, const std::string& value, int sheet = 1)
-    {
-        worksheet_write_string(Sheet(sheet), Row(row), Col(column), value.c_str(), nullptr);
-    }
-    void Number(int row, int column, double value, lxw_format* format = nullptr, int sheet = 1)
-    {
-        worksheet_write_number(Sheet(sheet), Row(row), Col(column), value, format);
-    }
-    void When(int row, int column, lxw_datetime when, lxw_format* format, int sheet = 1)
-    {
-        worksheet_write_datetime(Sheet(sheet), Row(row), Col(column), &when, format);
-    }
-    void Close()
-    {
-        Sheet(1);
-        ASSERT_EQ(workbook_close(m_book), LXW_NO_ERROR);
-    }
-
-    std::string path;
-
-private:
-    static lxw_row_t Row(int row) { return static_cast<lxw_row_t>(row - 1); }
-    static lxw_col_t Col(int column) { return static_cast<lxw_col_t>(column - 1); }
-
-    lxw_workbook* m_book = nullptr;
-    std::vector<lxw_worksheet*> m_sheets;
-};
+// The path of a workbook `write` fills, in `folder`; rows and columns from 1.
+std::string WrittenBook(const testsupport::ScratchFolder& folder, const std::string& name,
+                        const std::function<void(XlsxWorkbook&)>& write)
+{
+    const std::string path = folder.File(name + ".xlsx");
+    XlsxWorkbook book(path);
+    write(book);
+    EXPECT_TRUE(book.Close()) << path;
+    return path;
+}
 
 struct SheetLayout {
     const char* name;
-    std::function<void(Book&)> write;
+    std::function<void(XlsxWorkbook&)> write;
     std::map<std::string, std::string> values;
     std::vector<std::string> names;
     std::string firstItem;
@@ -85,11 +44,11 @@ const std::string kUndefined = "Undefined|Undefined|Instantaneous";
 
 const std::vector<SheetLayout> kSheets = {
     {"date_cells",
-     [](Book& book) {
-         lxw_format* stamp = book.Format("yyyy/mm/dd hh:mm:ss");
+     [](XlsxWorkbook& book) {
+         const std::string stamp = "yyyy/mm/dd hh:mm:ss";
          book.Text(1, 1, "Time"), book.Text(1, 2, "Rain"), book.Text(1, 3, "Level");
          for (int h = 0; h < 6; ++h) {
-             book.When(2 + h, 1, {2020, 1, 31, h, 30, 0}, stamp);
+             book.DateTime(2 + h, 1, {2020, 1, 31, h, 30, 0}, stamp);
              book.Number(2 + h, 2, h * 0.5), book.Number(2 + h, 3, 1 + h);
          }
      },
@@ -97,20 +56,20 @@ const std::vector<SheetLayout> kSheets = {
       {"ItemTitleOption", "0"}, {"ExcelSheet", "1"}},
      {"Rain", "Level"}, kUndefined, 6, "2020/01/31 00:30:00", {0, 1}, "2020/01/31 05:30:00"},
     {"date_and_time_columns",
-     [](Book& book) {
-         lxw_format* date = book.Format("yyyy/mm/dd");
-         lxw_format* time = book.Format("hh:mm:ss");
+     [](XlsxWorkbook& book) {
+         const std::string date = "yyyy/mm/dd";
+         const std::string time = "hh:mm:ss";
          book.Text(1, 1, "Date"), book.Text(1, 2, "Time"), book.Text(1, 3, "Q");
          for (int h = 0; h < 5; ++h) {
-             book.When(2 + h, 1, {2021, 7, 14, 0, 0, 0}, date);
-             book.When(2 + h, 2, {0, 0, 0, h, 15, 0}, time);
+             book.DateTime(2 + h, 1, {2021, 7, 14, 0, 0, 0}, date);
+             book.DateTime(2 + h, 2, {0, 0, 0, h, 15, 0}, time);
              book.Number(2 + h, 3, 10 + h);
          }
      },
      {{"DateTimeCol", "1"}, {"UseDTFormat", "1"}, {"DateTimeFormat", "YYYY/MM/DD|HH:mm:ss"}, {"StartRow", "2"}},
      {"Q"}, kUndefined, 5, "2021/07/14 00:15:00", {10}, "2021/07/14 04:15:00"},
     {"text_dates_day_first",
-     [](Book& book) {
+     [](XlsxWorkbook& book) {
          book.Text(1, 1, "Zeit"), book.Text(1, 2, "Pegel");
          for (int d = 0; d < 5; ++d) {
              book.Text(2 + d, 1, std::to_string(20 + d) + ".01.2020 13:45");
@@ -120,12 +79,12 @@ const std::vector<SheetLayout> kSheets = {
      {{"UseDTFormat", "1"}, {"DateTimeFormat", "DD.MM.YYYY HH:mm"}}, {"Pegel"}, kUndefined, 5, "2020/01/20 13:45:00", {0},
      "2020/01/24 13:45:00"},
     {"times_with_the_day_in_a_title",
-     [](Book& book) {
-         lxw_format* time = book.Format("hh:mm");
+     [](XlsxWorkbook& book) {
+         const std::string time = "hh:mm";
          book.Text(1, 1, "Readings of 2020-05-01");
          book.Text(2, 1, "Time"), book.Text(2, 2, "Q");
          for (int h = 0; h < 5; ++h) {
-             book.When(3 + h, 1, {0, 0, 0, 6 + h, 0, 0}, time);
+             book.DateTime(3 + h, 1, {0, 0, 0, 6 + h, 0, 0}, time);
              book.Number(3 + h, 2, h + 0.5);
          }
      },
@@ -133,23 +92,22 @@ const std::vector<SheetLayout> kSheets = {
       {"ItemDescriptionRow", "2"}},
      {"Q"}, kUndefined, 5, "2020/05/01 06:00:00", {0.5}, "2020/05/01 10:00:00"},
     {"data_on_the_second_sheet",
-     [](Book& book) {
-         lxw_format* stamp = book.Format("yyyy-mm-dd hh:mm");
-         book.Sheet(2);
+     [](XlsxWorkbook& book) {
+         const std::string stamp = "yyyy-mm-dd hh:mm";
          book.Text(1, 1, "When", 2), book.Text(1, 2, "A", 2);
          for (int h = 0; h < 4; ++h) {
-             book.When(2 + h, 1, {2020, 2, 2, h, 0, 0}, stamp, 2);
-             book.Number(2 + h, 2, h, nullptr, 2);
+             book.DateTime(2 + h, 1, {2020, 2, 2, h, 0, 0}, stamp, 2);
+             book.Number(2 + h, 2, h, "", 2);
          }
      },
      {{"ExcelSheet", "2"}, {"UseDTFormat", "0"}}, {"A"}, kUndefined, 4, "2020/02/02 00:00:00", {0}, "2020/02/02 03:00:00"},
     {"delete_values_and_a_text_column",
-     [](Book& book) {
-         lxw_format* stamp = book.Format("yyyy/mm/dd hh:mm:ss");
+     [](XlsxWorkbook& book) {
+         const std::string stamp = "yyyy/mm/dd hh:mm:ss";
          book.Text(1, 1, "Station"), book.Text(1, 2, "Time"), book.Text(1, 3, "Q"), book.Text(1, 4, "H");
          for (int h = 0; h < 6; ++h) {
              book.Text(2 + h, 1, "Oldbridge");
-             book.When(2 + h, 2, {2020, 3, 3, h, 0, 0}, stamp);
+             book.DateTime(2 + h, 2, {2020, 3, 3, h, 0, 0}, stamp);
              book.Number(2 + h, 3, h % 3 == 1 ? -999 : h), book.Number(2 + h, 4, 2 * h);
          }
      },
@@ -157,14 +115,14 @@ const std::vector<SheetLayout> kSheets = {
       {"SelItems", "1,2"}},
      {"Q", "H"}, kUndefined, 6, "2020/03/03 00:00:00", {0, 0}, "2020/03/03 05:00:00", 2},
     {"type_unit_and_value_type_rows",
-     [](Book& book) {
-         lxw_format* stamp = book.Format("yyyy/mm/dd hh:mm:ss");
+     [](XlsxWorkbook& book) {
+         const std::string stamp = "yyyy/mm/dd hh:mm:ss";
          book.Text(1, 2, "Discharge"), book.Text(1, 3, "Water Level");
          book.Text(2, 2, "[m^3/s]"), book.Text(2, 3, "[m]");
          book.Text(3, 2, "Mean_Step_Accumulated"), book.Text(3, 3, "Instantaneous");
          book.Text(4, 1, "Time"), book.Text(4, 2, "Flow"), book.Text(4, 3, "Stage");
          for (int h = 0; h < 4; ++h) {
-             book.When(5 + h, 1, {2020, 4, 4, h, 0, 0}, stamp);
+             book.DateTime(5 + h, 1, {2020, 4, 4, h, 0, 0}, stamp);
              book.Number(5 + h, 2, h), book.Number(5 + h, 3, h);
          }
      },
@@ -178,22 +136,12 @@ class SheetLayouts : public ::testing::TestWithParam<SheetLayout> {};
 TEST_P(SheetLayouts, GuessedValueByValueAndReadToTheExpectedSeries)
 {
     const SheetLayout& layout = GetParam();
-    Book book(layout.name);
-    layout.write(book);
-    book.Close();
-    const guess::TemplateGuess guessed = guess::GuessTemplate(book.path, guess::InputKind::Excel);
+    const testsupport::ScratchFolder folder("velmora-guess");
+    const std::string path = WrittenBook(folder, layout.name, layout.write);
+    const guess::TemplateGuess guessed = guess::GuessTemplate(path, guess::InputKind::Excel);
     ASSERT_TRUE(guessed.spec) << guess::DescribeRefusal(guessed) << "\n" << guess::ExplainGuess(guessed);
     ExpectValues(layout.values, ValuesOf(*guessed.spec, true));
-    const ReadSeries series = ReadWith(book.path, *guessed.spec, true);
-    ASSERT_EQ(series.problem, "");
-    EXPECT_EQ(series.names, layout.names);
-    ASSERT_FALSE(series.meta.empty());
-    EXPECT_EQ(series.meta.front(), layout.firstItem);
-    ASSERT_EQ(series.stamps.size(), layout.rows);
-    EXPECT_EQ(series.stamps.front(), layout.first);
-    ExpectRow(series.values.front(), layout.firstValues);
-    EXPECT_EQ(series.stamps.back(), layout.last);
-    EXPECT_EQ(series.missing, layout.missing);
+    ExpectSeries(ReadWith(path, *guessed.spec, true), layout);
 }
 
 INSTANTIATE_TEST_SUITE_P(Sheets, SheetLayouts, ::testing::ValuesIn(kSheets),
@@ -202,11 +150,10 @@ INSTANTIATE_TEST_SUITE_P(Sheets, SheetLayouts, ::testing::ValuesIn(kSheets),
 // The workbooks the engine writes (.xlsx and .xls) are guessed back to the layout it writes.
 TEST(EngineWorkbooks, AreGuessedBackToTheEngineLayout)
 {
-    std::string folder;
-    sys::GetTempPath(4096, folder);
+    const testsupport::ScratchFolder folder("velmora-guess");
     for (const char* extension : {".xlsx", ".xls"}) {
         SCOPED_TRACE(extension);
-        const std::string output = folder + "velmora_guess_engine_" + std::to_string(::getpid()) + extension;
+        const std::string output = folder.File(std::string("engine") + extension);
         sys::Status loaded;
         std::unique_ptr<CSpecification> spec = converter::LoadTemplate(sys::FileFormat::Ascii, "", loaded);
         converter::FileJob job{sys::FileFormat::Ascii, kData + "tab_engine_layout.txt", spec.get(), {},
@@ -223,23 +170,22 @@ TEST(EngineWorkbooks, AreGuessedBackToTheEngineLayout)
         EXPECT_EQ(series.names, (std::vector<std::string>{"Rain", "Level"}));
         EXPECT_EQ(series.meta.front(), "Rainfall|mm|Accumulated");
         EXPECT_EQ(series.stamps.size(), 6u);
-        sys::DeleteFile(output);
     }
 }
 
 TEST(SheetRefusals, SayWhy)
 {
-    Book empty("empty");
-    empty.Close();
-    const guess::TemplateGuess none = guess::GuessTemplate(empty.path, guess::InputKind::Excel);
+    const testsupport::ScratchFolder folder("velmora-guess");
+    const std::string empty = WrittenBook(folder, "empty", [](XlsxWorkbook&) {});
+    const guess::TemplateGuess none = guess::GuessTemplate(empty, guess::InputKind::Excel);
     ASSERT_TRUE(none.refusal);
     EXPECT_EQ(none.refusal->reason, "the workbook's sheets hold no cells");
 
-    Book numbers("numbers");
-    for (int r = 1; r <= 5; ++r)
-        numbers.Number(r, 1, r), numbers.Number(r, 2, r * 2);
-    numbers.Close();
-    const guess::TemplateGuess undated = guess::GuessTemplate(numbers.path, guess::InputKind::Excel);
+    const std::string numbers = WrittenBook(folder, "numbers", [](XlsxWorkbook& book) {
+        for (int r = 1; r <= 5; ++r)
+            book.Number(r, 1, r), book.Number(r, 2, r * 2);
+    });
+    const guess::TemplateGuess undated = guess::GuessTemplate(numbers, guess::InputKind::Excel);
     ASSERT_TRUE(undated.refusal);
     EXPECT_NE(undated.refusal->reason.find("no column of the sheet holds dates or times"), std::string::npos)
         << undated.refusal->reason;

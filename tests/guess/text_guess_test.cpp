@@ -150,16 +150,7 @@ TEST_P(TextLayouts, GuessedValueByValueAndReadToTheExpectedSeries)
     ASSERT_TRUE(guessed.spec) << guess::DescribeRefusal(guessed);
     ExpectValues(layout.values, ValuesOf(*guessed.spec, false));
 
-    const ReadSeries series = ReadWith(path, *guessed.spec, false);
-    ASSERT_EQ(series.problem, "");
-    EXPECT_EQ(series.names, layout.names);
-    ASSERT_FALSE(series.meta.empty());
-    EXPECT_EQ(series.meta.front(), layout.firstItem);
-    ASSERT_EQ(series.stamps.size(), layout.rows);
-    EXPECT_EQ(series.stamps.front(), layout.first);
-    ExpectRow(series.values.front(), layout.firstValues);
-    EXPECT_EQ(series.stamps.back(), layout.last);
-    EXPECT_EQ(series.missing, layout.missing);
+    ExpectSeries(ReadWith(path, *guessed.spec, false), layout);
 }
 
 INSTANTIATE_TEST_SUITE_P(Files, TextLayouts, ::testing::ValuesIn(kLayouts), [](const auto& param) {
