@@ -1,6 +1,6 @@
 // The object model over .xlsx workbooks written by libxlsxwriter, driven in the order the
 // Excel parser drives it.
-#include "TestWorkbooks.h"
+#include "tests/support/TestWorkbooks.h"
 
 #include "platform/spreadsheet/SpreadsheetApplication.h"
 #include "tests/support/ScopedEnv.h"

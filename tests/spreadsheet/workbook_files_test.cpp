@@ -1,7 +1,7 @@
 // Workbook files of both kinds through the object model: .xls and hand-made .xlsx packages written by our own script
 // (tests/data/spreadsheet/make_test_files.py), and damaged or hostile files, each of which must
 // fail to open with a message naming the file and the cause.
-#include "TestWorkbooks.h"
+#include "tests/support/TestWorkbooks.h"
 
 #include "platform/spreadsheet/SpreadsheetApplication.h"
 

@@ -1,7 +1,7 @@
 // Number formats as an independent writer stores them (libxlsxwriter maps known codes to
 // built-in ids and numbers the others from 164), read back through the object model; the
 // expected texts are worked out by hand.
-#include "TestWorkbooks.h"
+#include "tests/support/TestWorkbooks.h"
 
 #include "platform/spreadsheet/SpreadsheetApplication.h"
 

@@ -1,6 +1,6 @@
 // The zip package reader: parts unpacked in chunks of any size give back what was packed, and
 // every kind of damage to the packed data or the directory is caught by name.
-#include "TestWorkbooks.h"
+#include "tests/support/TestWorkbooks.h"
 
 #include "formats/xlsx/ZipReader.h"
 #include "formats/xlsx/ZipWriter.h"

@@ -1,7 +1,5 @@
-#include "TestWorkbooks.h"
+#include "tests/support/TestWorkbooks.h"
 #include "tests/support/ScratchFolder.h"
-
-#include <gtest/gtest.h>
 
 #include <stdexcept>
 

@@ -1,7 +1,7 @@
 // The .xls reader record by record, over workbooks written by tests/data/spreadsheet/
 // make_test_files.py: shared texts spread over CONTINUE records, every cell record kind, formula
 // results, 1904 dates, Excel 5.0 byte texts, and damage that must be named.
-#include "TestWorkbooks.h"
+#include "tests/support/TestWorkbooks.h"
 
 #include "formats/workbook/WorkbookReader.h"
 #include "formats/xls/BiffStream.h"

@@ -1,7 +1,7 @@
 // Workbooks other tools write, read through our readers: xlwt's large .xls files, whose allocation
 // table runs on in DIFAT sectors; openpyxl's and xlwt's formulas, which carry no result; and the
 // compound-file faults a DIFAT chain can have.
-#include "TestWorkbooks.h"
+#include "tests/support/TestWorkbooks.h"
 #include "tests/tools/PythonTools.h"
 
 #include "formats/workbook/LittleEndian.h"

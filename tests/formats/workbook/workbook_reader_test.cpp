@@ -1,5 +1,5 @@
 // Streaming whole sheets row by row, as the conversion engine reads workbooks.
-#include "TestWorkbooks.h"
+#include "tests/support/TestWorkbooks.h"
 
 #include "formats/workbook/WorkbookReader.h"
 
