@@ -113,29 +113,24 @@ JS
 echo "| What (one core)              | wall s |  CPU s | MB/CPU s | rows/CPU s | peak MB |"
 echo "|------------------------------|--------|--------|----------|------------|---------|"
 measure "cat" cat "$work/series.txt"
-setup 2 "$work/series.txt" 1 "$work/series.rbx0"
-measure "Velmora text -> rbx0" "$engine" "$work/setup.wpx" 1 --threads 1 --quiet
-setup 1 "$work/series.rbx0" 2 "$work/back.txt"
-measure "Velmora rbx0 -> text" "$engine" "$work/setup.wpx" 1 --threads 1 --quiet
-if [ -n "${BASELINE_ENGINE:-}" ]; then
-  setup 2 "$work/series.txt" 1 "$work/base.rbx0"
-  measure "baseline text -> rbx0" "$BASELINE_ENGINE" "$work/setup.wpx" 1 --threads 1 --quiet
-  setup 1 "$work/base.rbx0" 2 "$work/base.txt"
-  measure "baseline rbx0 -> text" "$BASELINE_ENGINE" "$work/setup.wpx" 1 --threads 1 --quiet
-fi
+# One engine's round trips: the whole text to rbx0 and back, then a tenth of it to .xlsx and back.
+measure_engine() { # label engine
+  local label="$1" program="$2"
+  setup 2 "$work/series.txt" 1 "$work/$label.rbx0"
+  measure "$label text -> rbx0" "$program" "$work/setup.wpx" 1 --threads 1 --quiet
+  setup 1 "$work/$label.rbx0" 2 "$work/$label.txt"
+  measure "$label rbx0 -> text" "$program" "$work/setup.wpx" 1 --threads 1 --quiet
+  bytes=$(stat -c %s "$work/tenth.txt"); rows=$((rows_all / 10))
+  setup 2 "$work/tenth.txt" 3 "$work/$label.xlsx"
+  measure "$label text -> xlsx (1/10)" "$program" "$work/setup.wpx" 1 --threads 1 --quiet
+  setup 3 "$work/$label.xlsx" 1 "$work/$label-tenth.rbx0"
+  measure "$label xlsx -> rbx0 (1/10)" "$program" "$work/setup.wpx" 1 --threads 1 --quiet
+  bytes=$bytes_all; rows=$rows_all
+}
 head -n $((rows / 10 + 2)) "$work/series.txt" > "$work/tenth.txt"
-setup 2 "$work/tenth.txt" 3 "$work/tenth.xlsx"
-bytes_all=$bytes; rows_all=$rows; bytes=$(stat -c %s "$work/tenth.txt"); rows=$((rows / 10))
-measure "Velmora text -> xlsx (1/10)" "$engine" "$work/setup.wpx" 1 --threads 1 --quiet
-setup 3 "$work/tenth.xlsx" 1 "$work/tenth.rbx0"
-measure "Velmora xlsx -> rbx0 (1/10)" "$engine" "$work/setup.wpx" 1 --threads 1 --quiet
-if [ -n "${BASELINE_ENGINE:-}" ]; then
-  setup 2 "$work/tenth.txt" 3 "$work/base.xlsx"
-  measure "baseline text -> xlsx (1/10)" "$BASELINE_ENGINE" "$work/setup.wpx" 1 --threads 1 --quiet
-  setup 3 "$work/base.xlsx" 1 "$work/base.rbx0"
-  measure "baseline xlsx -> rbx0 (1/10)" "$BASELINE_ENGINE" "$work/setup.wpx" 1 --threads 1 --quiet
-fi
-bytes=$bytes_all; rows=$rows_all
+bytes_all=$bytes; rows_all=$rows
+measure_engine Velmora "$engine"
+[ -z "${BASELINE_ENGINE:-}" ] || measure_engine baseline "$BASELINE_ENGINE"
 [ -n "${ENGINES_ONLY:-}" ] && exit 0
 measure "pandas read_csv + binary" /usr/bin/python3 "$work/pandas_read.py" "$work/series.txt" "$work/pandas.bin"
 measure "DuckDB 1 thread + Parquet" node "$work/duckdb/convert.mjs" "$work/series.txt" "$work/duck.parquet"
